@@ -1,0 +1,566 @@
+#include "frame/descriptor.h"
+
+#include <algorithm>
+#include <cstring>
+#include <map>
+#include <random>
+#include <regex>
+#include <sstream>
+
+#include "frame/invoke.h"
+
+namespace zel::meta {
+
+int Side::planes() const {
+  switch (layout) {
+    case Layout::P2: return 2;
+    case Layout::P3: return 3;
+    case Layout::P4:
+    case Layout::AP4: return 4;
+    default: return 1;
+  }
+}
+
+int Side::channels() const {
+  if (packedWord) return 1;
+  switch (layout) {
+    case Layout::C1: return 1;
+    case Layout::C2: return 2;
+    case Layout::C3: return 3;
+    case Layout::C4:
+    case Layout::AC4: return 4;
+    default: return 1;
+  }
+}
+
+int sampleBytes(Sample s) {
+  switch (s) {
+    case Sample::U8:
+    case Sample::S8:
+    case Sample::U1: return 1;
+    case Sample::U16:
+    case Sample::S16: return 2;
+    case Sample::S32:
+    case Sample::F32: return 4;
+    case Sample::F64: return 8;
+  }
+  return 1;
+}
+
+const char* sampleName(Sample s) {
+  static const char* names[] = {"8u", "8s", "16u", "16s", "32s", "32f", "64f", "1u"};
+  return names[int(s)];
+}
+
+const char* layoutName(Layout l) {
+  static const char* names[] = {"C1", "C2", "C3", "C4", "AC4", "P2", "P3", "P4", "AP4"};
+  return names[int(l)];
+}
+
+namespace {
+
+int ceilDiv(int a, int b) { return (a + b - 1) / b; }
+
+int chromaWidth(Chroma c, int width) {
+  switch (c) {
+    case Chroma::S422:
+    case Chroma::S420: return ceilDiv(width, 2);
+    case Chroma::S411: return ceilDiv(width, 4);
+    case Chroma::S1620: return ceilDiv(width, 4);
+    default: return width;
+  }
+}
+
+int chromaHeight(Chroma c, int height) {
+  switch (c) {
+    case Chroma::S420: return ceilDiv(height, 2);
+    case Chroma::S1620: return ceilDiv(height, 4);
+    default: return height;
+  }
+}
+
+}  // namespace
+
+PlaneGeometry planeGeometry(const Side& side, int plane, int width, int height) {
+  const int bytes = sampleBytes(side.sample);
+  PlaneGeometry g{0, height, bytes};
+  if (side.sample == Sample::U1) {
+    g.rowBytes = ceilDiv(width, 8);
+    return g;
+  }
+  switch (side.layout) {
+    case Layout::P2:
+      if (plane == 0) {
+        g.rowBytes = width * bytes;
+      } else {
+        g.rowBytes = 2 * chromaWidth(side.chroma, width) * bytes;
+        g.rows = chromaHeight(side.chroma, height);
+      }
+      return g;
+    case Layout::P3:
+    case Layout::P4:
+    case Layout::AP4:
+      if (plane == 1 || plane == 2) {
+        g.rowBytes = chromaWidth(side.chroma, width) * bytes;
+        g.rows = chromaHeight(side.chroma, height);
+      } else {
+        g.rowBytes = width * bytes;
+      }
+      return g;
+    default:
+      g.rowBytes = width * side.channels() * bytes;
+      return g;
+  }
+}
+
+namespace {
+
+// ---- name grammar ----
+
+bool parseSample(const std::string& t, Sample& s) {
+  static const std::map<std::string, Sample> m = {{"8u", Sample::U8},   {"8s", Sample::S8},   {"16u", Sample::U16},
+                                                  {"16s", Sample::S16}, {"32s", Sample::S32}, {"32f", Sample::F32},
+                                                  {"64f", Sample::F64}, {"1u", Sample::U1}};
+  auto it = m.find(t);
+  if (it == m.end()) return false;
+  s = it->second;
+  return true;
+}
+
+bool parseLayout(const std::string& t, Layout& l) {
+  static const std::map<std::string, Layout> m = {{"C1", Layout::C1},   {"C2", Layout::C2}, {"C3", Layout::C3},
+                                                  {"C4", Layout::C4},   {"AC4", Layout::AC4}, {"P2", Layout::P2},
+                                                  {"P3", Layout::P3},   {"P4", Layout::P4}, {"AP4", Layout::AP4}};
+  auto it = m.find(t);
+  if (it == m.end()) return false;
+  l = it->second;
+  return true;
+}
+
+void describeFormat(const std::string& format, Side& side) {
+  side.format = format;
+  if (format.find("1620") != std::string::npos) side.chroma = Chroma::S1620;
+  else if (format.find("420") != std::string::npos) side.chroma = Chroma::S420;
+  else if (format.find("422") != std::string::npos) side.chroma = Chroma::S422;
+  else if (format.find("411") != std::string::npos) side.chroma = Chroma::S411;
+  static const std::regex packed("^(RGB|BGR)(565|555|444)(Dither)?$");
+  side.packedWord = std::regex_match(format, packed);
+}
+
+// Family extras: trailing arguments by name, and flags.
+struct ExtraKind {
+  ArgKind kind;
+  double good;
+  std::vector<BadValue> bad;
+};
+
+ArgKind sampleArgKind(Sample s) {
+  switch (s) {
+    case Sample::U8: return ArgKind::UInt8;
+    case Sample::U16: return ArgKind::UInt16;
+    case Sample::S16: return ArgKind::Int16;
+    case Sample::F32: return ArgKind::Float32;
+    case Sample::F64: return ArgKind::Float64;
+    default: return ArgKind::Int32;
+  }
+}
+
+bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
+  std::istringstream in(extras);
+  std::string word;
+  std::vector<std::string> order;  // custom order words, if given
+  while (in >> word) {
+    if (word == "alpha") {
+      // The destination's fourth channel value, in its sample type.
+      d.extras.push_back({"alpha", sampleArgKind(d.dst.sample), d.dst.sample == Sample::F32 ? 0.5 : 200.0, {}});
+    } else if (word.rfind("min=", 0) == 0) {
+      if (std::sscanf(word.c_str() + 4, "%dx%d", &d.minWidth, &d.minHeight) != 2) {
+        error = "bad min= in extras of " + d.name;
+        return false;
+      }
+    } else if (word == "warn") {
+      d.warnsOdd = true;
+    } else if (word == "steps") {
+      d.checksSteps = true;
+    } else if (word == "alphawritten") {
+      d.writesAlpha = true;
+    } else if (word.rfind("order=", 0) == 0) {
+      std::string rest = word.substr(6);
+      std::replace(rest.begin(), rest.end(), ',', ' ');
+      std::istringstream parts(rest);
+      std::string part;
+      while (parts >> part) order.push_back(part);
+    } else {
+      error = "unknown extra '" + word + "' of " + d.name;
+      return false;
+    }
+  }
+  // Check order: pointers (top level, then plane entries), size, steps,
+  // family values, unless the family names its own.
+  if (order.empty()) {
+    order = {"null", "planes", "size"};
+    if (d.checksSteps) order.push_back("step");
+    for (const Extra& e : d.extras)
+      if (!e.bad.empty()) order.push_back(e.name);
+  }
+  for (const std::string& o : order) {
+    if (o == "null") d.order.push_back({Check::NullTop});
+    else if (o == "planes") d.order.push_back({Check::NullPlanes});
+    else if (o == "size") d.order.push_back({Check::Size});
+    else if (o == "step") d.order.push_back({Check::Step});
+    else {
+      auto it = std::find_if(d.extras.begin(), d.extras.end(), [&](const Extra& e) { return e.name == o; });
+      if (it == d.extras.end()) {
+        error = "order names unknown check '" + o + "' in " + d.name;
+        return false;
+      }
+      it->stage = int(d.order.size());
+      d.order.push_back({Check::Extra, int(it - d.extras.begin())});
+    }
+  }
+  return true;
+}
+
+void addSideSlots(Descriptor& d, const Side& side, Role ptr, Role planes, Role step, Role steps) {
+  if (side.layout == Layout::P2) {
+    d.slots.push_back({ptr, 0});
+    if (d.region) d.slots.push_back({step, 0});
+    d.slots.push_back({ptr, 1});
+    if (d.region) d.slots.push_back({step, 1});
+    return;
+  }
+  if (side.isPlanar()) {
+    d.slots.push_back({planes});
+    if (d.region) d.slots.push_back({side.stepPerPlane() ? steps : step});
+    return;
+  }
+  d.slots.push_back({ptr});
+  if (d.region) d.slots.push_back({step});
+}
+
+}  // namespace
+
+bool describe(const std::string& name, const std::string& extras, Descriptor& d, std::string& error) {
+  d = Descriptor{};
+  d.name = name;
+  if (name.rfind("zeli", 0) != 0) {
+    error = "not an image function: " + name;
+    return false;
+  }
+  std::vector<std::string> parts;
+  {
+    std::string rest = name.substr(4), part;
+    std::istringstream in(rest);
+    while (std::getline(in, part, '_')) parts.push_back(part);
+  }
+  if (parts.size() < 3 || parts.size() > 4) {
+    error = "name does not follow the grammar: " + name;
+    return false;
+  }
+  d.operation = parts[0];
+  if (parts.size() == 4) d.qualifier = parts[1];
+  const std::string types = parts[parts.size() - 2];
+  std::string layout = parts.back();
+
+  // Types: one or two sample tokens.
+  static const std::regex typeRe("^(8u|8s|16u|16s|32s|32f|64f|1u)(8u|8s|16u|16s|32s|32f|64f|1u)?$");
+  std::smatch tm;
+  if (!std::regex_match(types, tm, typeRe)) {
+    error = "bad sample types in " + name;
+    return false;
+  }
+  parseSample(tm[1], d.src.sample);
+  d.dst.sample = d.src.sample;
+  if (tm[2].matched) parseSample(tm[2], d.dst.sample);
+
+  // Layout: tokens, then I (in place) and R (region) flags.
+  d.region = !layout.empty() && layout.back() == 'R';
+  if (d.region) layout.pop_back();
+  if (!layout.empty() && layout.back() == 'I') {
+    d.inPlace = true;
+    layout.pop_back();
+  }
+  if (!layout.empty() && layout[0] == 'I') {
+    d.inPlace = true;
+    layout.erase(0, 1);
+  }
+  static const std::regex tokenRe("(AC4|AP4|C[1-4]|P[2-4])");
+  std::vector<std::string> tokens;
+  for (auto it = std::sregex_iterator(layout.begin(), layout.end(), tokenRe); it != std::sregex_iterator(); ++it)
+    tokens.push_back(it->str());
+  std::string joined;
+  for (auto& t : tokens) joined += t;
+  if (tokens.empty() || tokens.size() > 2 || joined != layout) {
+    error = "bad layout in " + name;
+    return false;
+  }
+  parseLayout(tokens[0], d.src.layout);
+  parseLayout(tokens.back(), d.dst.layout);
+
+  // Formats on each side of "To"; operators name one format for both.
+  const std::string& op = d.operation;
+  const size_t to = op.find("To");
+  std::string srcFormat = op, dstFormat = op;
+  if (to != std::string::npos && to > 0) {
+    srcFormat = op.substr(0, to);
+    dstFormat = op.substr(to + 2);
+  }
+  for (const char* glued : {"Dither", "Gamma"}) {
+    const size_t g = dstFormat.find(glued);
+    if (g != std::string::npos && g > 0 && g + std::strlen(glued) == dstFormat.size()) dstFormat.erase(g);
+  }
+  describeFormat(srcFormat, d.src);
+  describeFormat(dstFormat, d.dst);
+
+  if (!parseExtras(extras, d, error)) return false;
+
+  // Arguments: source, destination, size, family values.
+  if (d.inPlace) {
+    addSideSlots(d, d.src, Role::SrcDstPtr, Role::SrcDstPlanes, Role::SrcDstStep, Role::SrcDstStep);
+  } else {
+    addSideSlots(d, d.src, Role::SrcPtr, Role::SrcPlanes, Role::SrcStep, Role::SrcSteps);
+    addSideSlots(d, d.dst, Role::DstPtr, Role::DstPlanes, Role::DstStep, Role::DstSteps);
+  }
+  d.slots.push_back({Role::Size});
+  for (int i = 0; i < int(d.extras.size()); ++i) d.slots.push_back({Role::Extra, 0, i});
+  return true;
+}
+
+namespace {
+
+struct ManifestLine {
+  const char* name;
+  const char* extras;
+  void (*impl)();
+  Invoker invoke;
+  std::vector<ArgKind> (*kinds)();
+};
+
+#define ZEL_EXPORT(name, extras)                                                                           \
+  {#name, extras, reinterpret_cast<void (*)()>(&::name), &InvokerOf<decltype(&::name), &::name>::call, \
+   &InvokerOf<decltype(&::name), &::name>::kinds},
+#define ZEL_SHARED(name, other, extras) ZEL_EXPORT(name, extras)
+
+
+const std::vector<ManifestLine>& manifest() {
+  static const std::vector<ManifestLine> lines = {
+#include "frame/manifest.inc"
+  };
+  return lines;
+}
+
+}  // namespace
+
+const std::vector<Descriptor>& allDescriptors() {
+  static const std::vector<Descriptor> all = [] {
+    std::vector<Descriptor> out;
+    for (const ManifestLine& line : manifest()) {
+      Descriptor d;
+      std::string error;
+      const std::string name = line.name;
+      if (name == "zelccGetLibVersion") {  // the one export without images
+        d.name = name;
+        d.impl = line.impl;
+        out.push_back(d);
+        continue;
+      }
+      if (!describe(name, line.extras, d, error)) {
+        std::fprintf(stderr, "zelcc descriptors: %s\n", error.c_str());
+        std::abort();
+      }
+      d.impl = line.impl;
+      d.invoke = line.invoke;
+      d.prototype = line.kinds();
+      out.push_back(d);
+    }
+    return out;
+  }();
+  return all;
+}
+
+const Descriptor* findDescriptor(const std::string& name) {
+  for (const Descriptor& d : allDescriptors())
+    if (d.name == name) return &d;
+  return nullptr;
+}
+
+// ---- Workspace ----
+
+Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offset)
+    : d_(d), size_(size), pad_(padBytes) {
+  const int w = std::max(size.width, 0), h = std::max(size.height, 0);
+  auto addSide = [&](const Side& side, int sideIndex) {
+    for (int p = 0; p < side.planes(); ++p) {
+      Buffer b;
+      b.geometry = planeGeometry(side, p, w, h);
+      b.step = b.geometry.rowBytes + padBytes;
+      const int rows = std::max(b.geometry.rows, 1);
+      const size_t total = size_t(kGuard) * 2 + size_t(offset) + size_t(b.step) * rows + 64;
+      b.bytes.assign(total, kGuardByte);
+      b.side = sideIndex;
+      b.plane = p;
+      b.isSource = sideIndex != 1;
+      b.isDestination = sideIndex != 0;
+      buffers_.push_back(std::move(b));
+    }
+  };
+  if (d.inPlace) {
+    addSide(d.src, 2);
+  } else {
+    addSide(d.src, 0);
+    addSide(d.dst, 1);
+  }
+  for (Buffer& b : buffers_) {
+    // The first row starts `offset` bytes past a 64-byte boundary.
+    uint8_t* base = b.bytes.data() + kGuard;
+    const uintptr_t mis = reinterpret_cast<uintptr_t>(base) & 63u;
+    base += (64 - mis) & 63u;
+    b.first = base + offset;
+    if (b.side == 0) {
+      srcPlanes_.push_back(b.first);
+      srcSteps_.push_back(b.step);
+    } else if (b.side == 1) {
+      dstPlanes_.push_back(b.first);
+      dstSteps_.push_back(b.step);
+    } else {
+      srcDstPlanes_.push_back(b.first);
+      srcSteps_.push_back(b.step);
+    }
+  }
+}
+
+Workspace::Buffer* Workspace::bufferOf(int side, int plane) {
+  for (Buffer& b : buffers_)
+    if (b.side == side && b.plane == plane) return &b;
+  return nullptr;
+}
+
+std::vector<const void*>& Workspace::planeArray(int side) {
+  return side == 0 ? srcPlanes_ : side == 1 ? dstPlanes_ : srcDstPlanes_;
+}
+
+void Workspace::fillRandom(uint32_t seed) {
+  std::mt19937 rng(seed);
+  for (Buffer& b : buffers_) {
+    if (!b.isSource) continue;
+    for (int y = 0; y < b.geometry.rows; ++y) {
+      uint8_t* row = b.first + size_t(y) * b.step;
+      if (d_.src.sample == Sample::F32) {
+        // Floats in 0..1, the range colour functions take.
+        std::uniform_real_distribution<float> dist(0.0f, 1.0f);
+        for (int x = 0; x + 4 <= b.geometry.rowBytes; x += 4) {
+          float v = dist(rng);
+          std::memcpy(row + x, &v, 4);
+        }
+      } else {
+        for (int x = 0; x < b.geometry.rowBytes; ++x) row[x] = uint8_t(rng() >> 24);
+      }
+    }
+  }
+}
+
+void Workspace::fillDestinations(uint8_t value) {
+  for (Buffer& b : buffers_) {
+    if (!b.isDestination || b.isSource) continue;
+    for (int y = 0; y < b.geometry.rows; ++y) std::memset(b.first + size_t(y) * b.step, value, b.geometry.rowBytes);
+  }
+}
+
+std::vector<Arg> Workspace::arguments(const std::vector<double>* extraValues) {
+  std::vector<Arg> args;
+  auto pointerArg = [](const void* p) {
+    Arg a;
+    a.kind = ArgKind::Pointer;
+    a.p = p;
+    return a;
+  };
+  auto intArg = [](int64_t v) {
+    Arg a;
+    a.kind = ArgKind::Int32;
+    a.i = v;
+    return a;
+  };
+  auto sideOf = [](Role r) {
+    switch (r) {
+      case Role::SrcPtr:
+      case Role::SrcPlanes:
+      case Role::SrcStep:
+      case Role::SrcSteps: return 0;
+      case Role::DstPtr:
+      case Role::DstPlanes:
+      case Role::DstStep:
+      case Role::DstSteps: return 1;
+      default: return 2;
+    }
+  };
+  for (const ArgSlot& s : d_.slots) {
+    switch (s.role) {
+      case Role::SrcPtr:
+      case Role::DstPtr:
+      case Role::SrcDstPtr: args.push_back(pointerArg(bufferOf(sideOf(s.role), s.plane)->first)); break;
+      case Role::SrcPlanes:
+      case Role::DstPlanes:
+      case Role::SrcDstPlanes: args.push_back(pointerArg(planeArray(sideOf(s.role)).data())); break;
+      case Role::SrcStep:
+      case Role::DstStep:
+      case Role::SrcDstStep: args.push_back(intArg(bufferOf(sideOf(s.role), s.plane)->step)); break;
+      case Role::SrcSteps: args.push_back(pointerArg(srcSteps_.data())); break;
+      case Role::DstSteps: args.push_back(pointerArg(dstSteps_.data())); break;
+      case Role::Size: {
+        Arg a;
+        a.kind = ArgKind::Size;
+        a.size = size_;
+        args.push_back(a);
+        break;
+      }
+      case Role::Extra: {
+        const Extra& e = d_.extras[s.extra];
+        Arg a;
+        a.kind = e.kind;
+        const double v = extraValues ? (*extraValues)[s.extra] : e.good;
+        a.f = v;
+        a.i = int64_t(v);
+        args.push_back(a);
+        break;
+      }
+    }
+  }
+  return args;
+}
+
+Status Workspace::call() { return call(arguments()); }
+
+Status Workspace::call(const std::vector<Arg>& args) const { return d_.invoke(args.data(), int(args.size())); }
+
+std::string Workspace::checkGuards() const {
+  for (const Buffer& b : buffers_) {
+    const uint8_t* lo = b.bytes.data();
+    const uint8_t* hi = lo + b.bytes.size();
+    auto describeAt = [&](const uint8_t* p) {
+      std::ostringstream m;
+      m << (b.side == 0 ? "source" : b.side == 1 ? "destination" : "in-place image") << " plane " << b.plane
+        << ": byte at offset " << (p - b.first) << " from the region's start changed";
+      return m.str();
+    };
+    const int rows = b.geometry.rows;
+    const uint8_t* regionEnd = b.first + (rows > 0 ? size_t(rows - 1) * b.step + b.geometry.rowBytes : 0);
+    for (const uint8_t* p = lo; p < b.first; ++p)
+      if (*p != kGuardByte) return describeAt(p);
+    for (int y = 0; y + 1 < rows; ++y) {
+      const uint8_t* padStart = b.first + size_t(y) * b.step + b.geometry.rowBytes;
+      for (const uint8_t* p = padStart; p < b.first + size_t(y + 1) * b.step; ++p)
+        if (*p != kGuardByte) return describeAt(p);
+    }
+    for (const uint8_t* p = regionEnd; p < hi; ++p)
+      if (*p != kGuardByte) return describeAt(p);
+  }
+  return "";
+}
+
+std::vector<std::vector<uint8_t>> Workspace::snapshot() const {
+  std::vector<std::vector<uint8_t>> out;
+  for (const Buffer& b : buffers_) out.push_back(b.bytes);
+  return out;
+}
+
+}  // namespace zel::meta

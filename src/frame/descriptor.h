@@ -1,0 +1,161 @@
+// What a name says about its function: layouts, sample types, chroma
+// subsampling, steps and trailing arguments, plus what the family adds.
+// Tests, the command-line tool and the benchmarks drive every export
+// through these descriptors; nothing here is part of the library itself.
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "zelcc/zelcc.h"
+
+namespace zel::meta {
+
+enum class Layout { C1, C2, C3, C4, AC4, P2, P3, P4, AP4 };
+enum class Sample { U8, S8, U16, S16, S32, F32, F64, U1 };
+enum class Chroma { Full, S422, S420, S411, S1620 };
+
+// Kinds of argument values, as a prototype takes them.
+enum class ArgKind { Pointer, Int32, UInt8, UInt16, Int16, Float32, Float64, Size, Region };
+
+struct Side {
+  std::string format;  // "RGB", "YCbCr420", "BGR565", "Gray" ...
+  Layout layout = Layout::C1;
+  Sample sample = Sample::U8;
+  Chroma chroma = Chroma::Full;
+  bool packedWord = false;  // one 16-bit word a pixel
+  int planes() const;
+  int channels() const;  // samples a pixel in an interleaved layout
+  bool isPlanar() const { return layout == Layout::P2 || layout == Layout::P3 || layout == Layout::P4 || layout == Layout::AP4; }
+  bool stepPerPlane() const { return layout == Layout::P3 && chroma != Chroma::Full; }
+};
+
+struct PlaneGeometry {
+  int rowBytes;  // bytes of the region in one row
+  int rows;
+  int sampleBytes;
+};
+
+int sampleBytes(Sample s);
+const char* sampleName(Sample s);
+const char* layoutName(Layout l);
+PlaneGeometry planeGeometry(const Side& side, int plane, int width, int height);
+
+// A trailing argument of a family, with a value that works and values that
+// must be rejected (with their status).
+struct BadValue {
+  double value;
+  Status status;
+};
+struct Extra {
+  std::string name;
+  ArgKind kind;
+  double good;
+  std::vector<BadValue> bad;
+  int stage = -1;  // where its check stands in the order (index into Descriptor::order)
+};
+
+// Steps of the argument checks, in the order a member runs them.
+enum class Check { NullTop, NullPlanes, Size, Step, Extra };
+struct CheckStage {
+  Check check;
+  int extra = -1;  // for Check::Extra
+};
+
+// Argument roles in prototype order.
+enum class Role { SrcPtr, SrcPlanes, SrcStep, SrcSteps, DstPtr, DstPlanes, DstStep, DstSteps, SrcDstPtr,
+                  SrcDstPlanes, SrcDstStep, Size, Extra };
+struct ArgSlot {
+  Role role;
+  int plane = 0;   // for P2: 0 luma, 1 chroma
+  int extra = -1;  // for Role::Extra
+};
+
+struct Arg {
+  ArgKind kind = ArgKind::Pointer;
+  const void* p = nullptr;
+  int64_t i = 0;
+  double f = 0;
+  ImageSize size{0, 0};
+  CfaRegion region{0, 0, 0, 0};
+};
+
+using Invoker = Status (*)(const Arg* args, int count);
+
+struct Descriptor {
+  std::string name;
+  std::string operation, qualifier;
+  Side src, dst;
+  bool region = true;   // has steps
+  bool inPlace = false;
+  std::vector<Extra> extras;
+  std::vector<CheckStage> order;
+  std::vector<ArgSlot> slots;
+  int minWidth = 1, minHeight = 1;
+  bool warnsOdd = false;        // may return StatusOddSizeWarning
+  bool writesAlpha = false;     // an AC4 destination's fourth channel is written
+  bool checksSteps = false;
+  void (*impl)() = nullptr;
+  Invoker invoke = nullptr;
+  std::vector<ArgKind> prototype;  // kinds of the prototype's parameters
+  bool isImageFunction() const { return invoke != nullptr; }
+};
+
+// Builds a descriptor from a name and its family extras; an error message
+// goes to `error` when the name or extras do not parse.
+bool describe(const std::string& name, const std::string& extras, Descriptor& out, std::string& error);
+
+// All exports the library has, in table order.
+const std::vector<Descriptor>& allDescriptors();
+const Descriptor* findDescriptor(const std::string& name);
+
+// Image arguments of one call, with guard bytes around every buffer.
+class Workspace {
+ public:
+  static constexpr int kGuard = 64;
+  static constexpr uint8_t kGuardByte = 0xA7;
+
+  // padBytes: bytes between one row's region and the next row; offset: how
+  // far each buffer's first row starts past a 64-byte boundary.
+  Workspace(const Descriptor& d, ImageSize size, int padBytes = 0, int offset = 0);
+
+  struct Buffer {
+    std::vector<uint8_t> bytes;  // guard + rows + guard
+    uint8_t* first = nullptr;    // first byte of the region
+    int step = 0;
+    PlaneGeometry geometry{};
+    bool isSource = false;
+    bool isDestination = false;
+    int side = 0;    // 0 source, 1 destination, 2 in place
+    int plane = 0;
+  };
+
+  std::vector<Buffer>& buffers() { return buffers_; }
+  Buffer* bufferOf(int side, int plane);
+  // Fills sources (and in-place images) from a seed, destinations with a byte.
+  void fillRandom(uint32_t seed);
+  void fillDestinations(uint8_t value);
+  // Arguments in prototype order; `extraValues` replaces the good values.
+  std::vector<Arg> arguments(const std::vector<double>* extraValues = nullptr);
+  // The plane-pointer array of a side (0 source, 1 destination, 2 in place),
+  // which `arguments` passes by address.
+  std::vector<const void*>& planeArray(int side);
+  Status call();
+  Status call(const std::vector<Arg>& args) const;
+  // Guard bytes and step padding unchanged; returns a message or "".
+  std::string checkGuards() const;
+  std::vector<std::vector<uint8_t>> snapshot() const;
+  const Descriptor& descriptor() const { return d_; }
+  ImageSize size() const { return size_; }
+
+ private:
+  const Descriptor& d_;
+  ImageSize size_;
+  int pad_;
+  std::vector<Buffer> buffers_;
+  std::vector<const void*> srcPlanes_, dstPlanes_, srcDstPlanes_;
+  std::vector<int> srcSteps_, dstSteps_;
+};
+
+}  // namespace zel::meta

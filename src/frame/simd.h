@@ -1,0 +1,31 @@
+// Thin wrappers over the vector instructions: SSE4.1 is the baseline of the
+// build, AVX2 bodies are compiled per function with ZEL_AVX2 and chosen at
+// run time when the processor has them. Both give the same bits.
+#pragma once
+
+#include <immintrin.h>
+
+#include <cstdint>
+
+#define ZEL_AVX2 __attribute__((target("avx2")))
+
+namespace zel {
+
+inline bool hasAvx2() { return __builtin_cpu_supports("avx2"); }
+
+inline __m128i load128(const void* p) { return _mm_loadu_si128(static_cast<const __m128i*>(p)); }
+inline __m128i load64(const void* p) { return _mm_loadl_epi64(static_cast<const __m128i*>(p)); }
+inline __m128i load32(const void* p) {
+  int32_t v;
+  __builtin_memcpy(&v, p, 4);
+  return _mm_cvtsi32_si128(v);
+}
+inline void store128(void* p, __m128i v) { _mm_storeu_si128(static_cast<__m128i*>(p), v); }
+inline void store64(void* p, __m128i v) { _mm_storel_epi64(static_cast<__m128i*>(p), v); }
+inline void storeStream128(void* p, __m128i v) { _mm_stream_si128(static_cast<__m128i*>(p), v); }
+
+ZEL_AVX2 inline __m256i load256(const void* p) { return _mm256_loadu_si256(static_cast<const __m256i*>(p)); }
+ZEL_AVX2 inline __m256i broadcast128(const void* p) { return _mm256_broadcastsi128_si256(load128(p)); }
+ZEL_AVX2 inline void store256(void* p, __m256i v) { _mm256_storeu_si256(static_cast<__m256i*>(p), v); }
+
+}  // namespace zel
