@@ -84,6 +84,36 @@ ZELCC_API Status zeliGrayToRGB_16u_C1C4R(const uint16_t* src, int srcStep, uint1
 ZELCC_API Status zeliGrayToRGB_32f_C1C4R(const float* src, int srcStep, float* dst, int dstStep,
                                          ImageSize size, float alpha);
 
+/* ---- RGB to and from YCbCr and YUV at full resolution ---- */
+
+/* ---- Photo YCC ---- */
+
+/* ---- RGB to and from chroma-subsampled YCbCr and YUV ---- */
+
+/* ---- Repacking between subsampled layouts ---- */
+
+/* ---- Filtered, interlaced and 1620 chroma resampling ---- */
+
+/* ---- 16-bit packed RGB ---- */
+
+/* ---- YCoCg ---- */
+
+/* ---- HLS and HSV ---- */
+
+/* ---- XYZ, LUV and Lab ---- */
+
+/* ---- Colour twist ---- */
+
+/* ---- Gamma ---- */
+
+/* ---- Gray conversion ---- */
+
+/* ---- Bit-depth reduction ---- */
+
+/* ---- Bayer demosaicing ---- */
+
+/* ---- Tone mapping ---- */
+
 #ifdef __cplusplus
 }
 #endif

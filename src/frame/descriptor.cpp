@@ -173,6 +173,31 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
     if (word == "alpha") {
       // The destination's fourth channel value, in its sample type.
       d.extras.push_back({"alpha", sampleArgKind(d.dst.sample), d.dst.sample == Sample::F32 ? 0.5 : 200.0, {}});
+    } else if (word.rfind("arg:", 0) == 0) {
+      // arg:NAME:KIND:GOOD[:BAD=STATUS]... ; KIND u8 u16 s16 i32 f32 f64 ptr.
+      // A ptr argument points to GOOD bytes of float 0.25 values; its null
+      // is checked with the image pointers.
+      std::vector<std::string> f;
+      std::string piece;
+      std::istringstream fields(word.substr(4));
+      while (std::getline(fields, piece, ':')) f.push_back(piece);
+      static const std::map<std::string, ArgKind> kinds = {
+          {"u8", ArgKind::UInt8},    {"u16", ArgKind::UInt16},  {"s16", ArgKind::Int16}, {"i32", ArgKind::Int32},
+          {"f32", ArgKind::Float32}, {"f64", ArgKind::Float64}, {"ptr", ArgKind::Pointer}};
+      if (f.size() < 3 || !kinds.count(f[1])) {
+        error = "bad arg: in extras of " + d.name;
+        return false;
+      }
+      Extra e{f[0], kinds.at(f[1]), std::atof(f[2].c_str()), {}};
+      for (size_t k = 3; k < f.size(); ++k) {
+        const size_t eq = f[k].find('=');
+        if (eq == std::string::npos) {
+          error = "bad value list in extras of " + d.name;
+          return false;
+        }
+        e.bad.push_back({std::atof(f[k].substr(0, eq).c_str()), static_cast<Status>(std::atoi(f[k].c_str() + eq + 1))});
+      }
+      d.extras.push_back(e);
     } else if (word.rfind("min=", 0) == 0) {
       if (std::sscanf(word.c_str() + 4, "%dx%d", &d.minWidth, &d.minHeight) != 2) {
         error = "bad min= in extras of " + d.name;
@@ -410,6 +435,11 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
     addSide(d.src, 0);
     addSide(d.dst, 1);
   }
+  for (const Extra& e : d.extras) {
+    std::vector<float> values;
+    if (e.kind == ArgKind::Pointer) values.assign(size_t(std::max(e.good, 4.0)) / 4 + 1, 0.25f);
+    extraBuffers_.push_back(std::move(values));
+  }
   for (Buffer& b : buffers_) {
     // The first row starts `offset` bytes past a 64-byte boundary.
     uint8_t* base = b.bytes.data() + kGuard;
@@ -517,6 +547,11 @@ std::vector<Arg> Workspace::arguments(const std::vector<double>* extraValues) {
         const Extra& e = d_.extras[s.extra];
         Arg a;
         a.kind = e.kind;
+        if (e.kind == ArgKind::Pointer) {
+          a.p = extraBuffers_[s.extra].data();
+          args.push_back(a);
+          break;
+        }
         const double v = extraValues ? (*extraValues)[s.extra] : e.good;
         a.f = v;
         a.i = int64_t(v);

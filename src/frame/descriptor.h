@@ -100,6 +100,11 @@ struct Descriptor {
   Invoker invoke = nullptr;
   std::vector<ArgKind> prototype;  // kinds of the prototype's parameters
   bool isImageFunction() const { return invoke != nullptr; }
+  const Extra* extra(const std::string& name) const {
+    for (const Extra& e : extras)
+      if (e.name == name) return &e;
+    return nullptr;
+  }
 };
 
 // Builds a descriptor from a name and its family extras; an error message
@@ -156,6 +161,7 @@ class Workspace {
   std::vector<Buffer> buffers_;
   std::vector<const void*> srcPlanes_, dstPlanes_, srcDstPlanes_;
   std::vector<int> srcSteps_, dstSteps_;
+  std::vector<std::vector<float>> extraBuffers_;  // behind pointer arguments of the family
 };
 
 }  // namespace zel::meta

@@ -55,8 +55,9 @@ std::vector<Failure> failuresOf(const Descriptor& d, const CheckStage& stage) {
     case Check::NullTop:
       for (size_t i = 0; i < d.slots.size(); ++i) {
         const Role r = d.slots[i].role;
+        const bool recordPointer = r == Role::Extra && d.extras[d.slots[i].extra].kind == ArgKind::Pointer;
         if (r == Role::SrcPtr || r == Role::DstPtr || r == Role::SrcDstPtr || r == Role::SrcPlanes ||
-            r == Role::DstPlanes || r == Role::SrcDstPlanes)
+            r == Role::DstPlanes || r == Role::SrcDstPlanes || recordPointer)
           out.push_back({"null argument " + std::to_string(i), StatusNullPointerError,
                          [i](Workspace&, std::vector<Arg>& a, ImageSize&) { a[i].p = nullptr; }});
       }
