@@ -107,6 +107,35 @@ ZELCC_API Status zeliGrayToRGB_32f_C1C4R(const float* src, int srcStep, float* d
 /* ---- Gamma ---- */
 
 /* ---- Gray conversion ---- */
+/* Weighted sums of R, G, B; a null `coeffs` selects 0.299, 0.587, 0.114. */
+ZELCC_API Status zeliRGBToGray_16s_AC4C1R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_16s_C3C1R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_16u_AC4C1R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_16u_C3C1R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_32f_AC4C1R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_32f_C3C1R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_8u_AC4C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_8u_C3C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliColorToGray_16s_AC4C1R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size,
+                                            const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_16s_C3C1R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size,
+                                           const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_16u_AC4C1R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                            ImageSize size, const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_16u_C3C1R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size,
+                                           const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_32f_AC4C1R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                            const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_32f_C3C1R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                           const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_64f_AC4C1R(const double* src, int srcStep, double* dst, int dstStep, ImageSize size,
+                                            const double coeffs[3]);
+ZELCC_API Status zeliColorToGray_64f_C3C1R(const double* src, int srcStep, double* dst, int dstStep, ImageSize size,
+                                           const double coeffs[3]);
+ZELCC_API Status zeliColorToGray_8u_AC4C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                           const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_8u_C3C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                          const float coeffs[3]);
 
 /* ---- Bit-depth reduction ---- */
 
