@@ -103,6 +103,61 @@ ZELCC_API Status zeliGrayToRGB_32f_C1C4R(const float* src, int srcStep, float* d
 /* ---- XYZ, LUV and Lab ---- */
 
 /* ---- Colour twist ---- */
+/* Row i of `twist`: weights of the three inputs and a constant in sample units for output i; */
+/* integer results are clamped, then rounded to nearest. Steps must be at least 1. */
+ZELCC_API Status zeliColorTwist32f_16s_AC4IR(int16_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size,
+                                            const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16s_C3IR(int16_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16s_IP3R(int16_t* const srcDstPlanes[3], int srcDstStep, ImageSize size,
+                                            const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16s_P3R(const int16_t* const srcPlanes[3], int srcStep, int16_t* const dstPlanes[3],
+                                           int dstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_AC4IR(uint16_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                            ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_C3IR(uint16_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_IP3R(uint16_t* const srcDstPlanes[3], int srcDstStep, ImageSize size,
+                                            const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_P3R(const uint16_t* const srcPlanes[3], int srcStep,
+                                           uint16_t* const dstPlanes[3], int dstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_AC4IR(int8_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_AC4R(const int8_t* src, int srcStep, int8_t* dst, int dstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_C3IR(int8_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_C3R(const int8_t* src, int srcStep, int8_t* dst, int dstStep, ImageSize size,
+                                          const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_IP3R(int8_t* const srcDstPlanes[3], int srcDstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_P3R(const int8_t* const srcPlanes[3], int srcStep, int8_t* const dstPlanes[3],
+                                          int dstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_AC4IR(uint8_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_C3IR(uint8_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                          const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_IP3R(uint8_t* const srcDstPlanes[3], int srcDstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                          int dstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_AC4IR(float* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                         const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_C3IR(float* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                        const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_C4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                        const float twist[4][4]);
+ZELCC_API Status zeliColorTwist_32f_IP3R(float* const srcDstPlanes[3], int srcDstStep, ImageSize size,
+                                         const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_P3R(const float* const srcPlanes[3], int srcStep, float* const dstPlanes[3],
+                                        int dstStep, ImageSize size, const float twist[3][4]);
 
 /* ---- Gamma ---- */
 
