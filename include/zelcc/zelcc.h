@@ -160,6 +160,56 @@ ZELCC_API Status zeliColorTwist_32f_P3R(const float* const srcPlanes[3], int src
                                         int dstStep, ImageSize size, const float twist[3][4]);
 
 /* ---- Gamma ---- */
+/* The video transfer function (Fwd) and its inverse (Inv) on R, G, B; 32f maps vMin..vMax onto 0..1 */
+/* and returns StatusEmptyRangeError unless vMax - vMin > 0. Steps must be at least 1. */
+ZELCC_API Status zeliGammaFwd_16u_AC4IR(uint16_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_16u_C3IR(uint16_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_16u_IP3R(uint16_t* const srcDstPlanes[3], int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_16u_P3R(const uint16_t* const srcPlanes[3], int srcStep, uint16_t* const dstPlanes[3],
+                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_32f_AC4IR(float* srcDst, int srcDstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaFwd_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                       float vMin, float vMax);
+ZELCC_API Status zeliGammaFwd_32f_C3IR(float* srcDst, int srcDstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaFwd_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                      float vMin, float vMax);
+ZELCC_API Status zeliGammaFwd_32f_IP3R(float* const srcDstPlanes[3], int srcDstStep, ImageSize size, float vMin,
+                                       float vMax);
+ZELCC_API Status zeliGammaFwd_32f_P3R(const float* const srcPlanes[3], int srcStep, float* const dstPlanes[3],
+                                      int dstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaFwd_8u_AC4IR(uint8_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_8u_C3IR(uint8_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_8u_IP3R(uint8_t* const srcDstPlanes[3], int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                     int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_AC4IR(uint16_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_C3IR(uint16_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_IP3R(uint16_t* const srcDstPlanes[3], int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_P3R(const uint16_t* const srcPlanes[3], int srcStep, uint16_t* const dstPlanes[3],
+                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_32f_AC4IR(float* srcDst, int srcDstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaInv_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                       float vMin, float vMax);
+ZELCC_API Status zeliGammaInv_32f_C3IR(float* srcDst, int srcDstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaInv_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                      float vMin, float vMax);
+ZELCC_API Status zeliGammaInv_32f_IP3R(float* const srcDstPlanes[3], int srcDstStep, ImageSize size, float vMin,
+                                       float vMax);
+ZELCC_API Status zeliGammaInv_32f_P3R(const float* const srcPlanes[3], int srcStep, float* const dstPlanes[3],
+                                      int dstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaInv_8u_AC4IR(uint8_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_8u_C3IR(uint8_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_8u_IP3R(uint8_t* const srcDstPlanes[3], int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                     int dstStep, ImageSize size);
 
 /* ---- Gray conversion ---- */
 /* Weighted sums of R, G, B; a null `coeffs` selects 0.299, 0.587, 0.114. */
