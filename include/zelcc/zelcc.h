@@ -247,6 +247,10 @@ ZELCC_API Status zeliColorToGray_8u_C3C1R(const uint8_t* src, int srcStep, uint8
 /* ---- Bayer demosaicing ---- */
 
 /* ---- Tone mapping ---- */
+/* Float samples to 8 bits by 255 / maximum (Linear, no saturation) or 255 / (2 * mean) (Mean, */
+/* saturated). StatusNothingDoneWarning leaves dst as it was when the maximum or mean is negative. */
+ZELCC_API Status zeliToneMapLinear_32f8u_C1R(const float* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliToneMapMean_32f8u_C1R(const float* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
 
 #ifdef __cplusplus
 }
