@@ -85,6 +85,32 @@ ZELCC_API Status zeliGrayToRGB_32f_C1C4R(const float* src, int srcStep, float* d
                                          ImageSize size, float alpha);
 
 /* ---- RGB to and from YCbCr and YUV at full resolution ---- */
+/* RGB to video-range YCbCr: Y in 16..235, Cb and Cr in 16..240. */
+ZELCC_API Status zeliRGBToYCbCr_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
+                                         ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
+                                          ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                       int dstStep, ImageSize size);
+/* Video-range YCbCr to RGB or BGR. */
+ZELCC_API Status zeliYCbCrToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                         ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB_8u_P3C4R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                         ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCrToRGB_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                       int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                         ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR_8u_P3C4R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                         ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCrToBGR_709CSC_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst,
+                                                int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR_709CSC_8u_P3C4R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst,
+                                                int dstStep, ImageSize size, uint8_t alpha);
 
 /* ---- Photo YCC ---- */
 
