@@ -27,9 +27,14 @@ using zel::test::TestImage;
 struct Guarded {
   std::vector<uint8_t> bytes;
   uint8_t* first;
+  // Random bytes, one in four of them an edge value of the formulas.
   Guarded(int size, int offset, uint32_t seed) : bytes(size_t(size) + 192) {
+    static const uint8_t edges[] = {0, 1, 15, 16, 17, 127, 128, 129, 234, 235, 236, 239, 240, 241, 254, 255};
     std::mt19937 rng(seed);
-    for (uint8_t& b : bytes) b = uint8_t(rng() >> 24);
+    for (uint8_t& b : bytes) {
+      const uint32_t r = rng();
+      b = (r & 3) == 0 ? edges[(r >> 2) & 15] : uint8_t(r >> 24);
+    }
     first = bytes.data() + 64;
     first += (64 - (reinterpret_cast<uintptr_t>(first) & 63u)) & 63u;
     first += offset;
@@ -147,69 +152,58 @@ int andNot3(int w) { return w & ~3; }
 int none(int) { return 0; }
 int all(int w) { return w; }
 
+// Calls by argument shape: interleaved or planes on each side, alpha.
+template <auto F>
+Status packedToPacked(Side& s, Side& d, ImageSize z, uint8_t) {
+  return F(s.ptr(), s.step(), d.ptr(), d.step(), z);
+}
+template <auto F>
+Status packedToPlanes(Side& s, Side& d, ImageSize z, uint8_t) {
+  return F(s.ptr(), s.step(), d.planeArray(), d.step(), z);
+}
+template <auto F>
+Status planesToPlanes(Side& s, Side& d, ImageSize z, uint8_t) {
+  return F(s.planeArray(), s.step(), d.planeArray(), d.step(), z);
+}
+template <auto F>
+Status planesToPacked(Side& s, Side& d, ImageSize z, uint8_t) {
+  return F(s.planeArray(), s.step(), d.ptr(), d.step(), z);
+}
+template <auto F>
+Status planesToAlpha(Side& s, Side& d, ImageSize z, uint8_t a) {
+  return F(s.planeArray(), s.step(), d.ptr(), d.step(), z, a);
+}
+
 const std::vector<Member>& members() {
+  using L = Layout;
+  const Form wideFwd = formOf(WideFwd{}), highWord = formOf(HighWordFwd{});
+  const Form wideA = formOf(WideRgbForm{wide601a, 0}), wideB = formOf(WideRgbForm{wide601b, 0});
+  const Form wideRoundedA = formOf(WideRgbForm{wide601a, 32768}), wideRoundedB = formOf(WideRgbForm{wide601b, 32768});
   static const std::vector<Member> list = {
-      {"zeliRGBToYCbCr_8u_C3R", Layout::C3, Layout::C3, false,
-       [](Side& s, Side& d, ImageSize z, uint8_t) { return zeliRGBToYCbCr_8u_C3R(s.ptr(), s.step(), d.ptr(), d.step(), z); },
-       formOf(RoundedFwd{}), formOf(WideFwd{}), andNot15},
-      {"zeliRGBToYCbCr_8u_AC4R", Layout::AC4, Layout::AC4, false,
-       [](Side& s, Side& d, ImageSize z, uint8_t) { return zeliRGBToYCbCr_8u_AC4R(s.ptr(), s.step(), d.ptr(), d.step(), z); },
-       formOf(WideFwd{}), formOf(WideFwd{}), none},
-      {"zeliRGBToYCbCr_8u_C3P3R", Layout::C3, Layout::P3, false,
-       [](Side& s, Side& d, ImageSize z, uint8_t) {
-         return zeliRGBToYCbCr_8u_C3P3R(s.ptr(), s.step(), d.planeArray(), d.step(), z);
-       },
-       formOf(HighWordFwd{}), formOf(WideFwd{}), andNot7},
-      {"zeliRGBToYCbCr_8u_AC4P3R", Layout::AC4, Layout::P3, false,
-       [](Side& s, Side& d, ImageSize z, uint8_t) {
-         return zeliRGBToYCbCr_8u_AC4P3R(s.ptr(), s.step(), d.planeArray(), d.step(), z);
-       },
-       formOf(HighWordFwd{}), formOf(WideFwd{}), andNot7},
-      {"zeliRGBToYCbCr_8u_P3R", Layout::P3, Layout::P3, false,
-       [](Side& s, Side& d, ImageSize z, uint8_t) {
-         return zeliRGBToYCbCr_8u_P3R(s.planeArray(), s.step(), d.planeArray(), d.step(), z);
-       },
-       formOf(HighWordFwd{}), formOf(WideFwd{}), andNot7},
-      {"zeliYCbCrToRGB_8u_AC4R", Layout::AC4, Layout::AC4, false,
-       [](Side& s, Side& d, ImageSize z, uint8_t) { return zeliYCbCrToRGB_8u_AC4R(s.ptr(), s.step(), d.ptr(), d.step(), z); },
-       formOf(WideRgbForm{wide601a, 0}), formOf(WideRgbForm{wide601a, 0}), none},
-      {"zeliYCbCrToRGB_8u_C3R", Layout::C3, Layout::C3, false,
-       [](Side& s, Side& d, ImageSize z, uint8_t) { return zeliYCbCrToRGB_8u_C3R(s.ptr(), s.step(), d.ptr(), d.step(), z); },
-       formOf(LaneAddedForm{lanes601a, 8}), formOf(WideRgbForm{wide601a, 0}), andNot3},
-      {"zeliYCbCrToRGB_8u_P3R", Layout::P3, Layout::P3, false,
-       [](Side& s, Side& d, ImageSize z, uint8_t) {
-         return zeliYCbCrToRGB_8u_P3R(s.planeArray(), s.step(), d.planeArray(), d.step(), z);
-       },
-       formOf(LaneAddedForm{lanes601a, 0}), formOf(WideRgbForm{wide601a, 32768}), andNot3},
-      {"zeliYCbCrToRGB_8u_P3C3R", Layout::P3, Layout::C3, false,
-       [](Side& s, Side& d, ImageSize z, uint8_t) {
-         return zeliYCbCrToRGB_8u_P3C3R(s.planeArray(), s.step(), d.ptr(), d.step(), z);
-       },
-       formOf(LaneAddedForm{lanes601b, 8}), formOf(WideRgbForm{wide601b, 0}), andNot7},
-      {"zeliYCbCrToRGB_8u_P3C4R", Layout::P3, Layout::C4, false,
-       [](Side& s, Side& d, ImageSize z, uint8_t a) {
-         return zeliYCbCrToRGB_8u_P3C4R(s.planeArray(), s.step(), d.ptr(), d.step(), z, a);
-       },
-       formOf(LaneSubtractedForm{lanes601b}), formOf(WideRgbForm{wide601b, 32768}), andNot7},
-      {"zeliYCbCrToBGR_8u_P3C3R", Layout::P3, Layout::C3, true,
-       [](Side& s, Side& d, ImageSize z, uint8_t) {
-         return zeliYCbCrToBGR_8u_P3C3R(s.planeArray(), s.step(), d.ptr(), d.step(), z);
-       },
+      {"zeliRGBToYCbCr_8u_C3R", L::C3, L::C3, false, packedToPacked<zeliRGBToYCbCr_8u_C3R>, formOf(RoundedFwd{}),
+       wideFwd, andNot15},
+      {"zeliRGBToYCbCr_8u_AC4R", L::AC4, L::AC4, false, packedToPacked<zeliRGBToYCbCr_8u_AC4R>, wideFwd, wideFwd, none},
+      {"zeliRGBToYCbCr_8u_C3P3R", L::C3, L::P3, false, packedToPlanes<zeliRGBToYCbCr_8u_C3P3R>, highWord, wideFwd,
+       andNot7},
+      {"zeliRGBToYCbCr_8u_AC4P3R", L::AC4, L::P3, false, packedToPlanes<zeliRGBToYCbCr_8u_AC4P3R>, highWord, wideFwd,
+       andNot7},
+      {"zeliRGBToYCbCr_8u_P3R", L::P3, L::P3, false, planesToPlanes<zeliRGBToYCbCr_8u_P3R>, highWord, wideFwd, andNot7},
+      {"zeliYCbCrToRGB_8u_AC4R", L::AC4, L::AC4, false, packedToPacked<zeliYCbCrToRGB_8u_AC4R>, wideA, wideA, none},
+      {"zeliYCbCrToRGB_8u_C3R", L::C3, L::C3, false, packedToPacked<zeliYCbCrToRGB_8u_C3R>,
+       formOf(LaneAddedForm{lanes601a, 8}), wideA, andNot3},
+      {"zeliYCbCrToRGB_8u_P3R", L::P3, L::P3, false, planesToPlanes<zeliYCbCrToRGB_8u_P3R>,
+       formOf(LaneAddedForm{lanes601a, 0}), wideRoundedA, andNot3},
+      {"zeliYCbCrToRGB_8u_P3C3R", L::P3, L::C3, false, planesToPacked<zeliYCbCrToRGB_8u_P3C3R>,
+       formOf(LaneAddedForm{lanes601b, 8}), wideB, andNot7},
+      {"zeliYCbCrToRGB_8u_P3C4R", L::P3, L::C4, false, planesToAlpha<zeliYCbCrToRGB_8u_P3C4R>,
+       formOf(LaneSubtractedForm{lanes601b}), wideRoundedB, andNot7},
+      {"zeliYCbCrToBGR_8u_P3C3R", L::P3, L::C3, true, planesToPacked<zeliYCbCrToBGR_8u_P3C3R>,
        formOf(LaneAddedForm{lanes601b, 8}), nullptr, all},
-      {"zeliYCbCrToBGR_8u_P3C4R", Layout::P3, Layout::C4, true,
-       [](Side& s, Side& d, ImageSize z, uint8_t a) {
-         return zeliYCbCrToBGR_8u_P3C4R(s.planeArray(), s.step(), d.ptr(), d.step(), z, a);
-       },
+      {"zeliYCbCrToBGR_8u_P3C4R", L::P3, L::C4, true, planesToAlpha<zeliYCbCrToBGR_8u_P3C4R>,
        formOf(LaneSubtractedForm{lanes601b}), nullptr, all},
-      {"zeliYCbCrToBGR_709CSC_8u_P3C3R", Layout::P3, Layout::C3, true,
-       [](Side& s, Side& d, ImageSize z, uint8_t) {
-         return zeliYCbCrToBGR_709CSC_8u_P3C3R(s.planeArray(), s.step(), d.ptr(), d.step(), z);
-       },
+      {"zeliYCbCrToBGR_709CSC_8u_P3C3R", L::P3, L::C3, true, planesToPacked<zeliYCbCrToBGR_709CSC_8u_P3C3R>,
        formOf(LaneAddedForm{lanes709, 8}), nullptr, all},
-      {"zeliYCbCrToBGR_709CSC_8u_P3C4R", Layout::P3, Layout::C4, true,
-       [](Side& s, Side& d, ImageSize z, uint8_t a) {
-         return zeliYCbCrToBGR_709CSC_8u_P3C4R(s.planeArray(), s.step(), d.ptr(), d.step(), z, a);
-       },
+      {"zeliYCbCrToBGR_709CSC_8u_P3C4R", L::P3, L::C4, true, planesToAlpha<zeliYCbCrToBGR_709CSC_8u_P3C4R>,
        formOf(LaneSubtractedForm{lanes709}), nullptr, all},
   };
   return list;
