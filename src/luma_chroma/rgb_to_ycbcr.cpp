@@ -64,11 +64,8 @@ ZEL_PUBLIC Status zeliRGBToYCbCr_8u_AC4R(const uint8_t* src, int srcStep, uint8_
   if (badSize(size)) return StatusSizeError;
   // No body: every pixel takes the wide form; the fourth byte stays.
   const int width = size.width;
-  zel::plainWalk(size.height, [&](int y) {
-    const PackedIn<4> in = packedIn<4>(src, srcStep, y);
-    const PackedOutKeep out{zel::rowAt(dst, dstStep, y)};
-    formPixels(in, out, 0, width, WideFwd{});
-  });
+  zel::plainWalk(size.height,
+                 [&](int y) { keepAlphaRow(zel::rowAt(src, srcStep, y), zel::rowAt(dst, dstStep, y), width, WideFwd{}); });
   return StatusOk;
 }
 

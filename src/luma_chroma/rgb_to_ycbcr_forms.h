@@ -61,6 +61,23 @@ inline YCbCr8 ycbcrRounded(int r, int g, int b) {
 
 // ---- vector forms ----
 
+// The wide form on four pixels of R, G, B, x bytes, as exact 32-bit dot
+// products; the results lie in 16..240, so the merge stores the low bytes.
+inline __m128i ycbcrWide4(__m128i px) {
+  const __m128i lo = _mm_cvtepu8_epi16(px), hi = _mm_unpackhi_epi8(px, _mm_setzero_si128());
+  auto dot = [&](int r, int g, int b) {
+    const __m128i c = _mm_setr_epi16(int16_t(r), int16_t(g), int16_t(b), 0, int16_t(r), int16_t(g), int16_t(b), 0);
+    return _mm_hadd_epi32(_mm_madd_epi16(lo, c), _mm_madd_epi16(hi, c));
+  };
+  // 33030 does not fit a signed lane: G 33030 = G (33030 - 65536) + (G << 16).
+  const __m128i g16 = _mm_slli_epi32(_mm_and_si128(px, _mm_set1_epi32(0xff00)), 8);
+  const __m128i y = _mm_add_epi32(_mm_add_epi32(dot(kYR, kYG - 65536, kYB), g16), _mm_set1_epi32(kLumaAddend));
+  const __m128i chroma = _mm_set1_epi32(kChromaAddend);
+  const __m128i cb = _mm_add_epi32(dot(kCbR, kCbG, kCbB), chroma);
+  const __m128i cr = _mm_add_epi32(dot(kCrR, kCrG, kCrB), chroma);
+  return mergeDwords(_mm_srai_epi32(y, 16), _mm_srai_epi32(cb, 16), _mm_srai_epi32(cr, 16));
+}
+
 template <class U>
 struct LaneYCbCr {
   typename U::V y, cb, cr;  // 16-bit lanes before SaturateU8
@@ -101,6 +118,7 @@ inline Samples3 samplesOf(const YCbCr8& p) { return {p.y, p.cb, p.cr}; }
 struct WideFwd {
   static constexpr bool kVector = false;
   Samples3 pixel(const Samples3& s) const { return samplesOf(ycbcrWide(s.c0, s.c1, s.c2)); }
+  __m128i pixels4(__m128i px) const { return ycbcrWide4(px); }
 };
 
 struct HighWordFwd {

@@ -118,6 +118,13 @@ struct Samples3 {
   int c0, c1, c2;
 };
 
+// Three dwords of 16-bit-range results to the bytes of four pixels: byte
+// 4i + c is SaturateU8 of channel c of pixel i, byte 4i + 3 is zero.
+inline __m128i mergeDwords(__m128i c0, __m128i c1, __m128i c2) {
+  const __m128i bytes = _mm_packus_epi16(_mm_packs_epi32(c0, c1), _mm_packs_epi32(c2, _mm_setzero_si128()));
+  return _mm_shuffle_epi8(bytes, _mm_setr_epi8(0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15));
+}
+
 // Bytes of a unit widened to two vectors of 16-bit lanes (pixels 0..7 and
 // 8..15 of each unit), and back with SaturateU8.
 template <class U>

@@ -129,6 +129,21 @@ inline LaneRgb<U> laneSubtracted(const LaneSet& s, typename U::V yl, typename U:
   return {U::template sra16<4>(r), U::template sra16<4>(g), U::template sra16<4>(b)};
 }
 
+// The wide form on four pixels of Y, Cb, Cr, x bytes in 32-bit lanes; the
+// result holds R, G, B, 0 bytes for each pixel.
+inline __m128i wideForm4(const WideSet& s, __m128i px, int32_t round) {
+  const __m128i mask = _mm_set1_epi32(0xff), centre = _mm_set1_epi32(128);
+  const __m128i y = _mm_and_si128(px, mask);
+  const __m128i u = _mm_sub_epi32(_mm_and_si128(_mm_srli_epi32(px, 8), mask), centre);
+  const __m128i v = _mm_sub_epi32(_mm_and_si128(_mm_srli_epi32(px, 16), mask), centre);
+  const __m128i luma = _mm_add_epi32(_mm_mullo_epi32(y, _mm_set1_epi32(s.luma)), _mm_set1_epi32(s.offset + round));
+  const __m128i r = _mm_add_epi32(luma, _mm_mullo_epi32(v, _mm_set1_epi32(s.vToR)));
+  const __m128i g = _mm_add_epi32(_mm_add_epi32(luma, _mm_mullo_epi32(u, _mm_set1_epi32(s.uToG))),
+                                  _mm_mullo_epi32(v, _mm_set1_epi32(s.vToG)));
+  const __m128i b = _mm_add_epi32(luma, _mm_mullo_epi32(u, _mm_set1_epi32(s.uToB)));
+  return mergeDwords(_mm_srai_epi32(r, 16), _mm_srai_epi32(g, 16), _mm_srai_epi32(b, 16));
+}
+
 // ---- the forms as row forms: samples Y, Cb, Cr in, R, G, B out ----
 
 inline Samples3 samplesOf(const Rgb8& p) { return {p.r, p.g, p.b}; }
@@ -162,6 +177,7 @@ struct WideRgbForm {
   WideSet set;
   int32_t round;
   Samples3 pixel(const Samples3& s) const { return samplesOf(wideForm(set, s.c0, s.c1, s.c2, round)); }
+  __m128i pixels4(__m128i px) const { return wideForm4(set, px, round); }
 };
 
 }  // namespace zel::lc

@@ -69,9 +69,8 @@ ZEL_PUBLIC Status zeliYCbCrToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_
   // No body: every pixel takes the wide truncated form; the fourth byte stays.
   const WideRgbForm wide{wide601a, 0};
   const int width = size.width;
-  zel::plainWalk(size.height, [&](int y) {
-    formPixels(PackedIn<4>{zel::rowAt(src, srcStep, y)}, PackedOutKeep{zel::rowAt(dst, dstStep, y)}, 0, width, wide);
-  });
+  zel::plainWalk(size.height,
+                 [&](int y) { keepAlphaRow(zel::rowAt(src, srcStep, y), zel::rowAt(dst, dstStep, y), width, wide); });
   return StatusOk;
 }
 

@@ -41,26 +41,44 @@ struct Guarded {
   }
 };
 
-// Converts rows of every width 1..70 at odd offsets through the blocked
-// kernel (SSE4.1 only, then with AVX2 where the processor has it) and
+// Converts rows of every width 1..70 at odd offsets through a blocked row
+// function (SSE4.1 only, then with AVX2 where the processor has it) and
 // through the scalar form alone; the two buffers must agree byte for byte,
 // guards included.
-template <class Form, class MakeIn, class MakeOut>
-void kernelMatchesScalar(const Form& form, int inBytes, int outBytes, MakeIn makeIn, MakeOut makeOut) {
+template <class Blocked, class Scalar>
+void rowsAgree(int inBytes, int outBytes, Blocked blocked, Scalar scalar) {
   for (bool avx2 : {false, true}) {
     if (avx2 && !zel::hasAvx2()) continue;
     for (int width = 1; width <= 70; ++width)
       for (int offset : {0, 1, 3, 7}) {
         const uint32_t seed = uint32_t(width * 16 + offset);
         const Guarded src(width * inBytes, offset, seed);
-        Guarded blocked(width * outBytes, (offset * 5) & 15, seed + 1);
-        Guarded scalar = blocked;
-        scalar.first = scalar.bytes.data() + (blocked.first - blocked.bytes.data());
-        convertRow(makeIn(src.first, width), makeOut(blocked.first, width), width, width, form, form, avx2);
-        formPixels(makeIn(src.first, width), makeOut(scalar.first, width), 0, width, form);
-        ASSERT_TRUE(blocked.bytes == scalar.bytes) << "width " << width << " offset " << offset << " avx2 " << avx2;
+        Guarded vector(width * outBytes, (offset * 5) & 15, seed + 1);
+        Guarded plain = vector;
+        plain.first = plain.bytes.data() + (vector.first - vector.bytes.data());
+        blocked(src.first, vector.first, width, avx2);
+        scalar(src.first, plain.first, width);
+        ASSERT_TRUE(vector.bytes == plain.bytes) << "width " << width << " offset " << offset << " avx2 " << avx2;
       }
   }
+}
+
+template <class Form, class MakeIn, class MakeOut>
+void kernelMatchesScalar(const Form& form, int inBytes, int outBytes, MakeIn makeIn, MakeOut makeOut) {
+  rowsAgree(
+      inBytes, outBytes,
+      [&](const uint8_t* s, uint8_t* d, int w, bool avx2) {
+        convertRow(makeIn(s, w), makeOut(d, w), w, w, form, form, avx2);
+      },
+      [&](const uint8_t* s, uint8_t* d, int w) { formPixels(makeIn(s, w), makeOut(d, w), 0, w, form); });
+}
+
+// The wide forms four pixels at a time, the fourth byte kept.
+template <class Form>
+void keepAlphaMatchesScalar(const Form& form) {
+  rowsAgree(
+      4, 4, [&](const uint8_t* s, uint8_t* d, int w, bool) { keepAlphaRow(s, d, w, form); },
+      [&](const uint8_t* s, uint8_t* d, int w) { formPixels(PackedIn<4>{s}, PackedOutKeep{d}, 0, w, form); });
 }
 
 auto planesIn = [](const uint8_t* p, int width) { return PlanesIn{p, p + width, p + 2 * width}; };
@@ -83,6 +101,7 @@ TEST(YCbCrKernels, ForwardBlocksMatchTheScalarForms) {
   kernelMatchesScalar(HighWordFwd{}, 3, 3, packedIn<3>, planesOut);
   kernelMatchesScalar(HighWordFwd{}, 4, 3, packedIn<4>, planesOut);
   kernelMatchesScalar(HighWordFwd{}, 3, 3, planesIn, planesOut);
+  keepAlphaMatchesScalar(WideFwd{});
 }
 
 TEST(YCbCrKernels, InverseBlocksMatchTheScalarForms) {
@@ -92,6 +111,10 @@ TEST(YCbCrKernels, InverseBlocksMatchTheScalarForms) {
   kernelMatchesScalar(LaneAddedForm{lanes709, 8}, 3, 3, planesIn, packedOut<true>);
   kernelMatchesScalar(LaneSubtractedForm{lanes601b}, 3, 4, planesIn, alphaOut<false>);
   kernelMatchesScalar(LaneSubtractedForm{lanes709}, 3, 4, planesIn, alphaOut<true>);
+  for (int32_t round : {0, 32768}) {
+    keepAlphaMatchesScalar(WideRgbForm{wide601a, round});
+    keepAlphaMatchesScalar(WideRgbForm{wide601b, round});
+  }
 }
 
 // ---- exports: zones, layouts, alpha ----
