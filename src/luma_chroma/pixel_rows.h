@@ -15,7 +15,6 @@
 
 namespace zel::lc {
 
-
 // ---- shuffle patterns for interleaved rows ----
 
 // gather[c][k]: channel c of the 16 pixels from the k-th 16 bytes of a
