@@ -38,6 +38,29 @@ Peer cvtColorPeer(const char* label, int srcType, int dstType, int code) {
 }
 #endif
 
+#ifdef ZELCC_BENCH_LIBYUV
+// A frame's planes for libyuv: luma, two chroma planes (or one pair plane)
+// and a packed 4:2:2 stream, all of the frame size.
+struct YuvFrame {
+  std::vector<uint8_t> y = frameBytes(size_t(kWidth) * kHeight);
+  std::vector<uint8_t> u = frameBytes(size_t(kWidth / 2) * kHeight);
+  std::vector<uint8_t> v = frameBytes(size_t(kWidth / 2) * kHeight);
+  std::vector<uint8_t> uv = frameBytes(size_t(kWidth) * kHeight);
+  std::vector<uint8_t> packed = frameBytes(size_t(kWidth) * 2 * kHeight);
+  std::vector<uint8_t> y2 = std::vector<uint8_t>(size_t(kWidth) * kHeight);
+  std::vector<uint8_t> u2 = std::vector<uint8_t>(size_t(kWidth / 2) * kHeight);
+  std::vector<uint8_t> v2 = std::vector<uint8_t>(size_t(kWidth / 2) * kHeight);
+  std::vector<uint8_t> uv2 = std::vector<uint8_t>(size_t(kWidth) * kHeight);
+  std::vector<uint8_t> packed2 = std::vector<uint8_t>(size_t(kWidth) * 2 * kHeight);
+};
+
+template <typename Call>
+std::vector<Peer> yuvPeer(const char* label, Call call) {
+  auto f = std::make_shared<YuvFrame>();
+  return {Peer{label, [f, call] { call(*f); }}};
+}
+#endif
+
 using PeerFactory = std::function<std::vector<Peer>()>;
 
 const std::map<std::string, PeerFactory>& table() {
@@ -82,6 +105,70 @@ const std::map<std::string, PeerFactory>& table() {
 #endif
          return p;
        }},
+#ifdef ZELCC_BENCH_LIBYUV
+      {"zeliYCbCr422ToYCbCr420_8u_C2P3R",
+       [] {
+         return yuvPeer("libyuv YUY2ToI420", [](YuvFrame& f) {
+           libyuv::YUY2ToI420(f.packed.data(), kWidth * 2, f.y2.data(), kWidth, f.u2.data(), kWidth / 2, f.v2.data(),
+                              kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliCbYCr422ToYCbCr420_8u_C2P3R",
+       [] {
+         return yuvPeer("libyuv UYVYToI420", [](YuvFrame& f) {
+           libyuv::UYVYToI420(f.packed.data(), kWidth * 2, f.y2.data(), kWidth, f.u2.data(), kWidth / 2, f.v2.data(),
+                              kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr422_8u_C2P3R",
+       [] {
+         return yuvPeer("libyuv YUY2ToI422", [](YuvFrame& f) {
+           libyuv::YUY2ToI422(f.packed.data(), kWidth * 2, f.y2.data(), kWidth, f.u2.data(), kWidth / 2, f.v2.data(),
+                              kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr422_8u_P3C2R",
+       [] {
+         return yuvPeer("libyuv I422ToYUY2", [](YuvFrame& f) {
+           libyuv::I422ToYUY2(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.packed2.data(),
+                              kWidth * 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCrCb420ToYCbCr422_8u_P3C2R",
+       [] {
+         return yuvPeer("libyuv I420ToYUY2", [](YuvFrame& f) {
+           libyuv::I420ToYUY2(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.packed2.data(),
+                              kWidth * 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCrCb420ToCbYCr422_8u_P3C2R",
+       [] {
+         return yuvPeer("libyuv I420ToUYVY", [](YuvFrame& f) {
+           libyuv::I420ToUYVY(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.packed2.data(),
+                              kWidth * 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420_8u_P2P3R",
+       [] {
+         return yuvPeer("libyuv NV12ToI420", [](YuvFrame& f) {
+           libyuv::NV12ToI420(f.y.data(), kWidth, f.uv.data(), kWidth, f.y2.data(), kWidth, f.u2.data(), kWidth / 2,
+                              f.v2.data(), kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420_8u_P3P2R",
+       [] {
+         return yuvPeer("libyuv I420ToNV12", [](YuvFrame& f) {
+           libyuv::I420ToNV12(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.y2.data(), kWidth,
+                              f.uv2.data(), kWidth, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr422ToGray_8u_C2C1R",
+       [] {
+         return yuvPeer("libyuv YUY2ToY", [](YuvFrame& f) {
+           libyuv::YUY2ToY(f.packed.data(), kWidth * 2, f.y2.data(), kWidth, kWidth, kHeight);
+         });
+       }},
+#endif
   };
   return t;
 }

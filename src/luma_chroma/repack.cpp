@@ -142,10 +142,10 @@ void writeRow(const Layout& l, const Side& s, int lumaRow, int chromaRow, const 
   }
 }
 
-// One chroma plane's rule between two schemes, for a group of rows.
-// src rows: 1 for 4:2:0 in a pair group, else one per luma row.
-void convertChroma(Scheme from, Scheme to, const uint8_t* const* in, uint8_t* const* out, int srcCount, int dstCount,
-                   int n, bool nonTemporal) {
+// One chroma plane's rule between two schemes, for a group of rows: the
+// source has one chroma row for 4:2:0 in a pair group, else one per luma row.
+void convertChroma(Scheme from, Scheme to, const uint8_t* const* in, uint8_t* const* out, int dstCount, int n,
+                   bool nonTemporal) {
   const int cn = chromaWidth(to, n);
   if (from == to) {
     for (int r = 0; r < dstCount; ++r) copyBytes(in[r], out[r], cn, nonTemporal);
@@ -163,7 +163,6 @@ void convertChroma(Scheme from, Scheme to, const uint8_t* const* in, uint8_t* co
   } else {                                           // 4:2:0 to 4:1:1, the inverse
     unzip(in[0], out[0], out[1], cn);
   }
-  (void)srcCount;
 }
 
 Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
@@ -217,6 +216,10 @@ Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
   const int groupRows = pairs ? 2 : 1;
   const int srcChromaRows = (m.src.scheme == Scheme::S420) ? 1 : groupRows;
   const int dstChromaRows = (m.dst.scheme == Scheme::S420) ? 1 : groupRows;
+  // Rules that move whole chroma rows and leave the samples of a row alone.
+  const bool moveOnly = m.src.scheme == m.dst.scheme ||
+                        (m.src.scheme == Scheme::S422 && m.dst.scheme == Scheme::S420) ||
+                        (m.src.scheme == Scheme::S420 && m.dst.scheme == Scheme::S422);
 
   Staging st;
   for (int g = 0; g + groupRows <= height; g += groupRows) {
@@ -230,14 +233,28 @@ Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
       // Chroma rule, written straight into destination planes or staged
       // for a pair stream or two planes.
       Staging out;
-      uint8_t* cb[2];
-      uint8_t* cr[2];
-      for (int k = 0; k < dstChromaRows; ++k) {
-        const int chromaRow = dstChromaRows == 1 ? g / groupRows : g + k;
-        chromaTargets(m.dst, dst, chromaRow, k, x, out, cb[k], cr[k]);
+      const uint8_t* cb[2];
+      const uint8_t* cr[2];
+      if (m.dst.kind != Kind::Planes && moveOnly) {
+        // Rows are only kept, dropped or repeated: the writer reads the
+        // source chroma rows themselves.
+        for (int k = 0; k < dstChromaRows; ++k) {
+          const int from = m.src.scheme == m.dst.scheme ? k : 0;
+          cb[k] = r.cb[from];
+          cr[k] = r.cr[from];
+        }
+      } else {
+        uint8_t* tcb[2];
+        uint8_t* tcr[2];
+        for (int k = 0; k < dstChromaRows; ++k) {
+          const int chromaRow = dstChromaRows == 1 ? g / groupRows : g + k;
+          chromaTargets(m.dst, dst, chromaRow, k, x, out, tcb[k], tcr[k]);
+          cb[k] = tcb[k];
+          cr[k] = tcr[k];
+        }
+        convertChroma(m.src.scheme, m.dst.scheme, r.cb, tcb, dstChromaRows, n, nonTemporal);
+        convertChroma(m.src.scheme, m.dst.scheme, r.cr, tcr, dstChromaRows, n, nonTemporal);
       }
-      convertChroma(m.src.scheme, m.dst.scheme, r.cb, cb, srcChromaRows, dstChromaRows, n, nonTemporal);
-      convertChroma(m.src.scheme, m.dst.scheme, r.cr, cr, srcChromaRows, dstChromaRows, n, nonTemporal);
       for (int k = 0; k < groupRows; ++k) {
         const int chromaSlot = dstChromaRows == 1 ? 0 : k;
         const int chromaRow = k < dstChromaRows ? (dstChromaRows == 1 ? g / groupRows : g + k) : -1;
