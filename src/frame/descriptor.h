@@ -58,7 +58,9 @@ struct Extra {
 };
 
 // Steps of the argument checks, in the order a member runs them.
-enum class Check { NullTop, NullPlanes, Size, Step, Extra };
+// SizePositive: a test of width and height >= 1 standing before a later
+// test of the minima (Size then covers only what lies between).
+enum class Check { NullTop, NullPlanes, SizePositive, Size, Step, Extra };
 struct CheckStage {
   Check check;
   int extra = -1;  // for Check::Extra
@@ -95,6 +97,7 @@ struct Descriptor {
   std::vector<ArgSlot> slots;
   int minWidth = 1, minHeight = 1;  // a minimum of 0: that dimension is not checked
   int multWidth = 1, multHeight = 1;  // required multiples
+  int roomWidth = 0, roomHeight = 0;  // buffers cover at least this size: members that write past a tiny region
   bool warnsOdd = false;        // may return StatusOddSizeWarning
   bool writesAlpha = false;     // an AC4 destination's fourth channel is written
   bool checksSteps = false;
