@@ -12,9 +12,10 @@ namespace zel::twist {
 enum Kind { Planar = 1, C3 = 3, AC4 = 4 };
 
 // `src[k]`, `dst[k]`: the row of plane k, or the pixel row in [0]. Vector
-// blocks of four pixels, then one pixel at a time; one formula for both.
+// blocks of four pixels (eight with `wide`, the caller having checked for
+// AVX2 in integer members), then one pixel at a time; one formula for all.
 template <typename T, int K>
-void row(const T* const src[3], T* const dst[3], int width, const Matrix& m);
+void row(const T* const src[3], T* const dst[3], int width, const Matrix& m, bool wide);
 
 // Three-channel floats over `pixels` pixels; `stream` writes the blocks
 // with non-temporal stores (where the destination is 16-byte aligned)

@@ -6,8 +6,10 @@
 #include <algorithm>
 #include <cstring>
 #include <random>
+#include <type_traits>
 #include <vector>
 
+#include "frame/simd.h"
 #include "pixel_ops/twist.h"
 #include "support/test_image.h"
 #include "zelcc/zelcc.h"
@@ -28,7 +30,7 @@ Matrix randomMatrix(std::mt19937& rng, float weight, float constant) {
 // Rows of one layout through the kernel, in place or not, against the
 // formula of each sample; alpha and everything past the row unchanged.
 template <typename T, int K>
-void checkKernel(float weight, float constant, bool inPlace) {
+void checkKernel(float weight, float constant, bool inPlace, bool wide) {
   std::mt19937 rng(K * 100 + int(sizeof(T)));
   const int planes = K == Planar ? 3 : 1, perPixel = K == Planar ? 1 : K;
   for (int width = 1; width <= 70; ++width)
@@ -57,7 +59,7 @@ void checkKernel(float weight, float constant, bool inPlace) {
         s[k] = src[k < planes ? k : 0].data();
         d[k] = out[k < planes ? k : 0].data();
       }
-      row<T, K>(s, d, width, m);
+      row<T, K>(s, d, width, m, wide);
       for (int x = 0; x < width; ++x) {
         auto inAt = [&](int ch) { return K == Planar ? in[ch][x] : in[0][x * K + ch]; };
         const float a = float(inAt(0)), b = float(inAt(1)), c = float(inAt(2));
@@ -77,10 +79,13 @@ void checkKernel(float weight, float constant, bool inPlace) {
 
 template <typename T>
 void checkAllLayouts(float weight, float constant) {
-  for (bool inPlace : {false, true}) {
-    checkKernel<T, C3>(weight, constant, inPlace);
-    checkKernel<T, AC4>(weight, constant, inPlace);
-    checkKernel<T, Planar>(weight, constant, inPlace);
+  for (bool wide : {false, true}) {
+    if (wide && (std::is_same_v<T, float> || !zel::hasAvx2())) continue;
+    for (bool inPlace : {false, true}) {
+      checkKernel<T, C3>(weight, constant, inPlace, wide);
+      checkKernel<T, AC4>(weight, constant, inPlace, wide);
+      checkKernel<T, Planar>(weight, constant, inPlace, wide);
+    }
   }
 }
 
