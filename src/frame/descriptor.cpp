@@ -169,6 +169,7 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
   std::istringstream in(extras);
   std::string word;
   std::vector<std::string> order;  // custom order words, if given
+  std::vector<std::string> presize;  // family arguments that precede size
   while (in >> word) {
     if (word == "alpha") {
       // The destination's fourth channel value, in its sample type.
@@ -198,6 +199,9 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
         e.bad.push_back({std::atof(f[k].substr(0, eq).c_str()), static_cast<Status>(std::atoi(f[k].c_str() + eq + 1))});
       }
       d.extras.push_back(e);
+    } else if (word.rfind("presize=", 0) == 0) {
+      // presize=NAME: the family argument NAME stands before size.
+      presize.push_back(word.substr(8));
     } else if (word.rfind("min=", 0) == 0) {
       if (std::sscanf(word.c_str() + 4, "%dx%d", &d.minWidth, &d.minHeight) != 2) {
         error = "bad min= in extras of " + d.name;
@@ -207,6 +211,8 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       d.warnsOdd = true;
     } else if (word == "steps") {
       d.checksSteps = true;
+    } else if (word == "elementsteps") {
+      d.elementSteps = true;
     } else if (word == "alphawritten") {
       d.writesAlpha = true;
     } else if (word.rfind("order=", 0) == 0) {
@@ -219,6 +225,14 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       error = "unknown extra '" + word + "' of " + d.name;
       return false;
     }
+  }
+  for (const std::string& name : presize) {
+    auto it = std::find_if(d.extras.begin(), d.extras.end(), [&](const Extra& e) { return e.name == name; });
+    if (it == d.extras.end()) {
+      error = "presize names unknown argument '" + name + "' in " + d.name;
+      return false;
+    }
+    it->beforeSize = true;
   }
   // Check order: pointers (top level, then plane entries), size, steps,
   // family values, unless the family names its own.
@@ -346,8 +360,11 @@ bool describe(const std::string& name, const std::string& extras, Descriptor& d,
     addSideSlots(d, d.src, Role::SrcPtr, Role::SrcPlanes, Role::SrcStep, Role::SrcSteps);
     addSideSlots(d, d.dst, Role::DstPtr, Role::DstPlanes, Role::DstStep, Role::DstSteps);
   }
+  for (int i = 0; i < int(d.extras.size()); ++i)
+    if (d.extras[i].beforeSize) d.slots.push_back({Role::Extra, 0, i});
   d.slots.push_back({Role::Size});
-  for (int i = 0; i < int(d.extras.size()); ++i) d.slots.push_back({Role::Extra, 0, i});
+  for (int i = 0; i < int(d.extras.size()); ++i)
+    if (!d.extras[i].beforeSize) d.slots.push_back({Role::Extra, 0, i});
   return true;
 }
 
@@ -419,6 +436,7 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
       Buffer b;
       b.geometry = planeGeometry(side, p, w, h);
       b.step = b.geometry.rowBytes + padBytes;
+      b.rowStep = d.elementSteps ? b.step / b.geometry.sampleBytes * b.geometry.sampleBytes : b.step;
       const int rows = std::max(b.geometry.rows, 1);
       const size_t total = size_t(kGuard) * 2 + size_t(offset) + size_t(b.step) * rows + 64;
       b.bytes.assign(total, kGuardByte);
@@ -474,7 +492,7 @@ void Workspace::fillRandom(uint32_t seed) {
   for (Buffer& b : buffers_) {
     if (!b.isSource) continue;
     for (int y = 0; y < b.geometry.rows; ++y) {
-      uint8_t* row = b.first + size_t(y) * b.step;
+      uint8_t* row = b.first + size_t(y) * b.rowStep;
       if (d_.src.sample == Sample::F32) {
         // Floats in 0..1, the range colour functions take.
         std::uniform_real_distribution<float> dist(0.0f, 1.0f);
@@ -492,7 +510,7 @@ void Workspace::fillRandom(uint32_t seed) {
 void Workspace::fillDestinations(uint8_t value) {
   for (Buffer& b : buffers_) {
     if (!b.isDestination || b.isSource) continue;
-    for (int y = 0; y < b.geometry.rows; ++y) std::memset(b.first + size_t(y) * b.step, value, b.geometry.rowBytes);
+    for (int y = 0; y < b.geometry.rows; ++y) std::memset(b.first + size_t(y) * b.rowStep, value, b.geometry.rowBytes);
   }
 }
 
@@ -578,12 +596,12 @@ std::string Workspace::checkGuards() const {
       return m.str();
     };
     const int rows = b.geometry.rows;
-    const uint8_t* regionEnd = b.first + (rows > 0 ? size_t(rows - 1) * b.step + b.geometry.rowBytes : 0);
+    const uint8_t* regionEnd = b.first + (rows > 0 ? size_t(rows - 1) * b.rowStep + b.geometry.rowBytes : 0);
     for (const uint8_t* p = lo; p < b.first; ++p)
       if (*p != kGuardByte) return describeAt(p);
     for (int y = 0; y + 1 < rows; ++y) {
-      const uint8_t* padStart = b.first + size_t(y) * b.step + b.geometry.rowBytes;
-      for (const uint8_t* p = padStart; p < b.first + size_t(y + 1) * b.step; ++p)
+      const uint8_t* padStart = b.first + size_t(y) * b.rowStep + b.geometry.rowBytes;
+      for (const uint8_t* p = padStart; p < b.first + size_t(y + 1) * b.rowStep; ++p)
         if (*p != kGuardByte) return describeAt(p);
     }
     for (const uint8_t* p = regionEnd; p < hi; ++p)

@@ -54,6 +54,7 @@ struct Extra {
   double good;
   std::vector<BadValue> bad;
   int stage = -1;  // where its check stands in the order (index into Descriptor::order)
+  bool beforeSize = false;  // stands before `size` in the prototype
 };
 
 // Steps of the argument checks, in the order a member runs them.
@@ -96,6 +97,7 @@ struct Descriptor {
   bool warnsOdd = false;        // may return StatusOddSizeWarning
   bool writesAlpha = false;     // an AC4 destination's fourth channel is written
   bool checksSteps = false;
+  bool elementSteps = false;    // steps count whole samples: a step rounds down to a multiple of the sample size
   void (*impl)() = nullptr;
   Invoker invoke = nullptr;
   std::vector<ArgKind> prototype;  // kinds of the prototype's parameters
@@ -128,7 +130,8 @@ class Workspace {
   struct Buffer {
     std::vector<uint8_t> bytes;  // guard + rows + guard
     uint8_t* first = nullptr;    // first byte of the region
-    int step = 0;
+    int step = 0;     // the step argument
+    int rowStep = 0;  // where rows really start: step, or step in whole samples (elementsteps)
     PlaneGeometry geometry{};
     bool isSource = false;
     bool isDestination = false;
