@@ -136,13 +136,15 @@ Status floydSteinbergDriver(const Image<typename M::Source, typename M::Dest>& i
     for (int y = 0; y < im.height; ++y) {
       const Src* s = rowAt(im.src, srcStep, y) + c;
       Dst* d = rowAt(im.dst, dstStep, y) + c;
+      float left = C[-1];  // the zero margin
       for (int x = 0; x < w; ++x) {
-        const float e = floydSteinbergError<M::roundedDiffusion>(P, C, x);
+        const float e = floydSteinbergError<M::roundedDiffusion>(P, left, x);
         const float v = working(loadSample(s, std::ptrdiff_t(x) * stride)) + e * 0.0625f;
         float n = 0.0f;
         if constexpr (Noisy) n = tables.values[noiseIndex(tables.randomIndex, x, y)];
         Dst out;
-        C[x] = diffuse<M, Noisy>(v, qv, bottom, n, M::roundedDiffusion, &out);
+        left = diffuse<M, Noisy>(v, qv, bottom, n, M::roundedDiffusion, &out);
+        C[x] = left;
         storeSample(d, std::ptrdiff_t(x) * stride, out);
       }
       std::swap(P, C);
@@ -182,15 +184,19 @@ Status threeRowDriver(const Image<typename M::Source, typename M::Dest>& im, int
     for (int y = 0; y < im.height; ++y) {
       const Src* s = rowAt(im.src, srcStep, y) + c;
       Dst* d = rowAt(im.dst, dstStep, y) + c;
+      float left2 = C[-2], left1 = C[-1];  // the zero margin
       for (int x = 0; x < w; ++x) {
-        const float v = working(loadSample(s, std::ptrdiff_t(x) * stride)) + threeRowError(U2, U1, C, x, k);
+        const float v =
+            working(loadSample(s, std::ptrdiff_t(x) * stride)) + threeRowError(U2, U1, left2, left1, x, k);
         float n = 0.0f;
         if constexpr (Noisy) {
           const int column = x < blocksEnd ? (x & ~3) : x;
           n = tables.values[noiseIndex(tables.randomIndex, column, y)];
         }
         Dst out;
-        C[x] = diffuse<M, Noisy>(v, qv, 0.0f, n, false, &out);
+        left2 = left1;
+        left1 = diffuse<M, Noisy>(v, qv, 0.0f, n, false, &out);
+        C[x] = left1;
         storeSample(d, std::ptrdiff_t(x) * stride, out);
       }
       float* oldU2 = U2;

@@ -153,8 +153,12 @@ inline float working(Src s) {
   else return float(s);
 }
 
-// The level at or below w.
-inline float levelBelow(float w, const QuantValues& qv) { return float(TruncateToInt(w * qv.inv)) * qv.q; }
+// The level at or below w. The truncation stays in the vector registers
+// (the same CVTTPS2DQ result as CVTTSS2SI); diffusion waits on it.
+inline float levelBelow(float w, const QuantValues& qv) {
+  const __m128i i = _mm_cvttps_epi32(_mm_set_ss(w * qv.inv));
+  return _mm_cvtss_f32(_mm_cvtepi32_ps(i)) * qv.q;
+}
 
 // Index into the noise values of pixel x of row y.
 inline int noiseIndex(const int16_t* randomIndex, int x, int y) {
@@ -182,6 +186,13 @@ inline typename M::Dest diffusionStore(float o, bool halfUp) {
   return static_cast<typename M::Dest>(v);
 }
 
+// base + q when a < b, else base, without a branch: the decision is as
+// good as random, and the next pixel waits for it. base + 0.0f is base.
+inline float stepUpIfLess(float a, float b, float base, float q) {
+  const __m128 up = _mm_cmplt_ss(_mm_set_ss(a), _mm_set_ss(b));
+  return _mm_cvtss_f32(_mm_add_ss(_mm_set_ss(base), _mm_and_ps(up, _mm_set_ss(q))));
+}
+
 // The common step of the diffusion kinds. v is the working value with the
 // error added; `threshold` is the noise value, or unused without noise.
 // Returns the error to keep and stores the destination value in *out.
@@ -198,20 +209,20 @@ inline float diffuse(float v, const QuantValues& qv, float bottom, float thresho
     return 0.0f;
   }
   const float base = levelBelow(v, qv);
-  bool up;
-  if constexpr (Noisy) up = threshold < v - base;
-  else up = v - base > qv.q * 0.5f;
-  const float o = up ? base + qv.q : base;
+  // Up when the noise threshold, or else half a step, lies strictly below
+  // v - base.
+  const float o = stepUpIfLess(Noisy ? threshold : qv.q * 0.5f, v - base, base, qv.q);
   *out = diffusionStore<M>(o, halfUp);
   return v - o;
 }
 
-// Floyd-Steinberg error of column x from the previous row P and the current
-// row C, in the member's order of summation.
+// Floyd-Steinberg error of column x from the previous row P and the error
+// `left` just kept at column x - 1 of the current row, in the member's order
+// of summation.
 template <bool LateLeft>
-inline float floydSteinbergError(const float* P, const float* C, int x) {
-  if constexpr (LateLeft) return ((P[x + 1] * 3.0f + P[x] * 5.0f) + P[x - 1]) + C[x - 1] * 7.0f;
-  else return ((P[x + 1] * 3.0f + P[x - 1]) + P[x] * 5.0f) + C[x - 1] * 7.0f;
+inline float floydSteinbergError(const float* P, float left, int x) {
+  if constexpr (LateLeft) return ((P[x + 1] * 3.0f + P[x] * 5.0f) + P[x - 1]) + left * 7.0f;
+  else return ((P[x + 1] * 3.0f + P[x - 1]) + P[x] * 5.0f) + left * 7.0f;
 }
 
 // Weights of the three-row kinds.
@@ -223,11 +234,13 @@ inline ThreeRowWeights threeRowWeights(uint32_t kind) {
                                     : ThreeRowWeights{4.0f, 2.0f, 8.0f, 0.023809524f};
 }
 
-// The weighted error of column x, U2 two rows up, U1 one row up, C current;
-// summed in this grouping for every pixel.
-inline float threeRowError(const float* U2, const float* U1, const float* C, int x, const ThreeRowWeights& k) {
-  const float g = (C[x - 2] * k.a + (U2[x - 2] + U1[x - 2] * k.b)) + (U2[x] * k.a + U1[x] * k.c);
-  const float h = (C[x - 1] * k.c + (U2[x - 1] * k.b + U1[x - 1] * k.a)) + (U2[x + 1] * k.b + U1[x + 1] * k.a);
+// The weighted error of column x, U2 two rows up, U1 one row up, and the
+// current row's errors left2, left1 at columns x - 2, x - 1; summed in this
+// grouping for every pixel.
+inline float threeRowError(const float* U2, const float* U1, float left2, float left1, int x,
+                           const ThreeRowWeights& k) {
+  const float g = (left2 * k.a + (U2[x - 2] + U1[x - 2] * k.b)) + (U2[x] * k.a + U1[x] * k.c);
+  const float h = (left1 * k.c + (U2[x - 1] * k.b + U1[x - 1] * k.a)) + (U2[x + 1] * k.b + U1[x + 1] * k.a);
   return (((g + h) + U2[x + 2]) + U1[x + 2] * k.b) * k.f;
 }
 
