@@ -46,16 +46,29 @@ inline __m128i plainLanes(const typename M::Source* s, const PlainLevels& p) {
   return plainScaled4<typename M::Dest>(nearestLevel4(normalise4(s), p));
 }
 
+// AVX2 blocks of 16 samples below `end`; returns the samples done.
+template <typename M, Pack P>
+ZEL_AVX2 int plainRunAvx2(const typename M::Source* s, typename M::Dest* d, int end, const PlainLevels& p) {
+  using Dst = typename M::Dest;
+  int x = 0;
+  for (; x + 16 <= end; x += 16) {
+    const __m256i a = plainScaled8<Dst>(nearestLevel8(normalise8(s + x), p));
+    const __m256i b = plainScaled8<Dst>(nearestLevel8(normalise8(s + x + 8), p));
+    storePacked16(d + x, pack16<P>(a, b));
+  }
+  return x;
+}
+
 // C1, C3 and C4 rows: one run of count samples. Samples from bodyEnd on
 // take the row's end store; the vector blocks stop at vecEnd.
 template <typename M, LayoutCode L>
-void plainRun(const typename M::Source* s, typename M::Dest* d, int count, const PlainLevels& p) {
+void plainRun(const typename M::Source* s, typename M::Dest* d, int count, const PlainLevels& p, bool avx2) {
   using Src = typename M::Source;
   using Dst = typename M::Dest;
   constexpr Pack P = plainPack<M, L>();
   const int bodyEndAt = bodyEnd(count, plainBlock<Src, Dst>());
   const int vecEnd = M::byteDest ? bodyEndAt : (count & ~3);
-  int x = 0;
+  int x = avx2 ? plainRunAvx2<M, P>(s, d, vecEnd, p) : 0;
   for (; x + 8 <= vecEnd; x += 8)
     storePacked(d + x, pack8<P>(plainLanes<M>(s + x, p), plainLanes<M>(s + x + 4, p)), 8);
   if (x + 4 <= vecEnd) {
@@ -92,11 +105,12 @@ void plainAlphaRow(const typename M::Source* s, typename M::Dest* d, int width, 
 template <typename M, LayoutCode L>
 void plainDriver(const Image<typename M::Source, typename M::Dest>& im, int levels) {
   const PlainLevels p = plainLevels(levels);
+  const bool avx2 = hasAvx2();
   for (int y = 0; y < im.height; ++y) {
     const auto* s = rowAt(im.src, im.srcStep, y);
     auto* d = rowAt(im.dst, im.dstStep, y);
     if constexpr (L == LayoutCode::AC4) plainAlphaRow<M>(s, d, im.width, p);
-    else plainRun<M, L>(s, d, im.width * LayoutOf<L>::channels, p);
+    else plainRun<M, L>(s, d, im.width * LayoutOf<L>::channels, p, avx2);
   }
 }
 
@@ -254,17 +268,44 @@ inline __m128i orderedLanes(const typename M::Source* s, __m128 t, const QuantVa
   return orderedInteger4<M>(orderedLevel4(loadWorking4(s), t, qv));
 }
 
+// AVX2 blocks of 8 pixels of a C1 row below `end`; returns the pixels done.
+template <typename M, bool Noisy>
+ZEL_AVX2 int orderedC1Avx2(const typename M::Source* s, typename M::Dest* d, int end, int y, const QuantValues& qv,
+                           const NoiseTables& tables) {
+  constexpr Pack P = orderedPack<M>();
+  const __m256 matrixRow = _mm256_broadcast_ps(reinterpret_cast<const __m128*>(kOrderedMatrix[y & 3]));
+  const __m256 q = _mm256_set1_ps(qv.q);
+  const __m256 plainThresholds = _mm256_mul_ps(q, matrixRow);
+  int x = 0;
+  for (; x + 16 <= end; x += 16) {
+    __m256 t0 = plainThresholds, t1 = plainThresholds;
+    if constexpr (Noisy) {
+      float n[16];
+      for (int k = 0; k < 16; ++k) n[k] = tables.values[noiseIndex(tables.randomIndex, x + k, y)];
+      t0 = _mm256_mul_ps(_mm256_add_ps(_mm256_loadu_ps(n), matrixRow), q);
+      t1 = _mm256_mul_ps(_mm256_add_ps(_mm256_loadu_ps(n + 8), matrixRow), q);
+    }
+    const __m256i a = orderedInteger8<M>(orderedLevel8(loadWorking8(s + x), t0, qv));
+    const __m256i b = orderedInteger8<M>(orderedLevel8(loadWorking8(s + x + 8), t1, qv));
+    storePacked16(d + x, pack16<P>(a, b));
+  }
+  return x;
+}
+
 // One row: pixels left to right, the channels of a pixel sharing its
-// threshold. Vector blocks of 4 pixels, the rest one by one.
+// threshold. Vector blocks of 4 pixels (C1 with AVX2: 16), the rest one by
+// one.
 template <typename M, LayoutCode L, bool Noisy>
 void orderedRow(const typename M::Source* s, typename M::Dest* d, int width, int y, const QuantValues& qv,
-                const NoiseTables& tables, const OrderedZones& z) {
+                const NoiseTables& tables, const OrderedZones& z, bool avx2) {
   constexpr Pack P = orderedPack<M>();
   const __m128 matrixRow = _mm_load_ps(kOrderedMatrix[y & 3]);
   const __m128 q = _mm_set1_ps(qv.q);
   const __m128 plainThresholds = _mm_mul_ps(q, matrixRow);
   auto noiseAt = [&](int x) { return tables.values[noiseIndex(tables.randomIndex, x, y)]; };
   int x = 0;
+  if constexpr (L == LayoutCode::C1)
+    if (avx2) x = orderedC1Avx2<M, Noisy>(s, d, z.vecEnd, y, qv, tables);
   for (; x < z.vecEnd; x += 4) {
     __m128 t = plainThresholds;
     if constexpr (Noisy)
@@ -316,9 +357,10 @@ Status orderedDriver(const Image<typename M::Source, typename M::Dest>& im, int 
     if (s != StatusOk) return s;
   }
   const OrderedZones z = orderedZones<M, L, Noisy>(im.width);
+  const bool avx2 = hasAvx2();
   const int srcStep = elementStep<Src>(im.srcStep), dstStep = elementStep<Dst>(im.dstStep);
   for (int y = 0; y < im.height; ++y)
-    orderedRow<M, L, Noisy>(rowAt(im.src, srcStep, y), rowAt(im.dst, dstStep, y), im.width, y, qv, tables, z);
+    orderedRow<M, L, Noisy>(rowAt(im.src, srcStep, y), rowAt(im.dst, dstStep, y), im.width, y, qv, tables, z, avx2);
   if constexpr (Noisy) releaseNoiseTables(tables);
   return StatusOk;
 }

@@ -122,4 +122,80 @@ inline void storeThreeOfFour(Dst* d, __m128i v, int pixels) {
   for (int k = 0; k < pixels; ++k) std::memcpy(d + 4 * k, lanes + 4 * k, 3 * sizeof(Dst));
 }
 
+// ---- AVX2: eight samples a vector, the same operations lane by lane ----
+
+template <typename Src>
+ZEL_AVX2 inline __m256 loadWorking8(const Src* p) {
+  if constexpr (std::is_same_v<Src, uint8_t>) return _mm256_cvtepi32_ps(_mm256_cvtepu8_epi32(load64(p)));
+  else if constexpr (std::is_same_v<Src, uint16_t>) return _mm256_cvtepi32_ps(_mm256_cvtepu16_epi32(load128(p)));
+  else if constexpr (std::is_same_v<Src, int16_t>)
+    return _mm256_cvtepi32_ps(_mm256_add_epi32(_mm256_cvtepi16_epi32(load128(p)), _mm256_set1_epi32(32768)));
+  else return _mm256_loadu_ps(p);
+}
+
+template <typename Src>
+ZEL_AVX2 inline __m256 normalise8(const Src* p) {
+  const __m256 w = loadWorking8(p);
+  if constexpr (std::is_same_v<Src, uint8_t>) return _mm256_mul_ps(w, _mm256_set1_ps(0.003921569f));
+  else if constexpr (std::is_same_v<Src, float>) return w;
+  else return _mm256_mul_ps(w, _mm256_set1_ps(1.5259022e-5f));
+}
+
+ZEL_AVX2 inline __m256 nearestLevel8(__m256 t, const PlainLevels& p) {
+  const __m256 inv = _mm256_set1_ps(p.inv);
+  const __m256i i = _mm256_cvttps_epi32(_mm256_mul_ps(t, _mm256_set1_ps(p.span)));
+  const __m256 base = _mm256_mul_ps(inv, _mm256_cvtepi32_ps(i));
+  const __m256 up = _mm256_cmp_ps(_mm256_sub_ps(t, base), _mm256_set1_ps(p.half), _CMP_GT_OQ);
+  return _mm256_blendv_ps(base, _mm256_add_ps(base, inv), up);
+}
+
+template <typename Dst>
+ZEL_AVX2 inline __m256i plainScaled8(__m256 level) {
+  return _mm256_cvttps_epi32(_mm256_mul_ps(level, _mm256_set1_ps(std::is_same_v<Dst, uint8_t> ? 255.0f : 65535.0f)));
+}
+
+ZEL_AVX2 inline __m256 orderedLevel8(__m256 w, __m256 t, const QuantValues& qv) {
+  const __m256 q = _mm256_set1_ps(qv.q);
+  const __m256 base = _mm256_mul_ps(_mm256_cvtepi32_ps(_mm256_cvttps_epi32(_mm256_mul_ps(w, _mm256_set1_ps(qv.inv)))), q);
+  const __m256 up = _mm256_cmp_ps(t, _mm256_sub_ps(w, base), _CMP_LT_OQ);
+  return _mm256_blendv_ps(base, _mm256_add_ps(base, q), up);
+}
+
+template <typename M>
+ZEL_AVX2 inline __m256i orderedInteger8(__m256 o) {
+  __m256i v;
+  if constexpr (M::source == SourceClass::Float)
+    v = _mm256_cvttps_epi32(_mm256_mul_ps(o, _mm256_set1_ps(M::byteDest ? 255.0f : 65535.0f)));
+  else v = _mm256_cvttps_epi32(o);
+  if constexpr (M::narrows) v = _mm256_srai_epi32(v, 8);
+  return v;
+}
+
+// Sixteen results (a then b) packed into 16 bytes or 32 bytes, as pack8.
+template <Pack P>
+ZEL_AVX2 inline __m256i pack16(__m256i a, __m256i b) {
+  const __m256i bias = _mm256_set1_epi32(32768);
+  const __m256i flip = _mm256_set1_epi16(int16_t(0x8000));
+  __m256i w;  // sixteen words, lanes interleaved by the in-lane packs
+  if constexpr (P == Pack::SaturateBytes || P == Pack::ClampedWords || P == Pack::ClampedSigned) {
+    w = P == Pack::SaturateBytes ? _mm256_packs_epi32(a, b) : _mm256_packus_epi32(a, b);
+  } else if constexpr (P == Pack::LowWords) {
+    const __m256i low = _mm256_set1_epi32(0xFFFF);
+    w = _mm256_packus_epi32(_mm256_and_si256(a, low), _mm256_and_si256(b, low));
+  } else {
+    w = _mm256_packs_epi32(_mm256_sub_epi32(a, bias), _mm256_sub_epi32(b, bias));
+  }
+  w = _mm256_permute4x64_epi64(w, _MM_SHUFFLE(3, 1, 2, 0));
+  if constexpr (P == Pack::SaturateBytes)
+    return _mm256_castsi128_si256(_mm_packus_epi16(_mm256_castsi256_si128(w), _mm256_extracti128_si256(w, 1)));
+  else if constexpr (P == Pack::BiasedWords || P == Pack::ClampedSigned) return _mm256_xor_si256(w, flip);
+  else return w;
+}
+
+template <typename Dst>
+ZEL_AVX2 inline void storePacked16(Dst* d, __m256i v) {
+  if constexpr (sizeof(Dst) == 1) store128(d, _mm256_castsi256_si128(v));
+  else store256(d, v);
+}
+
 }  // namespace zel::reduce

@@ -5,6 +5,7 @@
 
 #include "frame/image_layout.h"
 #include "reduce_bits/noise_generator.h"
+#include "reduce_bits/reduce_drivers.h"
 #include "reduce_support.h"
 
 namespace {
@@ -110,6 +111,43 @@ TEST(ReduceBitsLevels, OrderedDitherMatchesItsFormula) {
     orderedAgainstFormula(stem, 0);
     orderedAgainstFormula(stem, 45);
   });
+}
+
+// The SSE blocks alone give what the AVX2 blocks give (the exported calls
+// take AVX2 where the processor has it).
+template <typename Src, typename Dst>
+void vectorWidthsAgree(uint32_t seed) {
+  using M = Member<Src, Dst>;
+  if (!zel::hasAvx2()) GTEST_SKIP() << "no AVX2";
+  TestImage<Src> src(70, 1, 1);
+  src.fillRandom(seed, -0.3, 1.3);
+  NoiseTables tables;
+  ASSERT_EQ(buildNoiseTables(tables, -0.4f, 0.4f), StatusOk);
+  for (int count = 1; count <= 70; ++count) {
+    TestImage<Dst> sse(count, 1, 3), avx(count, 1, 3);
+    const PlainLevels p = plainLevels(5);
+    plainRun<M, LayoutCode::C1>(src.data(), sse.data(), count, p, false);
+    plainRun<M, LayoutCode::C1>(src.data(), avx.data(), count, p, true);
+    ASSERT_TRUE(regionBytes(sse) == regionBytes(avx)) << count;
+    const QuantValues qv = quantValues<Src>(7);
+    const OrderedZones z = orderedZones<M, LayoutCode::C1, true>(count);
+    orderedRow<M, LayoutCode::C1, true>(src.data(), sse.data(), count, 2, qv, tables, z, false);
+    orderedRow<M, LayoutCode::C1, true>(src.data(), avx.data(), count, 2, qv, tables, z, true);
+    ASSERT_TRUE(regionBytes(sse) == regionBytes(avx)) << count;
+    ASSERT_TRUE(sse.guardsIntact() && avx.guardsIntact());
+  }
+  releaseNoiseTables(tables);
+}
+
+TEST(ReduceBitsLevels, VectorWidthsAgree) {
+  vectorWidthsAgree<uint8_t, uint8_t>(1);
+  vectorWidthsAgree<uint16_t, uint16_t>(2);
+  vectorWidthsAgree<int16_t, int16_t>(3);
+  vectorWidthsAgree<uint16_t, uint8_t>(4);
+  vectorWidthsAgree<int16_t, uint8_t>(5);
+  vectorWidthsAgree<float, uint8_t>(6);
+  vectorWidthsAgree<float, uint16_t>(7);
+  vectorWidthsAgree<float, int16_t>(8);
 }
 
 TEST(ReduceBitsLevels, DocumentedLevels) {
