@@ -102,17 +102,4 @@ TEST(NoiseGenerator, StatusesAndIdentities) {
   EXPECT_EQ(NoiseGenFree32f(g32), StatusOk);
 }
 
-TEST(NoiseGenerator, TablesGiveBackWhatTheyGotOnFailure) {
-  // Values, indices, then the two records: any of them missing fails the
-  // build with nothing left allocated.
-  for (int budget = 0; budget < 4; ++budget) {
-    NoiseTables t;
-    zelTestFailMallocAfter(budget);
-    const Status s = buildNoiseTables(t, 0.0f, 1.0f);
-    zelTestFailMallocAfter(-1);
-    EXPECT_EQ(s, StatusOutOfMemoryError) << budget;
-    EXPECT_TRUE(!t.values && !t.randomIndex && !t.indexGen && !t.valueGen) << budget;
-  }
-}
-
 }  // namespace

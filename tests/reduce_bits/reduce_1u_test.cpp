@@ -7,8 +7,8 @@
 #include <vector>
 
 #include "core/zelcore.h"
-#include "reduce_bits/reduce_bits_1u.h"
 #include "support/test_image.h"
+#include "zelcc/zelcc.h"
 
 namespace {
 
@@ -84,9 +84,9 @@ TEST(ReduceBitsTo1u, ThresholdAtEveryOffsetAndWidth) {
 
 TEST(ReduceBitsTo1u, StuckiMatchesTheModel) {
   // A 13 by 4 pattern; the bit rows of an independent model at two
-  // thresholds. The low 3 bits of each row's second byte stay.
+  // thresholds, packed at three offsets.
   const int width = 13, height = 4;
-  TestImage<uint8_t> src(width, height, 1), dst(2, height, 2);
+  TestImage<uint8_t> src(width, height, 1), dst(3, height, 2);
   for (int y = 0; y < height; ++y)
     for (int x = 0; x < width; ++x) src.set(x, y, uint8_t((x * 37 + y * 101 + 11) % 256));
   struct Case {
@@ -94,50 +94,26 @@ TEST(ReduceBitsTo1u, StuckiMatchesTheModel) {
     const char* rows[4];
   };
   for (const Case& c : {Case{128, {"0001111000111", "0111000011100", "1100011110001", "0011110001111"}},
-                        Case{0, {"1111111011111", "1111001111100", "1100011110011", "0011110000111"}}}) {
-    dst.fill(0x05);
-    ASSERT_EQ(reduce1u(src, dst, width, height, 0, 3, c.threshold), StatusOk);
-    for (int y = 0; y < height; ++y) {
-      const std::string bits = std::string(c.rows[y]) + "101";  // the kept low bits of 0x05
-      EXPECT_EQ(dst.get(0, y), uint8_t(std::stoi(bits.substr(0, 8), nullptr, 2))) << int(c.threshold) << " " << y;
-      EXPECT_EQ(dst.get(1, y), uint8_t(std::stoi(bits.substr(8, 8), nullptr, 2))) << int(c.threshold) << " " << y;
+                        Case{0, {"1111111011111", "1111001111100", "1100011110011", "0011110000111"}}})
+    for (int bitOffset : {0, 3, 7}) {
+      dst.fill(0xA5);
+      ASSERT_EQ(reduce1u(src, dst, width, height, bitOffset, 3, c.threshold), StatusOk);
+      const uint8_t filler[3] = {0xA5, 0xA5, 0xA5};
+      for (int y = 0; y < height; ++y) {
+        std::vector<int> bits;
+        for (const char* b = c.rows[y]; *b; ++b) bits.push_back(*b - '0');
+        const auto expected = expectedRow(bits, bitOffset, filler);
+        EXPECT_EQ(std::vector<uint8_t>(dst.row(y), dst.row(y) + expected.size()), expected)
+            << int(c.threshold) << " offset " << bitOffset << " row " << y;
+      }
     }
-  }
   EXPECT_TRUE(dst.guardsIntact());
 }
 
-TEST(ReduceBitsTo1u, StuckiPacksLikeTheThreshold) {
-  // The diffusion's bits go through the same packing at every offset: the
-  // bytes beside the row behave as with the threshold kind.
-  for (int width : {1, 5, 8, 9, 21}) {
-    TestImage<uint8_t> src(width, 2), a(3 + width / 8, 2), b(3 + width / 8, 2);
-    src.fillRandom(uint32_t(width));
-    for (int bitOffset : {0, 3, 7}) {
-      a.fill(0xA5);
-      ASSERT_EQ(reduce1u(src, a, width, 2, 0, 3, 90), StatusOk);
-      std::vector<int> bits0, bits1;
-      for (int x = 0; x < width; ++x) {
-        bits0.push_back((a.get(x / 8, 0) >> (7 - x % 8)) & 1);
-        bits1.push_back((a.get(x / 8, 1) >> (7 - x % 8)) & 1);
-      }
-      b.fill(0xA5);
-      ASSERT_EQ(reduce1u(src, b, width, 2, bitOffset, 3, 90), StatusOk);
-      std::vector<uint8_t> filler(b.rowSamples(), 0xA5);
-      const auto row0 = expectedRow(bits0, bitOffset, filler.data());
-      const auto row1 = expectedRow(bits1, bitOffset, filler.data());
-      EXPECT_EQ(std::vector<uint8_t>(b.row(0), b.row(0) + row0.size()), row0) << width << " " << bitOffset;
-      EXPECT_EQ(std::vector<uint8_t>(b.row(1), b.row(1) + row1.size()), row1) << width << " " << bitOffset;
-    }
-  }
-}
-
-TEST(ReduceBitsTo1u, KindsAndMemory) {
+TEST(ReduceBitsTo1u, MemoryOfTheDiffusion) {
   TestImage<uint8_t> src(9, 2), dst(2, 2);
   src.fillRandom(5);
   dst.fill(0x3C);
-  EXPECT_EQ(reduce1u(src, dst, 9, 2, 0, 1, 50), StatusDitherKindError);
-  EXPECT_EQ(reduce1u(src, dst, 9, 2, 0, 4, 50), StatusDitherKindError);
-  EXPECT_EQ(reduce1u(src, dst, 9, 2, -1, 7, 50), StatusSizeError);
   zelTestFailMallocAfter(0);
   const Status stucki = reduce1u(src, dst, 9, 2, 0, 3, 50);
   zelTestFailMallocAfter(-1);
@@ -146,26 +122,6 @@ TEST(ReduceBitsTo1u, KindsAndMemory) {
   zelTestFailMallocAfter(0);
   EXPECT_EQ(reduce1u(src, dst, 9, 2, 0, 0, 50), StatusOk);  // the threshold needs no memory
   zelTestFailMallocAfter(-1);
-}
-
-TEST(ReduceBitsTo1u, WholeBytesMatchTheirBits) {
-  // The vector body alone: every byte count, misaligned sources, all
-  // thresholds on random data.
-  std::vector<uint8_t> src(8 * 40 + 16), out(48);
-  for (size_t i = 0; i < src.size(); ++i) src[i] = uint8_t((i * 2654435761u) >> 13);
-  for (int count = 1; count <= 40; ++count)
-    for (int shift : {0, 1, 5})
-      for (int threshold = 0; threshold < 256; threshold += 17) {
-        std::fill(out.begin(), out.end(), 0xEE);
-        ASSERT_EQ(zel::reduce::thresholdBytes(src.data() + shift, out.data(), count, uint8_t(threshold)), count);
-        for (int i = 0; i < count; ++i) {
-          uint8_t expected = 0;
-          for (int k = 0; k < 8; ++k)
-            if (src[shift + 8 * i + k] > threshold) expected = uint8_t(expected | (0x80 >> k));
-          ASSERT_EQ(out[i], expected) << count << " " << shift << " " << threshold;
-        }
-        ASSERT_EQ(out[count], 0xEE);
-      }
 }
 
 }  // namespace

@@ -84,6 +84,8 @@ std::vector<uint8_t> regionBytes(const TestImage<T>& img) {
 // destination preset to `fill`.
 template <typename Src, typename Dst>
 struct ReduceCall {
+  using Source = Src;
+  using Dest = Dst;
   LayoutCode layout;
   int width, height;
   TestImage<Src> src;
