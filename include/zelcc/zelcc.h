@@ -350,6 +350,86 @@ ZELCC_API Status zeliColorToGray_8u_C3C1R(const uint8_t* src, int srcStep, uint8
                                           const float coeffs[3]);
 
 /* ---- Bit-depth reduction ---- */
+/* Samples reduced to `levels` equally spaced values of the destination's
+ * range. `noise` is a percentage 0..100, `ditherKind` a ReduceDitherKind;
+ * an unknown kind does nothing and succeeds. */
+typedef enum ReduceDitherKind {
+  ReduceDitherOff = 0,
+  ReduceDitherFloydSteinberg = 1,
+  ReduceDitherJarvisJudiceNinke = 2,
+  ReduceDitherStucki = 3,
+  ReduceDitherOrdered4x4 = 4
+} ReduceDitherKind;
+ZELCC_API Status zeliReduceBits_8u_C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                       ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                       ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_8u_C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                       ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                        ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16u_C1R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                        ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                        ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16u_C4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                        ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                         ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16s_C1R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                        ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                        ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16s_C4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                        ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                         ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16u8u_C1R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16u8u_C3R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16u8u_C4R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16u8u_AC4R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16s8u_C1R(const int16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16s8u_C3R(const int16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16s8u_C4R(const int16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16s8u_AC4R(const int16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f8u_C1R(const float* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f8u_C3R(const float* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f8u_C4R(const float* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f8u_AC4R(const float* src, int srcStep, uint8_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f16u_C1R(const float* src, int srcStep, uint16_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f16u_C3R(const float* src, int srcStep, uint16_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f16u_C4R(const float* src, int srcStep, uint16_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f16u_AC4R(const float* src, int srcStep, uint16_t* dst, int dstStep,
+                                            ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f16s_C1R(const float* src, int srcStep, int16_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f16s_C3R(const float* src, int srcStep, int16_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f16s_C4R(const float* src, int srcStep, int16_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f16s_AC4R(const float* src, int srcStep, int16_t* dst, int dstStep,
+                                            ImageSize size, int noise, int ditherKind, int levels);
+/* One bit a pixel, first pixel in the highest bit of its byte, from bit
+ * dstBitOffset & 7 of dst; ditherKind 0 (threshold) or 3 (Stucki). */
+ZELCC_API Status zeliReduceBits_8u1u_C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                         int dstBitOffset, ImageSize size, int reserved1, int reserved2,
+                                         int ditherKind, uint8_t threshold);
+
 
 /* ---- Bayer demosaicing ---- */
 

@@ -169,6 +169,7 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
   std::istringstream in(extras);
   std::string word;
   std::vector<std::string> order;  // custom order words, if given
+  std::vector<std::string> presize;  // family arguments that precede size
   while (in >> word) {
     if (word == "alpha") {
       // The destination's fourth channel value, in its sample type.
@@ -202,6 +203,9 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
         e.bad.push_back({std::atof(f[k].substr(0, eq).c_str()), static_cast<Status>(std::atoi(f[k].c_str() + eq + 1))});
       }
       d.extras.push_back(e);
+    } else if (word.rfind("presize=", 0) == 0) {
+      // presize=NAME: the family argument NAME stands before size.
+      presize.push_back(word.substr(8));
     } else if (word.rfind("min=", 0) == 0) {
       if (std::sscanf(word.c_str() + 4, "%dx%d", &d.minWidth, &d.minHeight) != 2) {
         error = "bad min= in extras of " + d.name;
@@ -237,6 +241,14 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       error = "unknown extra '" + word + "' of " + d.name;
       return false;
     }
+  }
+  for (const std::string& name : presize) {
+    auto it = std::find_if(d.extras.begin(), d.extras.end(), [&](const Extra& e) { return e.name == name; });
+    if (it == d.extras.end()) {
+      error = "presize names unknown argument '" + name + "' in " + d.name;
+      return false;
+    }
+    it->beforeSize = true;
   }
   // Check order: pointers (top level, then plane entries), size, steps,
   // family values, unless the family names its own.
@@ -365,8 +377,11 @@ bool describe(const std::string& name, const std::string& extras, Descriptor& d,
     addSideSlots(d, d.src, Role::SrcPtr, Role::SrcPlanes, Role::SrcStep, Role::SrcSteps);
     addSideSlots(d, d.dst, Role::DstPtr, Role::DstPlanes, Role::DstStep, Role::DstSteps);
   }
+  for (int i = 0; i < int(d.extras.size()); ++i)
+    if (d.extras[i].beforeSize) d.slots.push_back({Role::Extra, 0, i});
   d.slots.push_back({Role::Size});
-  for (int i = 0; i < int(d.extras.size()); ++i) d.slots.push_back({Role::Extra, 0, i});
+  for (int i = 0; i < int(d.extras.size()); ++i)
+    if (!d.extras[i].beforeSize) d.slots.push_back({Role::Extra, 0, i});
   return true;
 }
 

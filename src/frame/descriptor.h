@@ -56,6 +56,7 @@ struct Extra {
   std::vector<BadValue> bad;
   int stage = -1;  // where its check stands in the order (index into Descriptor::order)
   bool optional = false;  // a pointer whose null is valid (it selects a default)
+  bool beforeSize = false;  // stands before `size` in the prototype
 };
 
 // Steps of the argument checks, in the order a member runs them.
