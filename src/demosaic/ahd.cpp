@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstddef>
 
+#include "demosaic/ahd_kernels.h"
 #include "frame/export.h"
 
 namespace zel {
@@ -54,6 +55,9 @@ inline int reflectInto(int c, int last) {
 //   green, per direction, 4 rows: tile columns -3 .. width + 2
 //   red and blue, per direction, 3 rows each: -2 .. width + 1
 //   homogeneity differences, 3 rows: -1 .. width
+// Reads of the mosaic outside the frame are reflected: near the frame's
+// left and right edges the samples are gathered into a short reflected row
+// first, elsewhere the kernels read the frame directly.
 template <typename T>
 class AhdRows {
  public:
@@ -65,138 +69,139 @@ class AhdRows {
     for (int y = t_.y; y < t_.y + t_.height; ++y) {
       for (; homNext <= y + 1; ++homNext) {
         for (; colourNext <= homNext + 1; ++colourNext) {
-          for (; greenNext <= colourNext + 1; ++greenNext) {
-            greenRowH(greenNext);
-            greenRowV(greenNext);
-          }
-          colourRow(kH, colourNext);
-          colourRow(kV, colourNext);
+          for (; greenNext <= colourNext + 1; ++greenNext) greenRows(greenNext);
+          colourRows(kH, colourNext);
+          colourRows(kV, colourNext);
         }
-        homogeneityRow(homNext);
+        homogeneityRows(homNext);
       }
       outputRow(y, rowAt(dst, dstStep, y - originY) + 3 * (t_.x - originX));
     }
   }
 
  private:
-  static constexpr int kTop = sizeof(T) == 1 ? 255 : 65535;
   static constexpr int kH = 0, kV = 1;
+  static constexpr int kPiece = 16;  // columns gathered at a time near an edge
+  static constexpr int kChunk = 64;  // columns of luma-chroma and sums kept at a time
 
   static int ring(int y, int n) {
     const int m = y % n;
     return m < 0 ? m + n : m;
   }
   T* scratch(int k) const { return reinterpret_cast<T*>(tmp_ + std::ptrdiff_t(k) * tmpStep_); }
-  T* green(int d, int y) const { return scratch(d * 4 + ring(y, 4)); }
-  T* red(int d, int y) const { return scratch(8 + d * 3 + ring(y, 3)); }
-  T* blue(int d, int y) const { return scratch(14 + d * 3 + ring(y, 3)); }
-  T* homDiff(int y) const { return scratch(20 + ring(y, 3)); }
-
-  int get(const T* row, int c) const { return loadSample(row + (c - origin_)); }
-  void put(T* row, int c, int v) const { storeSample(row + (c - origin_), T(v)); }
-  int getSigned(const T* row, int c) const {
-    return sizeof(T) == 1 ? int(int8_t(get(row, c))) : int(int16_t(get(row, c)));
-  }
+  // Plane rows, addressed by frame column.
+  T* green(int d, int y) const { return scratch(d * 4 + ring(y, 4)) - origin_; }
+  T* red(int d, int y) const { return scratch(8 + d * 3 + ring(y, 3)) - origin_; }
+  T* blue(int d, int y) const { return scratch(14 + d * 3 + ring(y, 3)) - origin_; }
+  T* homDiff(int y) const { return scratch(20 + ring(y, 3)) - origin_; }
 
   const T* sourceRow(int y) const { return f_.row(reflectInto(y, f_.height - 1)); }
-  int sample(const T* row, int c) const { return loadSample(row + reflectInto(c, f_.width - 1)); }
-  int colour(int c, int y) const { return cfaColour(grid_, c, y); }
+  bool greenAt(int c, int y) const { return cfaColour(grid_, c, y) == kGreen; }
+  bool redRow(int y) const {
+    const int c = cfaColour(grid_, 0, y);
+    return (c == kGreen ? cfaColour(grid_, 1, y) : c) == kRed;
+  }
 
-  void greenRowH(int y) {
-    T* out = green(kH, y);
+  // Columns [lo, hi) of a kernel whose taps reach `reach` samples to either
+  // side: directly where the taps stay in the frame, else gathered.
+  template <typename Direct, typename Gathered>
+  void walkColumns(int lo, int hi, int reach, Direct direct, Gathered gathered) const {
+    const int a = std::min(std::max(lo, reach), hi);
+    const int b = std::min(std::max(f_.width - reach, a), hi);
+    for (int c = lo; c < a; c += kPiece) gathered(c, std::min(a, c + kPiece));
+    if (b > a) direct(a, b);
+    for (int c = b; c < hi; c += kPiece) gathered(c, std::min(hi, c + kPiece));
+  }
+  // Samples of columns from-reach .. to+reach-1 of a row, reflected.
+  void gather(const T* row, int from, int to, int reach, T* out) const {
+    for (int c = from - reach; c < to + reach; ++c) out[c - from + reach] = loadSample(row + reflectInto(c, f_.width - 1));
+  }
+
+  void greenRows(int y) {
+    const int lo = t_.x - 3, hi = t_.x + t_.width + 3;
     const T* s = sourceRow(y);
-    for (int c = t_.x - 3; c < t_.x + t_.width + 3; ++c) {
-      const int centre = sample(s, c);
-      put(out, c,
-          colour(c, y) == kGreen
-              ? centre
-              : greenAlong(centre, sample(s, c - 2), sample(s, c + 2), sample(s, c - 1), sample(s, c + 1)));
-    }
+    auto along = [&](const T* p, int a, int b) {
+      greenRow(GreenTaps<T>{p, p - 2, p + 2, p - 1, p + 1}, b - a, greenAt(a, y), green(kH, y) + a);
+    };
+    walkColumns(lo, hi, 2, [&](int a, int b) { along(s + a, a, b); },
+                [&](int a, int b) {
+                  T row[kPiece + 4];
+                  gather(s, a, b, 2, row);
+                  along(row + 2, a, b);
+                });
+    const T* rows[5] = {sourceRow(y - 2), sourceRow(y - 1), s, sourceRow(y + 1), sourceRow(y + 2)};
+    auto across = [&](const T* const p[5], int a, int b) {
+      greenRow(GreenTaps<T>{p[2], p[0], p[4], p[1], p[3]}, b - a, greenAt(a, y), green(kV, y) + a);
+    };
+    walkColumns(lo, hi, 0,
+                [&](int a, int b) {
+                  const T* p[5] = {rows[0] + a, rows[1] + a, rows[2] + a, rows[3] + a, rows[4] + a};
+                  across(p, a, b);
+                },
+                [&](int a, int b) {
+                  T buffer[5][kPiece];
+                  const T* p[5];
+                  for (int k = 0; k < 5; ++k) gather(rows[k], a, b, 0, buffer[k]), p[k] = buffer[k];
+                  across(p, a, b);
+                });
   }
 
-  void greenRowV(int y) {
-    T* out = green(kV, y);
-    const T *up2 = sourceRow(y - 2), *up = sourceRow(y - 1), *s = sourceRow(y), *down = sourceRow(y + 1),
-            *down2 = sourceRow(y + 2);
-    for (int c = t_.x - 3; c < t_.x + t_.width + 3; ++c) {
-      const int centre = sample(s, c);
-      put(out, c,
-          colour(c, y) == kGreen
-              ? centre
-              : greenAlong(centre, sample(up2, c), sample(down2, c), sample(up, c), sample(down, c)));
-    }
+  void colourRows(int d, int y) {
+    const T* rows[3] = {sourceRow(y - 1), sourceRow(y), sourceRow(y + 1)};
+    auto run = [&](const T* const p[3], int a, int b) {
+      const ColourTaps<T> taps{green(d, y - 1) + a, green(d, y) + a, green(d, y + 1) + a, p[0], p[1], p[2]};
+      colourRow(taps, b - a, greenAt(a, y), redRow(y), red(d, y) + a, blue(d, y) + a);
+    };
+    walkColumns(t_.x - 2, t_.x + t_.width + 2, 1,
+                [&](int a, int b) {
+                  const T* p[3] = {rows[0] + a, rows[1] + a, rows[2] + a};
+                  run(p, a, b);
+                },
+                [&](int a, int b) {
+                  T buffer[3][kPiece + 2];
+                  const T* p[3];
+                  for (int k = 0; k < 3; ++k) gather(rows[k], a, b, 1, buffer[k]), p[k] = buffer[k] + 1;
+                  run(p, a, b);
+                });
   }
 
-  void colourRow(int d, int y) {
-    const T *gUp = green(d, y - 1), *g = green(d, y), *gDown = green(d, y + 1);
-    const T *sUp = sourceRow(y - 1), *s = sourceRow(y), *sDown = sourceRow(y + 1);
-    T *outR = red(d, y), *outB = blue(d, y);
-    for (int c = t_.x - 2; c < t_.x + t_.width + 2; ++c) {
-      const int own = colour(c, y), g0 = get(g, c);
-      int r, b;
-      if (own == kGreen) {
-        const int alongRow = colourFromPair(g0, sample(s, c - 1) + sample(s, c + 1), get(g, c - 1) + get(g, c + 1), kTop);
-        const int alongColumn = colourFromPair(g0, sample(sUp, c) + sample(sDown, c), get(gUp, c) + get(gDown, c), kTop);
-        const bool redRow = colour(c + 1, y) == kRed;
-        r = redRow ? alongRow : alongColumn;
-        b = redRow ? alongColumn : alongRow;
-      } else {
-        const int other = colourFromDiagonals(
-            g0, sample(sUp, c - 1) + sample(sUp, c + 1) + sample(sDown, c - 1) + sample(sDown, c + 1),
-            get(gUp, c - 1) + get(gUp, c + 1) + get(gDown, c - 1) + get(gDown, c + 1), kTop);
-        r = own == kRed ? sample(s, c) : other;
-        b = own == kRed ? other : sample(s, c);
-      }
-      put(outR, c, r);
-      put(outB, c, b);
-    }
-  }
-
-  LumaChroma lumaAt(int d, int c, int y) const {
-    return lumaChroma(get(red(d, y), c), get(green(d, y), c), get(blue(d, y), c));
-  }
-
-  // Each luma-chroma value of row y is made once, in a window of three
-  // columns that slides along the row.
-  void homogeneityRow(int y) {
-    T* out = homDiff(y);
-    Neighbourhood n[2];
-    for (int d = 0; d < 2; ++d) {
-      n[d].left = lumaAt(d, t_.x - 2, y);
-      n[d].centre = lumaAt(d, t_.x - 1, y);
-    }
-    for (int c = t_.x - 1; c < t_.x + t_.width + 1; ++c) {
-      for (int d = 0; d < 2; ++d) {
-        n[d].right = lumaAt(d, c + 1, y);
-        n[d].up = lumaAt(d, c, y - 1);
-        n[d].down = lumaAt(d, c, y + 1);
-      }
-      put(out, c, homogeneityDifference(n[kH], n[kV]));
-      for (int d = 0; d < 2; ++d) {
-        n[d].left = n[d].centre;
-        n[d].centre = n[d].right;
-      }
+  // Luma-chroma of rows y - 1 .. y + 1 for a chunk of columns and one more
+  // on either side, then the homogeneity differences of the chunk.
+  void homogeneityRows(int y) {
+    int32_t values[2][3][3][kChunk + 2];
+    for (int a = t_.x - 1; a < t_.x + t_.width + 1; a += kChunk) {
+      const int n = std::min(kChunk, t_.x + t_.width + 1 - a);
+      LumaChromaView views[2][3];
+      for (int d = 0; d < 2; ++d)
+        for (int k = 0; k < 3; ++k) {
+          int32_t(&v)[3][kChunk + 2] = values[d][k];
+          const int row = y - 1 + k;
+          lumaChromaRow(red(d, row) + a - 1, green(d, row) + a - 1, blue(d, row) + a - 1, n + 2,
+                        LumaChromaRow{v[0], v[1], v[2]});
+          views[d][k] = LumaChromaView{v[0] + 1, v[1] + 1, v[2] + 1};
+        }
+      homogeneityRow(views[kH], views[kV], n, homDiff(y) + a);
     }
   }
 
   // The running choice starts with H at each row of the tile; a non-zero
   // window sum decides, a zero sum repeats the last decision.
   void outputRow(int y, T* out) {
-    const T *up = homDiff(y - 1), *mid = homDiff(y), *down = homDiff(y + 1);
-    auto columnSum = [&](int c) { return getSigned(up, c) + getSigned(mid, c) + getSigned(down, c); };
-    int before = columnSum(t_.x - 1), here = columnSum(t_.x);
+    int32_t sums[kChunk];
+    uint8_t takeV[kChunk];
     int t = 1;
-    for (int c = t_.x; c < t_.x + t_.width; ++c) {
-      const int after = columnSum(c + 1);
-      const int sum = before + here + after;
-      if (sum != 0) t = sum;
-      const int d = t < 0 ? kV : kH;
-      T* px = out + 3 * (c - t_.x);
-      storeSample(px, T(get(red(d, y), c)));
-      storeSample(px + 1, T(get(green(d, y), c)));
-      storeSample(px + 2, T(get(blue(d, y), c)));
-      before = here;
-      here = after;
+    const T* h[3] = {red(kH, y), green(kH, y), blue(kH, y)};
+    const T* v[3] = {red(kV, y), green(kV, y), blue(kV, y)};
+    for (int a = t_.x; a < t_.x + t_.width; a += kChunk) {
+      const int n = std::min(kChunk, t_.x + t_.width - a);
+      windowSumRow(homDiff(y - 1) + a, homDiff(y) + a, homDiff(y + 1) + a, n, sums);
+      for (int i = 0; i < n; ++i) {
+        if (sums[i] != 0) t = sums[i];
+        takeV[i] = t < 0 ? 0xFF : 0;
+      }
+      const T* hc[3] = {h[0] + a, h[1] + a, h[2] + a};
+      const T* vc[3] = {v[0] + a, v[1] + a, v[2] + a};
+      chooseRow(hc, vc, takeV, n, out + 3 * (a - t_.x));
     }
   }
 
