@@ -62,7 +62,7 @@ template <typename T>
 class AhdRows {
  public:
   AhdRows(const CfaFrame<T>& f, int grid, const AhdTile& t, uint8_t* tmp, int tmpStep)
-      : f_(f), grid_(grid), t_(t), origin_(t.x - 3), tmp_(tmp), tmpStep_(tmpStep) {}
+      : f_(f), grid_(grid), t_(t), origin_(t.x - 3), tmp_(tmp), tmpStep_(tmpStep), level_(bestVectorLevel()) {}
 
   void run(T* dst, int dstStep, int originX, int originY) {
     int greenNext = t_.y - 3, colourNext = t_.y - 2, homNext = t_.y - 1;
@@ -121,7 +121,7 @@ class AhdRows {
     const int lo = t_.x - 3, hi = t_.x + t_.width + 3;
     const T* s = sourceRow(y);
     auto along = [&](const T* p, int a, int b) {
-      greenRow(GreenTaps<T>{p, p - 2, p + 2, p - 1, p + 1}, b - a, greenAt(a, y), green(kH, y) + a);
+      greenRow(GreenTaps<T>{p, p - 2, p + 2, p - 1, p + 1}, b - a, greenAt(a, y), green(kH, y) + a, level_);
     };
     walkColumns(lo, hi, 2, [&](int a, int b) { along(s + a, a, b); },
                 [&](int a, int b) {
@@ -131,7 +131,7 @@ class AhdRows {
                 });
     const T* rows[5] = {sourceRow(y - 2), sourceRow(y - 1), s, sourceRow(y + 1), sourceRow(y + 2)};
     auto across = [&](const T* const p[5], int a, int b) {
-      greenRow(GreenTaps<T>{p[2], p[0], p[4], p[1], p[3]}, b - a, greenAt(a, y), green(kV, y) + a);
+      greenRow(GreenTaps<T>{p[2], p[0], p[4], p[1], p[3]}, b - a, greenAt(a, y), green(kV, y) + a, level_);
     };
     walkColumns(lo, hi, 0,
                 [&](int a, int b) {
@@ -150,7 +150,7 @@ class AhdRows {
     const T* rows[3] = {sourceRow(y - 1), sourceRow(y), sourceRow(y + 1)};
     auto run = [&](const T* const p[3], int a, int b) {
       const ColourTaps<T> taps{green(d, y - 1) + a, green(d, y) + a, green(d, y + 1) + a, p[0], p[1], p[2]};
-      colourRow(taps, b - a, greenAt(a, y), redRow(y), red(d, y) + a, blue(d, y) + a);
+      colourRow(taps, b - a, greenAt(a, y), redRow(y), red(d, y) + a, blue(d, y) + a, level_);
     };
     walkColumns(t_.x - 2, t_.x + t_.width + 2, 1,
                 [&](int a, int b) {
@@ -177,10 +177,10 @@ class AhdRows {
           int32_t(&v)[3][kChunk + 2] = values[d][k];
           const int row = y - 1 + k;
           lumaChromaRow(red(d, row) + a - 1, green(d, row) + a - 1, blue(d, row) + a - 1, n + 2,
-                        LumaChromaRow{v[0], v[1], v[2]});
+                        LumaChromaRow{v[0], v[1], v[2]}, level_);
           views[d][k] = LumaChromaView{v[0] + 1, v[1] + 1, v[2] + 1};
         }
-      homogeneityRow(views[kH], views[kV], n, homDiff(y) + a);
+      homogeneityRow(views[kH], views[kV], n, homDiff(y) + a, level_);
     }
   }
 
@@ -194,14 +194,14 @@ class AhdRows {
     const T* v[3] = {red(kV, y), green(kV, y), blue(kV, y)};
     for (int a = t_.x; a < t_.x + t_.width; a += kChunk) {
       const int n = std::min(kChunk, t_.x + t_.width - a);
-      windowSumRow(homDiff(y - 1) + a, homDiff(y) + a, homDiff(y + 1) + a, n, sums);
+      windowSumRow(homDiff(y - 1) + a, homDiff(y) + a, homDiff(y + 1) + a, n, sums, level_);
       for (int i = 0; i < n; ++i) {
         if (sums[i] != 0) t = sums[i];
         takeV[i] = t < 0 ? 0xFF : 0;
       }
       const T* hc[3] = {h[0] + a, h[1] + a, h[2] + a};
       const T* vc[3] = {v[0] + a, v[1] + a, v[2] + a};
-      chooseRow(hc, vc, takeV, n, out + 3 * (a - t_.x));
+      chooseRow(hc, vc, takeV, n, out + 3 * (a - t_.x), level_);
     }
   }
 
@@ -211,6 +211,7 @@ class AhdRows {
   int origin_;
   uint8_t* tmp_;
   int tmpStep_;
+  VectorLevel level_;
 };
 
 }  // namespace

@@ -116,18 +116,25 @@ void chooseRowScalar(const T* const h[3], const T* const v[3], const uint8_t* ta
     for (int k = 0; k < 3; ++k) storeSample(dst + 3 * i + k, loadSample((takeV[i] ? v[k] : h[k]) + i));
 }
 
-// Vector blocks first, the scalar form for what is left; the same values.
+// The widest vector form in use: chosen once per call from the processor;
+// every level gives the same values.
+enum class VectorLevel { Scalar, Sse41, Avx2 };
+VectorLevel bestVectorLevel();
+
+// Vector blocks of the chosen level first (AVX2 blocks of 8 pixels, then
+// SSE4.1 blocks of 4), the scalar form for what is left.
 template <typename T>
-void greenRow(const GreenTaps<T>& t, int count, bool firstGreen, T* out);
+void greenRow(const GreenTaps<T>& t, int count, bool firstGreen, T* out, VectorLevel level);
 template <typename T>
-void colourRow(const ColourTaps<T>& t, int count, bool firstGreen, bool redRow, T* outR, T* outB);
+void colourRow(const ColourTaps<T>& t, int count, bool firstGreen, bool redRow, T* outR, T* outB, VectorLevel level);
 template <typename T>
-void lumaChromaRow(const T* r, const T* g, const T* b, int count, const LumaChromaRow& out);
+void lumaChromaRow(const T* r, const T* g, const T* b, int count, const LumaChromaRow& out, VectorLevel level);
 template <typename T>
-void homogeneityRow(const LumaChromaView h[3], const LumaChromaView v[3], int count, T* out);
+void homogeneityRow(const LumaChromaView h[3], const LumaChromaView v[3], int count, T* out, VectorLevel level);
 template <typename T>
-void windowSumRow(const T* up, const T* mid, const T* down, int count, int32_t* sums);
+void windowSumRow(const T* up, const T* mid, const T* down, int count, int32_t* sums, VectorLevel level);
+// SSE4.1 blocks of 16 bytes of each channel.
 template <typename T>
-void chooseRow(const T* const h[3], const T* const v[3], const uint8_t* takeV, int count, T* dst);
+void chooseRow(const T* const h[3], const T* const v[3], const uint8_t* takeV, int count, T* dst, VectorLevel level);
 
 }  // namespace zel
