@@ -44,9 +44,12 @@ namespace {
 // the widest taps reach one further than a single one can bring back.
 inline int reflectInto(int c, int last) {
   for (;;) {
-    if (c < 0) c = -c;
-    else if (c > last) c = 2 * last - c;
-    else return c;
+    if (c < 0)
+      c = -c;
+    else if (c > last)
+      c = 2 * last - c;
+    else
+      return c;
   }
 }
 
@@ -114,7 +117,8 @@ class AhdRows {
   }
   // Samples of columns from-reach .. to+reach-1 of a row, reflected.
   void gather(const T* row, int from, int to, int reach, T* out) const {
-    for (int c = from - reach; c < to + reach; ++c) out[c - from + reach] = loadSample(row + reflectInto(c, f_.width - 1));
+    for (int c = from - reach; c < to + reach; ++c)
+      out[c - from + reach] = loadSample(row + reflectInto(c, f_.width - 1));
   }
 
   void greenRows(int y) {
@@ -123,27 +127,29 @@ class AhdRows {
     auto along = [&](const T* p, int a, int b) {
       greenRow(GreenTaps<T>{p, p - 2, p + 2, p - 1, p + 1}, b - a, greenAt(a, y), green(kH, y) + a, level_);
     };
-    walkColumns(lo, hi, 2, [&](int a, int b) { along(s + a, a, b); },
-                [&](int a, int b) {
-                  T row[kPiece + 4];
-                  gather(s, a, b, 2, row);
-                  along(row + 2, a, b);
-                });
+    walkColumns(
+        lo, hi, 2, [&](int a, int b) { along(s + a, a, b); },
+        [&](int a, int b) {
+          T row[kPiece + 4];
+          gather(s, a, b, 2, row);
+          along(row + 2, a, b);
+        });
     const T* rows[5] = {sourceRow(y - 2), sourceRow(y - 1), s, sourceRow(y + 1), sourceRow(y + 2)};
     auto across = [&](const T* const p[5], int a, int b) {
       greenRow(GreenTaps<T>{p[2], p[0], p[4], p[1], p[3]}, b - a, greenAt(a, y), green(kV, y) + a, level_);
     };
-    walkColumns(lo, hi, 0,
-                [&](int a, int b) {
-                  const T* p[5] = {rows[0] + a, rows[1] + a, rows[2] + a, rows[3] + a, rows[4] + a};
-                  across(p, a, b);
-                },
-                [&](int a, int b) {
-                  T buffer[5][kPiece];
-                  const T* p[5];
-                  for (int k = 0; k < 5; ++k) gather(rows[k], a, b, 0, buffer[k]), p[k] = buffer[k];
-                  across(p, a, b);
-                });
+    walkColumns(
+        lo, hi, 0,
+        [&](int a, int b) {
+          const T* p[5] = {rows[0] + a, rows[1] + a, rows[2] + a, rows[3] + a, rows[4] + a};
+          across(p, a, b);
+        },
+        [&](int a, int b) {
+          T buffer[5][kPiece];
+          const T* p[5];
+          for (int k = 0; k < 5; ++k) gather(rows[k], a, b, 0, buffer[k]), p[k] = buffer[k];
+          across(p, a, b);
+        });
   }
 
   void colourRows(int d, int y) {
@@ -152,17 +158,18 @@ class AhdRows {
       const ColourTaps<T> taps{green(d, y - 1) + a, green(d, y) + a, green(d, y + 1) + a, p[0], p[1], p[2]};
       colourRow(taps, b - a, greenAt(a, y), redRow(y), red(d, y) + a, blue(d, y) + a, level_);
     };
-    walkColumns(t_.x - 2, t_.x + t_.width + 2, 1,
-                [&](int a, int b) {
-                  const T* p[3] = {rows[0] + a, rows[1] + a, rows[2] + a};
-                  run(p, a, b);
-                },
-                [&](int a, int b) {
-                  T buffer[3][kPiece + 2];
-                  const T* p[3];
-                  for (int k = 0; k < 3; ++k) gather(rows[k], a, b, 1, buffer[k]), p[k] = buffer[k] + 1;
-                  run(p, a, b);
-                });
+    walkColumns(
+        t_.x - 2, t_.x + t_.width + 2, 1,
+        [&](int a, int b) {
+          const T* p[3] = {rows[0] + a, rows[1] + a, rows[2] + a};
+          run(p, a, b);
+        },
+        [&](int a, int b) {
+          T buffer[3][kPiece + 2];
+          const T* p[3];
+          for (int k = 0; k < 3; ++k) gather(rows[k], a, b, 1, buffer[k]), p[k] = buffer[k] + 1;
+          run(p, a, b);
+        });
   }
 
   // Luma-chroma of rows y - 1 .. y + 1 for a chunk of columns and one more

@@ -41,9 +41,7 @@ inline LumaChroma lumaChroma(int r, int g, int b) {
                     (112 * r - 94 * g - 18 * b + 128) >> 8};
 }
 
-inline int32_t lumaDistance(const LumaChroma& a, const LumaChroma& b) {
-  return a.y > b.y ? a.y - b.y : b.y - a.y;
-}
+inline int32_t lumaDistance(const LumaChroma& a, const LumaChroma& b) { return a.y > b.y ? a.y - b.y : b.y - a.y; }
 // Squares and sum wrap at 32 bits (16-bit images with strong colour edges
 // overflow); the result compares as signed.
 inline int32_t chromaDistance(const LumaChroma& a, const LumaChroma& b) {

@@ -31,7 +31,8 @@ inline Vec loadSignedLanes(const uint8_t* p) { return _mm_cvtepi8_epi32(load32(p
 inline Vec loadSignedLanes(const uint16_t* p) { return _mm_cvtepi16_epi32(load64(p)); }
 // Samples keep the low bits of each lane, as a cast to the sample type.
 inline void storeLanes(uint8_t* p, Vec v) {
-  const int32_t w = _mm_cvtsi128_si32(_mm_shuffle_epi8(v, _mm_setr_epi8(0, 4, 8, 12, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1)));
+  const int32_t w = _mm_cvtsi128_si32(
+      _mm_shuffle_epi8(v, _mm_setr_epi8(0, 4, 8, 12, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1)));
   __builtin_memcpy(p, &w, 4);
 }
 inline void storeLanes(uint16_t* p, Vec v) {
@@ -43,7 +44,9 @@ inline Vec broadcast(int32_t v) { return _mm_set1_epi32(v); }
 inline Vec add(Vec a, Vec b) { return _mm_add_epi32(a, b); }
 inline Vec sub(Vec a, Vec b) { return _mm_sub_epi32(a, b); }
 template <int N>
-inline Vec shiftRight(Vec a) { return _mm_srai_epi32(a, N); }
+inline Vec shiftRight(Vec a) {
+  return _mm_srai_epi32(a, N);
+}
 inline Vec smaller(Vec a, Vec b) { return _mm_min_epi32(a, b); }
 inline Vec larger(Vec a, Vec b) { return _mm_max_epi32(a, b); }
 inline Vec magnitude(Vec a) { return _mm_abs_epi32(a); }
@@ -54,7 +57,9 @@ inline Vec either(Vec a, Vec b) { return _mm_or_si128(a, b); }
 inline Vec select(Vec mask, Vec a, Vec b) { return _mm_blendv_epi8(b, a, mask); }
 // The low word of `low` and the low word of `high` side by side in a lane.
 inline Vec wordPairs(Vec low, Vec high) { return _mm_blend_epi16(low, _mm_slli_epi32(high, 16), 0xAA); }
-inline Vec greenLanes(bool firstGreen) { return firstGreen ? _mm_setr_epi32(-1, 0, -1, 0) : _mm_setr_epi32(0, -1, 0, -1); }
+inline Vec greenLanes(bool firstGreen) {
+  return firstGreen ? _mm_setr_epi32(-1, 0, -1, 0) : _mm_setr_epi32(0, -1, 0, -1);
+}
 
 #define ZEL_LANES
 #include "demosaic/ahd_lanes.inc"
@@ -74,15 +79,15 @@ ZEL_AVX2 inline Vec loadLanes(const int32_t* p) { return load256(p); }
 ZEL_AVX2 inline Vec loadSignedLanes(const uint8_t* p) { return _mm256_cvtepi8_epi32(load64(p)); }
 ZEL_AVX2 inline Vec loadSignedLanes(const uint16_t* p) { return _mm256_cvtepi16_epi32(load128(p)); }
 ZEL_AVX2 inline void storeLanes(uint8_t* p, Vec v) {
-  const __m256i bytes = _mm256_shuffle_epi8(
-      v, _mm256_setr_epi8(0, 4, 8, 12, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, 0, 4, 8, 12, -1, -1, -1, -1,
-                          -1, -1, -1, -1, -1, -1, -1, -1));
+  const __m256i bytes =
+      _mm256_shuffle_epi8(v, _mm256_setr_epi8(0, 4, 8, 12, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, 0, 4, 8, 12,
+                                              -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1));
   store64(p, _mm_unpacklo_epi32(_mm256_castsi256_si128(bytes), _mm256_extracti128_si256(bytes, 1)));
 }
 ZEL_AVX2 inline void storeLanes(uint16_t* p, Vec v) {
-  const __m256i words = _mm256_shuffle_epi8(
-      v, _mm256_setr_epi8(0, 1, 4, 5, 8, 9, 12, 13, -1, -1, -1, -1, -1, -1, -1, -1, 0, 1, 4, 5, 8, 9, 12, 13, -1, -1,
-                          -1, -1, -1, -1, -1, -1));
+  const __m256i words =
+      _mm256_shuffle_epi8(v, _mm256_setr_epi8(0, 1, 4, 5, 8, 9, 12, 13, -1, -1, -1, -1, -1, -1, -1, -1, 0, 1, 4, 5, 8,
+                                              9, 12, 13, -1, -1, -1, -1, -1, -1, -1, -1));
   store128(p, _mm256_castsi256_si128(_mm256_permute4x64_epi64(words, 0x08)));
 }
 ZEL_AVX2 inline void storeLanes(int32_t* p, Vec v) { store256(p, v); }
@@ -91,7 +96,9 @@ ZEL_AVX2 inline Vec broadcast(int32_t v) { return _mm256_set1_epi32(v); }
 ZEL_AVX2 inline Vec add(Vec a, Vec b) { return _mm256_add_epi32(a, b); }
 ZEL_AVX2 inline Vec sub(Vec a, Vec b) { return _mm256_sub_epi32(a, b); }
 template <int N>
-ZEL_AVX2 inline Vec shiftRight(Vec a) { return _mm256_srai_epi32(a, N); }
+ZEL_AVX2 inline Vec shiftRight(Vec a) {
+  return _mm256_srai_epi32(a, N);
+}
 ZEL_AVX2 inline Vec smaller(Vec a, Vec b) { return _mm256_min_epi32(a, b); }
 ZEL_AVX2 inline Vec larger(Vec a, Vec b) { return _mm256_max_epi32(a, b); }
 ZEL_AVX2 inline Vec magnitude(Vec a) { return _mm256_abs_epi32(a); }
@@ -164,7 +171,7 @@ void lumaChromaRow(const T* r, const T* g, const T* b, int count, const LumaChro
 
 template <typename T>
 void homogeneityRow(const LumaChromaView h[3], const LumaChromaView v[3], int count, T* out, VectorLevel level) {
-  auto shifted = [&](int i, LumaChromaView (&hs)[3], LumaChromaView (&vs)[3]) {
+  auto shifted = [&](int i, LumaChromaView(&hs)[3], LumaChromaView(&vs)[3]) {
     for (int k = 0; k < 3; ++k) hs[k] = advanced(h[k], i), vs[k] = advanced(v[k], i);
   };
   const int done = vectorBlocks(
@@ -209,7 +216,7 @@ void chooseRow(const T* const h[3], const T* const v[3], const uint8_t* takeV, i
   chooseRowScalar(hr, vr, takeV + i, count - i, dst + 3 * i);
 }
 
-#define ZEL_AHD_KERNELS(T)                                                                                  \
+#define ZEL_AHD_KERNELS(T)                                                                                 \
   template void greenRow<T>(const GreenTaps<T>&, int, bool, T*, VectorLevel);                              \
   template void colourRow<T>(const ColourTaps<T>&, int, bool, bool, T*, T*, VectorLevel);                  \
   template void lumaChromaRow<T>(const T*, const T*, const T*, int, const LumaChromaRow&, VectorLevel);    \

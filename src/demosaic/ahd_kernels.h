@@ -45,10 +45,9 @@ template <typename T>
 void greenRowScalar(const GreenTaps<T>& t, int count, bool firstGreen, T* out) {
   for (int i = 0; i < count; ++i) {
     const int c = loadSample(t.c + i);
-    storeSample(out + i, T(isGreenLane(firstGreen, i)
-                               ? c
-                               : greenAlong(c, loadSample(t.a + i), loadSample(t.b + i), loadSample(t.l + i),
-                                            loadSample(t.r + i))));
+    storeSample(out + i, T(isGreenLane(firstGreen, i) ? c
+                                                      : greenAlong(c, loadSample(t.a + i), loadSample(t.b + i),
+                                                                   loadSample(t.l + i), loadSample(t.r + i))));
   }
 }
 
@@ -64,9 +63,9 @@ void colourRowScalar(const ColourTaps<T>& t, int count, bool firstGreen, bool re
       otherColour = colourFromPair(g, at(t.sUp, i) + at(t.sDown, i), at(t.gUp, i) + at(t.gDown, i), top);
     } else {
       rowColour = at(t.s, i);
-      otherColour = colourFromDiagonals(
-          g, at(t.sUp, i - 1) + at(t.sUp, i + 1) + at(t.sDown, i - 1) + at(t.sDown, i + 1),
-          at(t.gUp, i - 1) + at(t.gUp, i + 1) + at(t.gDown, i - 1) + at(t.gDown, i + 1), top);
+      otherColour =
+          colourFromDiagonals(g, at(t.sUp, i - 1) + at(t.sUp, i + 1) + at(t.sDown, i - 1) + at(t.sDown, i + 1),
+                              at(t.gUp, i - 1) + at(t.gUp, i + 1) + at(t.gDown, i - 1) + at(t.gDown, i + 1), top);
     }
     storeSample(outR + i, T(redRow ? rowColour : otherColour));
     storeSample(outB + i, T(redRow ? otherColour : rowColour));
@@ -104,7 +103,8 @@ template <typename T>
 void windowSumRowScalar(const T* up, const T* mid, const T* down, int count, int32_t* sums) {
   for (int i = 0; i < count; ++i) {
     int s = 0;
-    for (int k = -1; k <= 1; ++k) s += signedSample(up + i + k) + signedSample(mid + i + k) + signedSample(down + i + k);
+    for (int k = -1; k <= 1; ++k)
+      s += signedSample(up + i + k) + signedSample(mid + i + k) + signedSample(down + i + k);
     sums[i] = s;
   }
 }

@@ -13,11 +13,10 @@ namespace zel {
 enum CfaColour : int { kRed = 0, kGreen = 1, kBlue = 2 };
 
 // Colour of a site by grid kind and the parities of its frame row and column.
-inline constexpr int8_t kCfaColours[4][2][2] = {
-    {{kBlue, kGreen}, {kGreen, kRed}},   // CfaGridBGGR
-    {{kRed, kGreen}, {kGreen, kBlue}},   // CfaGridRGGB
-    {{kGreen, kBlue}, {kRed, kGreen}},   // CfaGridGBRG
-    {{kGreen, kRed}, {kBlue, kGreen}}};  // CfaGridGRBG
+inline constexpr int8_t kCfaColours[4][2][2] = {{{kBlue, kGreen}, {kGreen, kRed}},   // CfaGridBGGR
+                                                {{kRed, kGreen}, {kGreen, kBlue}},   // CfaGridRGGB
+                                                {{kGreen, kBlue}, {kRed, kGreen}},   // CfaGridGBRG
+                                                {{kGreen, kRed}, {kBlue, kGreen}}};  // CfaGridGRBG
 
 inline int cfaColour(int grid, int x, int y) { return kCfaColours[grid][y & 1][x & 1]; }
 inline bool isValidGrid(int grid) { return grid >= 0 && grid <= 3; }

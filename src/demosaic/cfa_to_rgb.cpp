@@ -42,7 +42,8 @@ inline __m128i absDiffU(__m128i a, __m128i b, uint16_t) {
 inline __m128i mean4U(__m128i a, __m128i b, __m128i c, __m128i d, uint8_t) {
   const __m128i z = _mm_setzero_si128(), two = _mm_set1_epi16(2);
   auto half = [&](auto unpack) {
-    const __m128i s = _mm_add_epi16(_mm_add_epi16(unpack(a, z), unpack(b, z)), _mm_add_epi16(unpack(c, z), unpack(d, z)));
+    const __m128i s =
+        _mm_add_epi16(_mm_add_epi16(unpack(a, z), unpack(b, z)), _mm_add_epi16(unpack(c, z), unpack(d, z)));
     return _mm_srli_epi16(_mm_add_epi16(s, two), 2);
   };
   return _mm_packus_epi16(half([](__m128i v, __m128i w) { return _mm_unpacklo_epi8(v, w); }),
@@ -51,7 +52,8 @@ inline __m128i mean4U(__m128i a, __m128i b, __m128i c, __m128i d, uint8_t) {
 inline __m128i mean4U(__m128i a, __m128i b, __m128i c, __m128i d, uint16_t) {
   const __m128i z = _mm_setzero_si128(), two = _mm_set1_epi32(2);
   auto half = [&](auto unpack) {
-    const __m128i s = _mm_add_epi32(_mm_add_epi32(unpack(a, z), unpack(b, z)), _mm_add_epi32(unpack(c, z), unpack(d, z)));
+    const __m128i s =
+        _mm_add_epi32(_mm_add_epi32(unpack(a, z), unpack(b, z)), _mm_add_epi32(unpack(c, z), unpack(d, z)));
     return _mm_srli_epi32(_mm_add_epi32(s, two), 2);
   };
   return _mm_packus_epi32(half([](__m128i v, __m128i w) { return _mm_unpacklo_epi16(v, w); }),
@@ -59,14 +61,20 @@ inline __m128i mean4U(__m128i a, __m128i b, __m128i c, __m128i d, uint16_t) {
 }
 // All ones in the lanes of green sites: every other lane, from lane 0 or 1.
 inline __m128i greenLanes(bool firstGreen, uint8_t) { return _mm_set1_epi16(firstGreen ? 0x00FF : int16_t(0xFF00)); }
-inline __m128i greenLanes(bool firstGreen, uint16_t) { return _mm_set1_epi32(firstGreen ? 0x0000FFFF : int32_t(0xFFFF0000)); }
+inline __m128i greenLanes(bool firstGreen, uint16_t) {
+  return _mm_set1_epi32(firstGreen ? 0x0000FFFF : int32_t(0xFFFF0000));
+}
 
 // The five rows a block reads, at the block's first column.
 template <typename T>
 struct RowWindow {
   const T *up2, *up, *mid, *down, *down2;
   RowWindow(const CfaFrame<T>& f, int x, int y)
-      : up2(f.row(y - 2) + x), up(f.row(y - 1) + x), mid(f.row(y) + x), down(f.row(y + 1) + x), down2(f.row(y + 2) + x) {}
+      : up2(f.row(y - 2) + x),
+        up(f.row(y - 1) + x),
+        mid(f.row(y) + x),
+        down(f.row(y + 1) + x),
+        down2(f.row(y + 2) + x) {}
 };
 
 // One block of 16 / sizeof(T) pixels starting `at` samples into the window.
@@ -78,8 +86,8 @@ inline void sseBlock(const RowWindow<T>& w, int at, bool redRow, __m128i green, 
   const __m128i up = load128(w.up + at), down = load128(w.down + at);
   const __m128i rowMean = avgU(left, right, tag);
   const __m128i columnMean = avgU(up, down, tag);
-  const __m128i diagonal = mean4U(load128(w.up + at - 1), load128(w.up + at + 1), load128(w.down + at - 1),
-                                  load128(w.down + at + 1), tag);
+  const __m128i diagonal =
+      mean4U(load128(w.up + at - 1), load128(w.up + at + 1), load128(w.down + at - 1), load128(w.down + at + 1), tag);
   const __m128i cross = mean4U(up, left, right, down, tag);
   const __m128i dV = absDiffU(load128(w.up2 + at), load128(w.down2 + at), tag);
   const __m128i dH = absDiffU(load128(w.mid + at - 2), load128(w.mid + at + 2), tag);
@@ -140,8 +148,8 @@ ZEL_AVX2 inline void avxBlock(const RowWindow<T>& w, int at, bool redRow, __m256
   const __m256i up = load256(w.up + at), down = load256(w.down + at);
   const __m256i rowMean = avgU(left, right, tag);
   const __m256i columnMean = avgU(up, down, tag);
-  const __m256i diagonal = mean4U(load256(w.up + at - 1), load256(w.up + at + 1), load256(w.down + at - 1),
-                                  load256(w.down + at + 1), tag);
+  const __m256i diagonal =
+      mean4U(load256(w.up + at - 1), load256(w.up + at + 1), load256(w.down + at - 1), load256(w.down + at + 1), tag);
   const __m256i cross = mean4U(up, left, right, down, tag);
   const __m256i dV = absDiffU(load256(w.up2 + at), load256(w.down2 + at), tag);
   const __m256i dH = absDiffU(load256(w.mid + at - 2), load256(w.mid + at + 2), tag);

@@ -36,9 +36,7 @@ template <typename T>
 struct MirroredTaps {
   const CfaFrame<T>& f;
   int x, y;
-  int operator()(int dx, int dy) const {
-    return f.at(reflect(x + dx, f.width - 1), reflect(y + dy, f.height - 1));
-  }
+  int operator()(int dx, int dy) const { return f.at(reflect(x + dx, f.width - 1), reflect(y + dy, f.height - 1)); }
 };
 
 // One output pixel, R G B. Interior sites test gradients; border sites do not.

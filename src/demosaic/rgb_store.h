@@ -37,9 +37,9 @@ inline void storeRgb(T* dst, __m128i r, __m128i g, __m128i b) {
   const RgbShuffles& s = sizeof(T) == 1 ? kRgbShuffles8 : kRgbShuffles16;
   uint8_t* out = reinterpret_cast<uint8_t*>(dst);
   for (int j = 0; j < 3; ++j) {
-    const __m128i v = _mm_or_si128(
-        _mm_or_si128(_mm_shuffle_epi8(r, load128(s.m[j][0])), _mm_shuffle_epi8(g, load128(s.m[j][1]))),
-        _mm_shuffle_epi8(b, load128(s.m[j][2])));
+    const __m128i v =
+        _mm_or_si128(_mm_or_si128(_mm_shuffle_epi8(r, load128(s.m[j][0])), _mm_shuffle_epi8(g, load128(s.m[j][1]))),
+                     _mm_shuffle_epi8(b, load128(s.m[j][2])));
     store128(out + 16 * j, v);
   }
 }

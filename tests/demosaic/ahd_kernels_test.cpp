@@ -1,12 +1,13 @@
 // The vector levels of the homogeneity-directed row kernels against their
 // scalar forms: every width from 1 to 70, misaligned rows, both site
 // phases, full-range and end-of-range samples.
+#include "demosaic/ahd_kernels.h"
+
 #include <gtest/gtest.h>
 
 #include <random>
 #include <vector>
 
-#include "demosaic/ahd_kernels.h"
 #include "frame/simd.h"
 #include "support/test_image.h"
 
@@ -103,10 +104,12 @@ void compareLumaChromaAndHomogeneity() {
       Row<T> r(count, 0, offset, seed), g(count, 0, offset + 2, seed + 1), b(count, 0, offset, seed + 2);
       std::vector<int32_t> want[3], got[3];
       for (auto& v : want) v.assign(count + 1, -7);
-      zel::lumaChromaRowScalar(r.at(), g.at(), b.at(), count, zel::LumaChromaRow{want[0].data(), want[1].data(), want[2].data()});
+      zel::lumaChromaRowScalar(r.at(), g.at(), b.at(), count,
+                               zel::LumaChromaRow{want[0].data(), want[1].data(), want[2].data()});
       for (VectorLevel level : vectorLevels()) {
         for (auto& v : got) v.assign(count + 1, -7);
-        zel::lumaChromaRow(r.at(), g.at(), b.at(), count, zel::LumaChromaRow{got[0].data(), got[1].data(), got[2].data()}, level);
+        zel::lumaChromaRow(r.at(), g.at(), b.at(), count,
+                           zel::LumaChromaRow{got[0].data(), got[1].data(), got[2].data()}, level);
         for (int k = 0; k < 3; ++k) ASSERT_EQ(got[k], want[k]) << "luma-chroma " << k << " width " << count;
       }
       const LumaChromaRows lc = lumaChromaOf<T>(count, seed * 7);
@@ -189,9 +192,9 @@ TEST(AhdFormulas, WorkedValues) {
   EXPECT_EQ(zel::greenAlong(0, 200, 200, 100, 120), 100);
   EXPECT_EQ(zel::greenAlong(10, 11, 12, 50, 51), 50);  // 50 + (-3 >> 2) = 49 -> 50
   // Colour from a pair and from the diagonals: no rounding term, clamped.
-  EXPECT_EQ(zel::colourFromPair(100, 31, 40, 255), 95);            // 100 + (-9 >> 1) = 95
-  EXPECT_EQ(zel::colourFromDiagonals(100, 403, 400, 255), 100);    // 3 >> 2 = 0
-  EXPECT_EQ(zel::colourFromDiagonals(100, 390, 400, 255), 97);     // -10 >> 2 = -3
+  EXPECT_EQ(zel::colourFromPair(100, 31, 40, 255), 95);          // 100 + (-9 >> 1) = 95
+  EXPECT_EQ(zel::colourFromDiagonals(100, 403, 400, 255), 100);  // 3 >> 2 = 0
+  EXPECT_EQ(zel::colourFromDiagonals(100, 390, 400, 255), 97);   // -10 >> 2 = -3
   EXPECT_EQ(zel::colourFromPair(250, 600, 500, 255), 255);
   EXPECT_EQ(zel::colourFromPair(65000, 10, 70000, 65535), 30005);  // wider clamp of 16 bits
   EXPECT_EQ(zel::colourFromDiagonals(5, 0, 100, 255), 0);

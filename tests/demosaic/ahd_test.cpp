@@ -1,6 +1,8 @@
 // Adaptive homogeneity-directed demosaicing: whole planes built naively
 // over the frame and its margins against the row pipeline, the tiles of
 // worked regions, flat and edged mosaics, statuses, scratch and guards.
+#include "demosaic/ahd.h"
+
 #include <gtest/gtest.h>
 
 #include <array>
@@ -9,7 +11,6 @@
 #include <random>
 #include <vector>
 
-#include "demosaic/ahd.h"
 #include "support/test_image.h"
 #include "zelcc/zelcc.h"
 
@@ -48,7 +49,7 @@ template <typename T>
 struct Reference {
   static constexpr int kM = 8;
   int w, h, grid, top;
-  bool wrap;  // chroma distances wrap at 32 bits (the rule), or saturate
+  bool wrap;            // chroma distances wrap at 32 bits (the rule), or saturate
   std::vector<int> s0;  // the frame's samples
   std::vector<int> g[2], r[2], b[2], lumaY[2], cb[2], cr[2], hom, sum;
 
@@ -239,15 +240,15 @@ void regions() {
   TestImage<T> m(29, 24, 3, 2);
   m.fillRandom(9);
   const CfaRegion cases[] = {
-      {7, 9, 13, 8},    // inside, odd origin
-      {0, 0, 3, 3},     // within the first rows and columns
-      {0, 0, 29, 3},    // top tile higher than the region
-      {2, 1, 40, 50},   // past the right and bottom edges
-      {26, 2, 3, 20},   // within the last columns: the right tile starts left of it
-      {1, 20, 27, 4},   // the last rows
-      {-3, -2, 9, 8},   // negative origin raised to 0, width kept
-      {6, 6, 1, 1},     // one pixel
-      {5, 5, 2, 2},     // one interior block, moved off its site
+      {7, 9, 13, 8},   // inside, odd origin
+      {0, 0, 3, 3},    // within the first rows and columns
+      {0, 0, 29, 3},   // top tile higher than the region
+      {2, 1, 40, 50},  // past the right and bottom edges
+      {26, 2, 3, 20},  // within the last columns: the right tile starts left of it
+      {1, 20, 27, 4},  // the last rows
+      {-3, -2, 9, 8},  // negative origin raised to 0, width kept
+      {6, 6, 1, 1},    // one pixel
+      {5, 5, 2, 2},    // one interior block, moved off its site
   };
   for (int grid = 0; grid < 4; ++grid)
     for (const CfaRegion& r : cases) expectLikeReference(m, grid, r);

@@ -1,12 +1,13 @@
 // Bayer mosaic to RGB: hand-worked pixels, whole frames against the rules
 // written out, regions against whole frames, statuses, and the vector rows
 // against the scalar pixel.
+#include "demosaic/cfa_to_rgb.h"
+
 #include <gtest/gtest.h>
 
 #include <array>
 #include <vector>
 
-#include "demosaic/cfa_to_rgb.h"
 #include "frame/simd.h"
 #include "support/test_image.h"
 #include "zelcc/zelcc.h"
@@ -48,9 +49,12 @@ std::array<int, 3> expectedPixel(const TestImage<T>& m, int w, int h, int grid, 
   } else {
     out[2 - channel(own)] = (s(-1, -1) + s(1, -1) + s(-1, 1) + s(1, 1) + 2) / 4;
     const int dV = std::abs(s(0, -2) - s(0, 2)), dH = std::abs(s(-2, 0) - s(2, 0));
-    if (interior && dV < dH) out[1] = (s(0, -1) + s(0, 1) + 1) / 2;
-    else if (interior && dV > dH) out[1] = (s(-1, 0) + s(1, 0) + 1) / 2;
-    else out[1] = (s(0, -1) + s(-1, 0) + s(1, 0) + s(0, 1) + 2) / 4;
+    if (interior && dV < dH)
+      out[1] = (s(0, -1) + s(0, 1) + 1) / 2;
+    else if (interior && dV > dH)
+      out[1] = (s(-1, 0) + s(1, 0) + 1) / 2;
+    else
+      out[1] = (s(0, -1) + s(-1, 0) + s(1, 0) + s(0, 1) + 2) / 4;
   }
   return out;
 }
@@ -83,8 +87,8 @@ void expectRegion(const TestImage<T>& m, int grid, CfaRegion region, int dstOffs
     for (int x = 0; x < rw; ++x) {
       const auto want = expectedPixel(m, w, h, grid, x0 + x, y0 + y);
       for (int c = 0; c < 3; ++c)
-        ASSERT_EQ(int(dst.get(3 * x + c, y)), want[c])
-            << "frame " << w << "x" << h << " grid " << grid << " pixel " << x0 + x << "," << y0 + y << " channel " << c;
+        ASSERT_EQ(int(dst.get(3 * x + c, y)), want[c]) << "frame " << w << "x" << h << " grid " << grid << " pixel "
+                                                       << x0 + x << "," << y0 + y << " channel " << c;
     }
 }
 
@@ -123,11 +127,12 @@ TEST(CfaToRgb, InteriorGreenFollowsTheFlatterLine) {
   TestImage<uint16_t> m(5, 5);
   m.fill(0);
   m.set(1, 1, 65535), m.set(3, 1, 65535), m.set(1, 3, 65535), m.set(3, 3, 65534);  // blue diagonals
-  m.set(2, 1, 7), m.set(2, 3, 8);     // greens above and below
-  m.set(1, 2, 30), m.set(3, 2, 31);   // greens left and right
+  m.set(2, 1, 7), m.set(2, 3, 8);                                                  // greens above and below
+  m.set(1, 2, 30), m.set(3, 2, 31);                                                // greens left and right
   m.set(2, 2, 500);
   auto centre = [&](int up2, int down2, int left2, int right2) {
-    m.set(2, 0, uint16_t(up2)), m.set(2, 4, uint16_t(down2)), m.set(0, 2, uint16_t(left2)), m.set(4, 2, uint16_t(right2));
+    m.set(2, 0, uint16_t(up2)), m.set(2, 4, uint16_t(down2)), m.set(0, 2, uint16_t(left2)),
+        m.set(4, 2, uint16_t(right2));
     uint16_t rgb[75];
     EXPECT_EQ(convert(m.data(), CfaRegion{0, 0, 5, 5}, ImageSize{5, 5}, m.step(), rgb, 30, CfaGridRGGB), StatusOk);
     return std::array<int, 3>{rgb[36], rgb[37], rgb[38]};
@@ -135,7 +140,7 @@ TEST(CfaToRgb, InteriorGreenFollowsTheFlatterLine) {
   // Blue: (3 * 65535 + 65534 + 2) >> 2 rounds up to 65535, with no overflow.
   EXPECT_EQ(centre(100, 100, 0, 50), (std::array<int, 3>{500, 8, 65535}));   // dV 0 < dH 50: column, 7.5 up
   EXPECT_EQ(centre(0, 50, 100, 100), (std::array<int, 3>{500, 31, 65535}));  // dV 50 > dH 0: row, 30.5 up
-  EXPECT_EQ(centre(9, 0, 3, 12), (std::array<int, 3>{500, 19, 65535}));     // tie: (7 + 30 + 31 + 8 + 2) >> 2
+  EXPECT_EQ(centre(9, 0, 3, 12), (std::array<int, 3>{500, 19, 65535}));      // tie: (7 + 30 + 31 + 8 + 2) >> 2
 }
 
 TEST(CfaToRgb, BorderTakesMirroredMeans) {
@@ -170,13 +175,13 @@ void regions() {
   TestImage<T> m(37, 23, 1, kPad<T>);
   fillMosaic(m, 77, false);
   const CfaRegion cases[] = {
-      {3, 5, 17, 11},   // odd origin in the middle
-      {0, 0, 37, 23},   // the whole frame
-      {30, 18, 50, 50}, // past the right and bottom: clipped, last column by the border rule
-      {1, 1, 1, 1},     // one border pixel
-      {2, 2, 1, 21},    // one interior column down to the border
-      {35, 0, 2, 23},   // the two right border columns only
-      {4, 21, 33, 2},   // the two bottom border rows only
+      {3, 5, 17, 11},    // odd origin in the middle
+      {0, 0, 37, 23},    // the whole frame
+      {30, 18, 50, 50},  // past the right and bottom: clipped, last column by the border rule
+      {1, 1, 1, 1},      // one border pixel
+      {2, 2, 1, 21},     // one interior column down to the border
+      {35, 0, 2, 23},    // the two right border columns only
+      {4, 21, 33, 2},    // the two bottom border rows only
   };
   for (int grid = 0; grid < 4; ++grid)
     for (const CfaRegion& r : cases) expectRegion(m, grid, r, 2);
