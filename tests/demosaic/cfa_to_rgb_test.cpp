@@ -221,6 +221,8 @@ TEST(CfaToRgb, ChecksInOrderAndWriteNothing) {
   EXPECT_EQ(status(m.data(), ImageSize{6, -1}, dst.data(), 4), StatusSizeError);
   EXPECT_EQ(status(m.data(), ok, dst.data(), 4), StatusBadArgumentError);
   EXPECT_EQ(status(m.data(), ok, dst.data(), -1), StatusBadArgumentError);
+  // The grid is checked before the region is looked at.
+  EXPECT_EQ(convert(m.data(), CfaRegion{2, 2, 0, 0}, ok, m.step(), dst.data(), dst.step(), 4), StatusBadArgumentError);
   for (int y = 0; y < 6; ++y)
     for (int x = 0; x < 18; ++x) ASSERT_EQ(dst.get(x, y), TestImage<uint8_t>::kGuard);
   // The interpolation argument is not read.
