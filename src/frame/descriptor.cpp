@@ -190,6 +190,10 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       }
       Extra e{f[0], kinds.at(f[1]), std::atof(f[2].c_str()), {}};
       for (size_t k = 3; k < f.size(); ++k) {
+        if (f[k] == "optional" && e.kind == ArgKind::Pointer) {
+          e.optional = true;
+          continue;
+        }
         const size_t eq = f[k].find('=');
         if (eq == std::string::npos) {
           error = "bad value list in extras of " + d.name;
@@ -218,10 +222,13 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       d.warnsOdd = true;
     } else if (word == "steps") {
       d.checksSteps = true;
+    } else if (word == "samplesteps" || word == "samplesteps=dst") {
+      // 16-bit and 32-bit steps are shifted into samples, odd bytes dropped;
+      // with =dst the source's step stays a byte count.
+      d.stepsInSamples = true;
+      d.srcStepInBytes = word != "samplesteps";
     } else if (word == "alphawritten") {
       d.writesAlpha = true;
-    } else if (word == "samplesteps") {
-      d.sampleSteps = true;
     } else if (word == "frame") {
       d.frameSource = true;
     } else if (word.rfind("scratch=", 0) == 0) {
@@ -450,7 +457,8 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
       Buffer b;
       b.geometry = planeGeometry(side, p, w, h);
       b.step = b.geometry.rowBytes + padBytes;
-      if (d.sampleSteps) b.step += (b.geometry.sampleBytes - b.step % b.geometry.sampleBytes) % b.geometry.sampleBytes;
+      const bool inSamples = d.stepsInSamples && !(sideIndex == 0 && d.srcStepInBytes);
+      b.pitch = inSamples ? b.step / b.geometry.sampleBytes * b.geometry.sampleBytes : b.step;
       const int rows = std::max(b.geometry.rows, 1);
       const size_t total = size_t(kGuard) * 2 + size_t(offset) + size_t(b.step) * rows + 64;
       b.bytes.assign(total, kGuardByte);
@@ -471,6 +479,7 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
     // Every byte of the rows belongs to the call; guards lie outside them.
     Buffer b;
     b.step = (w + d.scratchPad) * sampleBytes(d.src.sample) + padBytes;
+    b.pitch = b.step;
     b.geometry = PlaneGeometry{b.step, d.scratchRows, 1};
     b.bytes.assign(size_t(kGuard) * 2 + size_t(offset) + size_t(b.step) * d.scratchRows + 64, kGuardByte);
     b.side = 3;
@@ -516,7 +525,7 @@ void Workspace::fillRandom(uint32_t seed) {
   for (Buffer& b : buffers_) {
     if (!b.isSource) continue;
     for (int y = 0; y < b.geometry.rows; ++y) {
-      uint8_t* row = b.first + size_t(y) * b.step;
+      uint8_t* row = b.first + size_t(y) * b.pitch;
       if (d_.src.sample == Sample::F32) {
         // Floats in 0..1, the range colour functions take.
         std::uniform_real_distribution<float> dist(0.0f, 1.0f);
@@ -534,7 +543,7 @@ void Workspace::fillRandom(uint32_t seed) {
 void Workspace::fillDestinations(uint8_t value) {
   for (Buffer& b : buffers_) {
     if (!b.isDestination || b.isSource) continue;
-    for (int y = 0; y < b.geometry.rows; ++y) std::memset(b.first + size_t(y) * b.step, value, b.geometry.rowBytes);
+    for (int y = 0; y < b.geometry.rows; ++y) std::memset(b.first + size_t(y) * b.pitch, value, b.geometry.rowBytes);
   }
 }
 
@@ -630,12 +639,12 @@ std::string Workspace::checkGuards() const {
       return m.str();
     };
     const int rows = b.geometry.rows;
-    const uint8_t* regionEnd = b.first + (rows > 0 ? size_t(rows - 1) * b.step + b.geometry.rowBytes : 0);
+    const uint8_t* regionEnd = b.first + (rows > 0 ? size_t(rows - 1) * b.pitch + b.geometry.rowBytes : 0);
     for (const uint8_t* p = lo; p < b.first; ++p)
       if (*p != kGuardByte) return describeAt(p);
     for (int y = 0; y + 1 < rows; ++y) {
-      const uint8_t* padStart = b.first + size_t(y) * b.step + b.geometry.rowBytes;
-      for (const uint8_t* p = padStart; p < b.first + size_t(y + 1) * b.step; ++p)
+      const uint8_t* padStart = b.first + size_t(y) * b.pitch + b.geometry.rowBytes;
+      for (const uint8_t* p = padStart; p < b.first + size_t(y + 1) * b.pitch; ++p)
         if (*p != kGuardByte) return describeAt(p);
     }
     for (const uint8_t* p = regionEnd; p < hi; ++p)

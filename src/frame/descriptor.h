@@ -55,6 +55,7 @@ struct Extra {
   double good;
   std::vector<BadValue> bad;
   int stage = -1;  // where its check stands in the order (index into Descriptor::order)
+  bool optional = false;  // a pointer whose null is valid (it selects a default)
 };
 
 // Steps of the argument checks, in the order a member runs them.
@@ -104,15 +105,14 @@ struct Descriptor {
   bool warnsOdd = false;        // may return StatusOddSizeWarning
   bool writesAlpha = false;     // an AC4 destination's fourth channel is written
   bool checksSteps = false;
+  bool stepsInSamples = false;  // byte steps are cut down to whole samples
+  bool srcStepInBytes = false;  // ... except the source's
   // The source is a frame given with a region (the whole frame in a
   // workspace); the size argument is the frame's.
   bool frameSource = false;
   // Caller scratch after the family values: scratchRows rows, each of
   // (width + scratchPad) source samples.
   int scratchRows = 0, scratchPad = 0;
-  // Steps are taken in whole samples (an odd byte step of a 16-bit image
-  // loses its last bit), so workspaces give them whole samples.
-  bool sampleSteps = false;
   void (*impl)() = nullptr;
   Invoker invoke = nullptr;
   std::vector<ArgKind> prototype;  // kinds of the prototype's parameters
@@ -151,7 +151,8 @@ class Workspace {
   struct Buffer {
     std::vector<uint8_t> bytes;  // guard + rows + guard
     uint8_t* first = nullptr;    // first byte of the region
-    int step = 0;
+    int step = 0;   // the step argument
+    int pitch = 0;  // where the rows lie: the step, or its whole samples
     PlaneGeometry geometry{};
     bool isSource = false;
     bool isDestination = false;
