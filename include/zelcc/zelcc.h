@@ -432,6 +432,24 @@ ZELCC_API Status zeliReduceBits_8u1u_C1R(const uint8_t* src, int srcStep, uint8_
 
 
 /* ---- Bayer demosaicing ---- */
+/* A mosaic frame (src, the frame's size and step) is converted within
+ * srcRegion, given in frame coordinates and clipped to the frame; the
+ * frame's edges, not the region's, decide the border rules. grid is a
+ * CfaGrid value. dst receives R, G, B from the clipped region's top left
+ * pixel on. zeliCFAToRGB_16u_C1C3R takes both steps in whole samples (an
+ * odd step loses its last bit); interpolation is not read. */
+ZELCC_API Status zeliCFAToRGB_8u_C1C3R(const uint8_t* src, CfaRegion srcRegion, ImageSize srcSize, int srcStep,
+                                       uint8_t* dst, int dstStep, int grid, int interpolation);
+ZELCC_API Status zeliCFAToRGB_16u_C1C3R(const uint16_t* src, CfaRegion srcRegion, ImageSize srcSize, int srcStep,
+                                        uint16_t* dst, int dstStep, int grid, int interpolation);
+/* tmp: the caller's scratch, 30 rows of tmpStep bytes, each with room for
+ * the clipped region's width + 6 samples; it is neither checked nor kept.
+ * The frame must be at least 5 by 5. zeliDemosaicAHD_16u_C1C3R takes its
+ * dstStep in whole samples, its srcStep in bytes. */
+ZELCC_API Status zeliDemosaicAHD_8u_C1C3R(const uint8_t* src, CfaRegion srcRegion, ImageSize srcSize, int srcStep,
+                                          uint8_t* dst, int dstStep, int grid, uint8_t* tmp, int tmpStep);
+ZELCC_API Status zeliDemosaicAHD_16u_C1C3R(const uint16_t* src, CfaRegion srcRegion, ImageSize srcSize, int srcStep,
+                                           uint16_t* dst, int dstStep, int grid, uint8_t* tmp, int tmpStep);
 
 /* ---- Tone mapping ---- */
 /* Float samples to 8 bits by 255 / maximum (Linear, no saturation) or 255 / (2 * mean) (Mean, */

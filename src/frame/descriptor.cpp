@@ -226,11 +226,21 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       d.warnsOdd = true;
     } else if (word == "steps") {
       d.checksSteps = true;
-    } else if (word == "samplesteps") {
-      // 16-bit and 32-bit steps are shifted into samples, odd bytes dropped.
+    } else if (word == "samplesteps" || word == "samplesteps=dst") {
+      // 16-bit and 32-bit steps are shifted into samples, odd bytes dropped;
+      // with =dst the source's step stays a byte count.
       d.stepsInSamples = true;
+      d.srcStepInBytes = word != "samplesteps";
     } else if (word == "alphawritten") {
       d.writesAlpha = true;
+    } else if (word == "frame") {
+      d.frameSource = true;
+    } else if (word.rfind("scratch=", 0) == 0) {
+      // scratch=ROWS:PAD, a pointer and a step after the family values.
+      if (std::sscanf(word.c_str() + 8, "%d:%d", &d.scratchRows, &d.scratchPad) != 2 || d.scratchRows < 1) {
+        error = "bad scratch= in extras of " + d.name;
+        return false;
+      }
     } else if (word.rfind("order=", 0) == 0) {
       std::string rest = word.substr(6);
       std::replace(rest.begin(), rest.end(), ',', ' ');
@@ -370,7 +380,15 @@ bool describe(const std::string& name, const std::string& extras, Descriptor& d,
 
   if (!parseExtras(extras, d, error)) return false;
 
-  // Arguments: source, destination, size, family values.
+  // Arguments: source, destination, size, family values; a frame source
+  // is pointer, region, frame size, step.
+  if (d.frameSource) {
+    d.slots = {{Role::SrcPtr}, {Role::SrcRegion}, {Role::Size}, {Role::SrcStep}};
+    addSideSlots(d, d.dst, Role::DstPtr, Role::DstPlanes, Role::DstStep, Role::DstSteps);
+    for (int i = 0; i < int(d.extras.size()); ++i) d.slots.push_back({Role::Extra, 0, i});
+    if (d.scratchRows > 0) d.slots.insert(d.slots.end(), {{Role::Scratch}, {Role::ScratchStep}});
+    return true;
+  }
   if (d.inPlace) {
     addSideSlots(d, d.src, Role::SrcDstPtr, Role::SrcDstPlanes, Role::SrcDstStep, Role::SrcDstStep);
   } else {
@@ -382,6 +400,7 @@ bool describe(const std::string& name, const std::string& extras, Descriptor& d,
   d.slots.push_back({Role::Size});
   for (int i = 0; i < int(d.extras.size()); ++i)
     if (!d.extras[i].beforeSize) d.slots.push_back({Role::Extra, 0, i});
+  if (d.scratchRows > 0) d.slots.insert(d.slots.end(), {{Role::Scratch}, {Role::ScratchStep}});
   return true;
 }
 
@@ -453,7 +472,8 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
       Buffer b;
       b.geometry = planeGeometry(side, p, w, h);
       b.step = b.geometry.rowBytes + padBytes;
-      b.pitch = d.stepsInSamples ? b.step / b.geometry.sampleBytes * b.geometry.sampleBytes : b.step;
+      const bool inSamples = d.stepsInSamples && !(sideIndex == 0 && d.srcStepInBytes);
+      b.pitch = inSamples ? b.step / b.geometry.sampleBytes * b.geometry.sampleBytes : b.step;
       const int rows = std::max(b.geometry.rows, 1);
       const size_t total = size_t(kGuard) * 2 + size_t(offset) + size_t(b.step) * rows + 64;
       b.bytes.assign(total, kGuardByte);
@@ -470,6 +490,16 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
     addSide(d.src, 0);
     addSide(d.dst, 1);
   }
+  if (d.scratchRows > 0) {
+    // Every byte of the rows belongs to the call; guards lie outside them.
+    Buffer b;
+    b.step = (w + d.scratchPad) * sampleBytes(d.src.sample) + padBytes;
+    b.pitch = b.step;
+    b.geometry = PlaneGeometry{b.step, d.scratchRows, 1};
+    b.bytes.assign(size_t(kGuard) * 2 + size_t(offset) + size_t(b.step) * d.scratchRows + 64, kGuardByte);
+    b.side = 3;
+    buffers_.push_back(std::move(b));
+  }
   for (const Extra& e : d.extras) {
     std::vector<float> values;
     if (e.kind == ArgKind::Pointer) values.assign(size_t(std::max(e.good, 4.0)) / 4 + 1, 0.25f);
@@ -481,6 +511,7 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
     const uintptr_t mis = reinterpret_cast<uintptr_t>(base) & 63u;
     base += (64 - mis) & 63u;
     b.first = base + offset;
+    if (b.side == 3) continue;
     if (b.side == 0) {
       srcPlanes_.push_back(b.first);
       srcSteps_.push_back(b.step);
@@ -570,6 +601,15 @@ std::vector<Arg> Workspace::arguments(const std::vector<double>* extraValues) {
       case Role::DstStep:
       case Role::SrcDstStep: args.push_back(intArg(bufferOf(sideOf(s.role), s.plane)->step)); break;
       case Role::SrcSteps: args.push_back(pointerArg(srcSteps_.data())); break;
+      case Role::SrcRegion: {
+        Arg a;
+        a.kind = ArgKind::Region;
+        a.region = CfaRegion{0, 0, size_.width, size_.height};
+        args.push_back(a);
+        break;
+      }
+      case Role::Scratch: args.push_back(pointerArg(bufferOf(3, 0)->first)); break;
+      case Role::ScratchStep: args.push_back(intArg(bufferOf(3, 0)->step)); break;
       case Role::DstSteps: args.push_back(pointerArg(dstSteps_.data())); break;
       case Role::Size: {
         Arg a;
@@ -608,7 +648,8 @@ std::string Workspace::checkGuards() const {
     const uint8_t* hi = lo + b.bytes.size();
     auto describeAt = [&](const uint8_t* p) {
       std::ostringstream m;
-      m << (b.side == 0 ? "source" : b.side == 1 ? "destination" : "in-place image") << " plane " << b.plane
+      m << (b.side == 0 ? "source" : b.side == 1 ? "destination" : b.side == 2 ? "in-place image" : "scratch")
+        << " plane " << b.plane
         << ": byte at offset " << (p - b.first) << " from the region's start changed";
       return m.str();
     };

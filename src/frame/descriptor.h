@@ -69,8 +69,11 @@ struct CheckStage {
 };
 
 // Argument roles in prototype order.
+// A colour filter array source is a frame: its pointer, the region to
+// convert (SrcRegion), the frame's size and its step. Scratch and
+// ScratchStep are a caller-owned work area that nobody checks.
 enum class Role { SrcPtr, SrcPlanes, SrcStep, SrcSteps, DstPtr, DstPlanes, DstStep, DstSteps, SrcDstPtr,
-                  SrcDstPlanes, SrcDstStep, Size, Extra };
+                  SrcDstPlanes, SrcDstStep, Size, Extra, SrcRegion, Scratch, ScratchStep };
 struct ArgSlot {
   Role role;
   int plane = 0;   // for P2: 0 luma, 1 chroma
@@ -104,6 +107,13 @@ struct Descriptor {
   bool writesAlpha = false;     // an AC4 destination's fourth channel is written
   bool checksSteps = false;
   bool stepsInSamples = false;  // byte steps are cut down to whole samples
+  bool srcStepInBytes = false;  // ... except the source's
+  // The source is a frame given with a region (the whole frame in a
+  // workspace); the size argument is the frame's.
+  bool frameSource = false;
+  // Caller scratch after the family values: scratchRows rows, each of
+  // (width + scratchPad) source samples.
+  int scratchRows = 0, scratchPad = 0;
   void (*impl)() = nullptr;
   Invoker invoke = nullptr;
   std::vector<ArgKind> prototype;  // kinds of the prototype's parameters
@@ -147,7 +157,7 @@ class Workspace {
     PlaneGeometry geometry{};
     bool isSource = false;
     bool isDestination = false;
-    int side = 0;    // 0 source, 1 destination, 2 in place
+    int side = 0;    // 0 source, 1 destination, 2 in place, 3 scratch
     int plane = 0;
   };
 
@@ -157,6 +167,7 @@ class Workspace {
   void fillRandom(uint32_t seed);
   void fillDestinations(uint8_t value);
   // Arguments in prototype order; `extraValues` replaces the good values.
+  // A frame source passes the whole frame as its region.
   std::vector<Arg> arguments(const std::vector<double>* extraValues = nullptr);
   // The plane-pointer array of a side (0 source, 1 destination, 2 in place),
   // which `arguments` passes by address.

@@ -28,7 +28,9 @@ ArgKind slotKind(const Descriptor& d, const ArgSlot& s) {
   switch (s.role) {
     case Role::SrcStep:
     case Role::DstStep:
-    case Role::SrcDstStep: return ArgKind::Int32;
+    case Role::SrcDstStep:
+    case Role::ScratchStep: return ArgKind::Int32;
+    case Role::SrcRegion: return ArgKind::Region;
     case Role::Size: return ArgKind::Size;
     case Role::Extra: return d.extras[s.extra].kind;
     default: return ArgKind::Pointer;
