@@ -203,6 +203,12 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
         error = "bad min= in extras of " + d.name;
         return false;
       }
+    } else if (word.rfind("mult=", 0) == 0) {
+      if (std::sscanf(word.c_str() + 5, "%dx%d", &d.multWidth, &d.multHeight) != 2 || d.multWidth < 1 ||
+          d.multHeight < 1) {
+        error = "bad mult= in extras of " + d.name;
+        return false;
+      }
     } else if (word == "warn") {
       d.warnsOdd = true;
     } else if (word == "steps") {

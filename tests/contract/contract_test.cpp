@@ -80,13 +80,21 @@ std::vector<Failure> failuresOf(const Descriptor& d, const CheckStage& stage) {
             if (arg.kind == ArgKind::Size) arg.size = s;
         };
       };
-      out.push_back({"width 0", StatusSizeError, setSize(0, INT32_MIN)});
-      out.push_back({"height 0", StatusSizeError, setSize(INT32_MIN, 0)});
-      out.push_back({"negative width", StatusSizeError, setSize(-7, INT32_MIN)});
-      out.push_back({"negative height", StatusSizeError, setSize(INT32_MIN, -3)});
+      if (d.minWidth > 0) {
+        out.push_back({"width 0", StatusSizeError, setSize(0, INT32_MIN)});
+        out.push_back({"negative width", StatusSizeError, setSize(-7, INT32_MIN)});
+      }
+      if (d.minHeight > 0) {
+        out.push_back({"height 0", StatusSizeError, setSize(INT32_MIN, 0)});
+        out.push_back({"negative height", StatusSizeError, setSize(INT32_MIN, -3)});
+      }
       if (d.minWidth > 1) out.push_back({"width below minimum", StatusSizeError, setSize(d.minWidth - 1, INT32_MIN)});
       if (d.minHeight > 1)
         out.push_back({"height below minimum", StatusSizeError, setSize(INT32_MIN, d.minHeight - 1)});
+      if (d.multWidth > 1)
+        out.push_back({"width off its multiple", StatusSizeError, setSize(d.validSize(9, 1).width + 1, INT32_MIN)});
+      if (d.multHeight > 1)
+        out.push_back({"height off its multiple", StatusSizeError, setSize(INT32_MIN, d.validSize(1, 4).height + 1)});
       break;
     }
     case Check::Step:
@@ -117,7 +125,7 @@ std::vector<Failure> failuresOf(const Descriptor& d, const CheckStage& stage) {
   return out;
 }
 
-ImageSize workingSize(const Descriptor& d) { return ImageSize{std::max(d.minWidth, 9), std::max(d.minHeight, 4)}; }
+ImageSize workingSize(const Descriptor& d) { return d.validSize(9, 4); }
 
 // Runs one call with the given failures applied; the status must be
 // `expected` and no byte of any buffer may change.
@@ -142,6 +150,22 @@ TEST_P(Contract, EachCheckRejectsAndWritesNothing) {
   const Descriptor& d = *GetParam();
   for (const CheckStage& stage : d.order)
     for (const Failure& f : failuresOf(d, stage)) expectRejected(d, {&f}, f.status);
+}
+
+TEST_P(Contract, UncheckedHeightDoesNoRows) {
+  const Descriptor& d = *GetParam();
+  if (d.minHeight > 0) GTEST_SKIP() << "checks its height";
+  for (int height : {0, -2}) {
+    ImageSize size = d.validSize(9, 1);
+    Workspace w(d, size, 3, 1);
+    w.fillRandom(5);
+    std::vector<Arg> args = w.arguments();
+    for (Arg& a : args)
+      if (a.kind == ArgKind::Size) a.size.height = height;
+    const auto before = w.snapshot();
+    EXPECT_EQ(int(w.call(args)), int(StatusOk));
+    EXPECT_TRUE(before == w.snapshot());
+  }
 }
 
 TEST_P(Contract, ChecksRunInOrder) {
@@ -192,7 +216,7 @@ TEST_P(Contract, WritesOnlyTheRegion) {
   const Descriptor& d = *GetParam();
   const int sizes[][2] = {{0, 0}, {1, 0}, {0, 1}, {1, 1}, {7, 3}, {16, 2}, {33, 5}, {70, 1}};
   for (const auto& s : sizes) {
-    const ImageSize size{d.minWidth + s[0], d.minHeight + s[1]};
+    const ImageSize size = d.validSize(d.minWidth + s[0], d.minHeight + s[1]);
     for (int pad : {0, 13})
       for (int offset : {0, 3}) expectGuardsKept(d, size, pad, offset);
   }
@@ -201,7 +225,7 @@ TEST_P(Contract, WritesOnlyTheRegion) {
 TEST_P(Contract, ZeroStepsPassWhereStepsAreNotChecked) {
   const Descriptor& d = *GetParam();
   if (d.checksSteps || !d.region) GTEST_SKIP() << "checks its steps or has none";
-  const ImageSize size{std::max(d.minWidth, 5), std::max(d.minHeight, 4)};
+  const ImageSize size = d.validSize(5, 4);
   Workspace w(d, size, 0, 0);
   w.fillRandom(3);
   std::vector<Arg> args = w.arguments();
