@@ -105,33 +105,52 @@ TEST(FillSources, ChannelOrderAlphaAndSampleTypes) {
   }
 }
 
+TEST(FillSources, LumaChromaFormatsTakeBt601) {
+  auto eight = [](const std::string& format, int r, int g, int b) {
+    const auto c = sourceChannels(format, uint16_t(r * 257), uint16_t(g * 257), uint16_t(b * 257));
+    return std::vector<int>{to8(c[0]), to8(c[1]), to8(c[2])};
+  };
+  EXPECT_EQ(eight("YCbCr420", 255, 255, 255), (std::vector<int>{235, 128, 128}));
+  EXPECT_EQ(eight("YCbCr", 0, 0, 0), (std::vector<int>{16, 128, 128}));
+  EXPECT_EQ(eight("CbYCr422", 255, 0, 0), (std::vector<int>{81, 90, 240}));
+  EXPECT_EQ(eight("YCrCb420", 255, 0, 0), (std::vector<int>{81, 240, 90}));
+  EXPECT_EQ(eight("YUV422", 255, 255, 255), (std::vector<int>{255, 128, 128}));
+  EXPECT_EQ(eight("YUV", 0, 0, 255), (std::vector<int>{29, 239, 102}));
+  EXPECT_EQ(eight("BGR", 1, 2, 3), (std::vector<int>{3, 2, 1}));
+  EXPECT_EQ(eight("HLS", 1, 2, 3), (std::vector<int>{1, 2, 3}));
+}
+
 TEST(FillSources, ChromaPlanesStreamsAndPackedWords) {
   const Picture p = patterned(5, 3);
-  auto mean = [&](int c, int x0, int y0, int fx, int fy) {
+  auto channel = [&](const std::string& format, int k, int x, int y) {
+    return int(sourceChannels(format, p.wide(x, y, 0), p.wide(x, y, 1), p.wide(x, y, 2))[k]);
+  };
+  auto mean = [&](const std::string& format, int k, int x0, int y0, int fx, int fy) {
     int sum = 0, n = 0;
     for (int y = y0; y < std::min(y0 + fy, 3); ++y)
-      for (int x = x0; x < std::min(x0 + fx, 5); ++x, ++n) sum += p.at(x, y, c);
-    return to8((sum * 257 + n / 2) / n);  // the mean on the 16-bit scale
+      for (int x = x0; x < std::min(x0 + fx, 5); ++x, ++n) sum += channel(format, k, x, y);
+    return to8((sum + n / 2) / n);  // the mean on the 16-bit scale
   };
   {  // 4:2:0 planes: luma full, chroma block means, the odd column and row alone
     Workspace ws(described("zeliYCbCr420ToRGB_8u_P3C3R"), {5, 3});
     fillSources(ws, p, -1);
-    EXPECT_EQ(sampleAt<uint8_t>(ws, 0, 0, 2, 4), p.at(4, 2, 0));
-    EXPECT_EQ(sampleAt<uint8_t>(ws, 0, 1, 0, 0), mean(1, 0, 0, 2, 2));
-    EXPECT_EQ(sampleAt<uint8_t>(ws, 0, 2, 1, 2), mean(2, 4, 2, 2, 2));
+    EXPECT_EQ(sampleAt<uint8_t>(ws, 0, 0, 2, 4), to8(channel("YCbCr420", 0, 4, 2)));
+    EXPECT_EQ(sampleAt<uint8_t>(ws, 0, 1, 0, 0), mean("YCbCr420", 1, 0, 0, 2, 2));
+    EXPECT_EQ(sampleAt<uint8_t>(ws, 0, 2, 1, 2), mean("YCbCr420", 2, 4, 2, 2, 2));
   }
   {  // two planes: chroma pairs
     Workspace ws(described("zeliYCbCr420ToRGB_8u_P2C3R"), {5, 3});
     fillSources(ws, p, -1);
-    EXPECT_EQ(sampleAt<uint8_t>(ws, 0, 1, 0, 2), mean(1, 2, 0, 2, 2));
-    EXPECT_EQ(sampleAt<uint8_t>(ws, 0, 1, 0, 3), mean(2, 2, 0, 2, 2));
+    EXPECT_EQ(sampleAt<uint8_t>(ws, 0, 1, 0, 2), mean("YCbCr420", 1, 2, 0, 2, 2));
+    EXPECT_EQ(sampleAt<uint8_t>(ws, 0, 1, 0, 3), mean("YCbCr420", 2, 2, 0, 2, 2));
   }
   {  // 4:2:2 streams: luma first, or chroma first
     Workspace ws(described("zeliYCbCr422ToRGB_8u_C2C3R"), {5, 3});
     fillSources(ws, p, -1);
-    const int yc[] = {p.at(2, 1, 0), mean(1, 2, 1, 2, 1), p.at(3, 1, 0), mean(2, 2, 1, 2, 1)};
+    const int yc[] = {to8(channel("YCbCr", 0, 2, 1)), mean("YCbCr", 1, 2, 1, 2, 1), to8(channel("YCbCr", 0, 3, 1)),
+                      mean("YCbCr", 2, 2, 1, 2, 1)};
     for (int i = 0; i < 4; ++i) EXPECT_EQ(sampleAt<uint8_t>(ws, 0, 0, 1, 4 + i), yc[i]) << i;
-    EXPECT_EQ(sampleAt<uint8_t>(ws, 0, 0, 1, 9), mean(1, 4, 1, 2, 1));  // the odd last pixel
+    EXPECT_EQ(sampleAt<uint8_t>(ws, 0, 0, 1, 9), mean("YCbCr", 1, 4, 1, 2, 1));  // the odd last pixel
     Workspace wc(described("zeliCbYCr422ToRGB_8u_C2C3R"), {5, 3});
     fillSources(wc, p, -1);
     const int cy[] = {yc[1], yc[0], yc[3], yc[2]};
@@ -227,8 +246,11 @@ TEST(DestinationImages, PlanesAndStreamsAreSplitAndNamed) {
   ASSERT_EQ(o.images.size(), 3u);
   EXPECT_EQ(o.images[0].suffix, "_Y");
   EXPECT_EQ(o.images[1].suffix, "_Cr");
-  for (int x = 0; x < 5; ++x) EXPECT_EQ(o.images[0].picture.at(x, 2, 0), p.at(x, 2, 0));
-  EXPECT_EQ(o.images[1].picture.at(2, 0, 0), p.at(4, 0, 1));
+  auto channel = [&](int k, int x, int y) {
+    return to8(sourceChannels("YCrCb422", p.wide(x, y, 0), p.wide(x, y, 1), p.wide(x, y, 2))[k]);
+  };
+  for (int x = 0; x < 5; ++x) EXPECT_EQ(o.images[0].picture.at(x, 2, 0), channel(0, x, 2));
+  EXPECT_EQ(o.images[1].picture.at(2, 0, 0), channel(1, 4, 0));
   // In place: the image read back is what went in.
   Workspace ip(described("zeliGammaFwd_8u_C3IR"), {5, 3});
   fillSources(ip, p, -1);

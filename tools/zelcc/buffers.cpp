@@ -1,6 +1,7 @@
 #include "buffers.h"
 
 #include <algorithm>
+#include <array>
 #include <cctype>
 #include <cmath>
 #include <cstring>
@@ -38,6 +39,47 @@ std::vector<std::string> componentNames(const std::string& format, const std::st
 }
 
 bool blueFirst(const std::string& format) { return format.rfind("BGR", 0) == 0 || format.rfind("SBGR", 0) == 0; }
+
+namespace {
+
+// How a source format takes a colour.
+enum class Encoding { Rgb, Bgr, Video, VideoCrCb, Yuv };
+
+Encoding encodingOf(const std::string& format) {
+  std::string base;
+  for (char c : format)
+    if (!std::isdigit(static_cast<unsigned char>(c))) base += c;
+  if (base == "YCbCr" || base == "CbYCr") return Encoding::Video;
+  if (base == "YCrCb") return Encoding::VideoCrCb;
+  if (base == "YUV") return Encoding::Yuv;
+  return blueFirst(format) ? Encoding::Bgr : Encoding::Rgb;
+}
+
+std::array<uint16_t, 3> encode(Encoding e, uint16_t r, uint16_t g, uint16_t b) {
+  if (e == Encoding::Rgb) return {r, g, b};
+  if (e == Encoding::Bgr) return {b, g, r};
+  const double R = r / 65535.0, G = g / 65535.0, B = b / 65535.0;
+  const double luma = 0.299 * R + 0.587 * G + 0.114 * B;
+  double y, u, v;
+  if (e == Encoding::Yuv) {
+    y = luma;
+    u = 0.5 + 0.492 * (B - luma);
+    v = 0.5 + 0.877 * (R - luma);
+  } else {  // luma 16..235, chroma 16..240 around 128, of 255
+    y = (16.0 + 219.0 * luma) / 255.0;
+    u = (128.0 + 112.0 * (B - luma) / 0.886) / 255.0;
+    v = (128.0 + 112.0 * (R - luma) / 0.701) / 255.0;
+  }
+  auto wide = [](double x) { return uint16_t(std::lround(std::clamp(x, 0.0, 1.0) * 65535.0)); };
+  if (e == Encoding::VideoCrCb) return {wide(y), wide(v), wide(u)};
+  return {wide(y), wide(u), wide(v)};
+}
+
+}  // namespace
+
+std::array<uint16_t, 3> sourceChannels(const std::string& format, uint16_t r, uint16_t g, uint16_t b) {
+  return encode(encodingOf(format), r, g, b);
+}
 
 namespace {
 
@@ -119,19 +161,18 @@ PackedFields packedFields(const std::string& format) {
   return f;
 }
 
-// The picture as the source side sees it: components in memory order.
+// The picture as the source side sees it: components in the format's order.
 class SourceView {
  public:
-  SourceView(const Picture& p, const Side& side, int grid)
-      : p_(p), blue_(blueFirst(side.format)), grid_(grid) {}
+  SourceView(const Picture& p, const Side& side, int grid) : p_(p), encoding_(encodingOf(side.format)), grid_(grid) {}
   int width() const { return p_.width; }
   int height() const { return p_.height; }
-  // Component k (0..2 in the format's memory order, 3 alpha) at (x, y).
+  // Component k (0..2 in the format's order, 3 alpha) at (x, y).
   uint16_t component(int x, int y, int k) const {
     x = std::clamp(x, 0, p_.width - 1);
     y = std::clamp(y, 0, p_.height - 1);
     if (k == 3) return p_.wide(x, y, 3);
-    return p_.wide(x, y, blue_ ? 2 - k : k);
+    return encode(encoding_, p_.wide(x, y, 0), p_.wide(x, y, 1), p_.wide(x, y, 2))[k];
   }
   // Red, green or blue (0, 1, 2) at (x, y), whatever the format.
   uint16_t colour(int x, int y, int meaning) const {
@@ -156,7 +197,7 @@ class SourceView {
 
  private:
   const Picture& p_;
-  bool blue_;
+  Encoding encoding_;
   int grid_;
 };
 

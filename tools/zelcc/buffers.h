@@ -3,6 +3,8 @@
 // type, destinations turned into pictures a viewer can show.
 #pragma once
 
+#include <array>
+#include <cstdint>
 #include <string>
 #include <vector>
 
@@ -20,15 +22,22 @@ std::vector<std::string> componentNames(const std::string& format, const std::st
 // Whether a three-channel format keeps blue first in memory.
 bool blueFirst(const std::string& format);
 
+// The three channels a source format takes from a colour, on the 16-bit
+// scale, in the format's order (luma first for luma-chroma formats): RGB
+// as it is, BGR blue first, YCbCr (any order, any subsampling) as
+// video-range BT.601, YUV as analog-style BT.601 centred on half scale.
+// Other formats (YCC, YCoCg, HLS, Lab ...) take red, green and blue as
+// their three channels.
+std::array<uint16_t, 3> sourceChannels(const std::string& format, uint16_t r, uint16_t g, uint16_t b);
+
 // Whether the export reads a Bayer mosaic, and which grid kind its family
 // values select.
 bool readsMosaic(const meta::Descriptor& d);
 int mosaicGrid(const meta::Descriptor& d, const std::vector<double>& familyValues);
 
 // Fills every source buffer (the in-place image included) of `ws` from the
-// picture, which has the workspace's size. Colour goes in as the format's
-// channel order asks (BGR formats blue first, other three-channel formats
-// take red, green, blue as their three channels); one-channel sources take
+// picture, which has the workspace's size. Colour goes in as
+// sourceChannels gives it; one-channel sources take
 // luma, or the Bayer mosaic of grid `grid` (>= 0); chroma planes and 4:2:2
 // streams take block means; packed words are packed from 8-bit RGB. Samples
 // go in by type: 8u as is, 8s and 16s biased, 16u scaled by 257, 32s like

@@ -98,7 +98,9 @@ std::string argumentName(const Descriptor& d, const meta::ArgSlot& s, size_t ind
     case Role::SrcDstStep: return "srcDstStep";
     case Role::Size: return "size";
     case Role::Extra: return d.extras[s.extra].name;
-    default: return "argument" + std::to_string(index + 1);
+    default:
+      if (index < d.prototype.size() && d.prototype[index] == ArgKind::Region) return "srcRegion";
+      return "argument" + std::to_string(index + 1);
   }
 }
 
