@@ -77,6 +77,34 @@ std::array<uint16_t, 3> encode(Encoding e, uint16_t r, uint16_t g, uint16_t b) {
 
 }  // namespace
 
+std::array<int32_t, 3> ycocgPlanes(const YCoCgForm& form, uint16_t r, uint16_t g, uint16_t b) {
+  int32_t R, G, B;
+  if (form.byteColour) {
+    auto to8 = [](uint16_t w) { return int32_t((uint32_t(w) * 255 + 32767) / 65535); };
+    R = to8(r), G = to8(g), B = to8(b);
+  } else {
+    // Signed 16-bit colour, kept off -32768 so that no plain chroma leaves 16 bits.
+    auto to16 = [](uint16_t w) { return std::max(int32_t(w) - 32768, -32767); };
+    R = to16(r), G = to16(g), B = to16(b);
+  }
+  int32_t y, co, cg;
+  if (form.lifting) {
+    co = R - B;
+    const int32_t t = B + (co >> 1);
+    cg = G - t;
+    y = t + (cg >> 1);
+  } else {
+    y = (R + 2 * G + B + 2) >> 2;
+    co = (R - B + 1) >> 1;
+    cg = (2 * G - R - B + 2) >> 2;
+  }
+  if (form.bytePlanes) {
+    co = std::min(co + 128, 255);
+    cg = std::clamp(cg + 128, 0, 255);
+  }
+  return {y, co, cg};
+}
+
 std::array<uint16_t, 3> sourceChannels(const std::string& format, uint16_t r, uint16_t g, uint16_t b) {
   return encode(encodingOf(format), r, g, b);
 }
@@ -164,7 +192,23 @@ PackedFields packedFields(const std::string& format) {
 // The picture as the source side sees it: components in the format's order.
 class SourceView {
  public:
-  SourceView(const Picture& p, const Side& side, int grid) : p_(p), encoding_(encodingOf(side.format)), grid_(grid) {}
+  SourceView(const Picture& p, const Descriptor& d, int grid)
+      : p_(p), encoding_(encodingOf(d.src.format)), grid_(grid) {
+    std::string base;
+    for (char c : d.src.format)
+      if (!std::isdigit(static_cast<unsigned char>(c))) base += c;
+    ycocg_ = base == "YCoCg";
+    form_.lifting = d.qualifier == "Rev";
+    form_.byteColour = d.dst.sample == Sample::U8;
+    form_.bytePlanes = d.src.sample == Sample::U8;
+  }
+  // YCoCg planes take the transform's own integers, not a scaled colour.
+  bool integerPlanes() const { return ycocg_; }
+  int32_t integer(int x, int y, int k) const {
+    x = std::clamp(x, 0, p_.width - 1);
+    y = std::clamp(y, 0, p_.height - 1);
+    return ycocgPlanes(form_, p_.wide(x, y, 0), p_.wide(x, y, 1), p_.wide(x, y, 2))[k];
+  }
   int width() const { return p_.width; }
   int height() const { return p_.height; }
   // Component k (0..2 in the format's order, 3 alpha) at (x, y).
@@ -199,7 +243,34 @@ class SourceView {
   const Picture& p_;
   Encoding encoding_;
   int grid_;
+  bool ycocg_ = false;
+  YCoCgForm form_;
 };
+
+// An integer stored as the sample type takes it: bytes clamped, 16 bits
+// wrapped (as the transforms wrap), 32 bits whole.
+void putInteger(uint8_t* at, Sample s, int32_t v) {
+  switch (s) {
+    case Sample::S16:
+    case Sample::U16: {
+      const uint16_t w = uint16_t(uint32_t(v));
+      std::memcpy(at, &w, 2);
+      return;
+    }
+    case Sample::S32: std::memcpy(at, &v, 4); return;
+    case Sample::F32: {
+      const float f = float(v);
+      std::memcpy(at, &f, 4);
+      return;
+    }
+    case Sample::F64: {
+      const double f = v;
+      std::memcpy(at, &f, 8);
+      return;
+    }
+    default: *at = uint8_t(std::clamp(v, 0, 255)); return;
+  }
+}
 
 void chromaFactors(Chroma c, int& fx, int& fy) {
   fx = fy = 1;
@@ -223,6 +294,15 @@ void fillBuffer(Workspace::Buffer& b, const Side& side, const SourceView& v) {
     auto put = [&](int i, uint16_t wide) {
       if (i >= 0 && i < samplesPerRow) putSample(row + size_t(i) * bytes, side.sample, wide);
     };
+    if (v.integerPlanes() && !side.packedWord && side.layout != Layout::C2 && side.layout != Layout::P2) {
+      const int n = side.isPlanar() ? 1 : side.channels();
+      for (int i = 0; i < samplesPerRow; ++i) {
+        const int k = side.isPlanar() ? b.plane : i % n;
+        const int x = i / n;
+        putInteger(row + size_t(i) * bytes, side.sample, k < 3 ? v.integer(x, y, k) : 0);
+      }
+      continue;
+    }
     if (side.sample == Sample::U1) {  // packed bits, first pixel in the high bit
       std::memset(row, 0, b.geometry.rowBytes);
       for (int x = 0; x < width && x / 8 < b.geometry.rowBytes; ++x)
@@ -458,7 +538,7 @@ void readBuffer(const Workspace::Buffer& b, const Side& side, const Descriptor& 
 
 void fillSources(Workspace& ws, const Picture& picture, int grid) {
   const Descriptor& d = ws.descriptor();
-  const SourceView view(picture, d.src, grid);
+  const SourceView view(picture, d, grid);
   for (Workspace::Buffer& b : ws.buffers())
     if (b.isSource) fillBuffer(b, d.src, view);
 }
@@ -490,7 +570,27 @@ Outputs destinationImages(Workspace& ws, const std::vector<double>& familyValues
     note << "float samples span " << lo << " to " << hi << "; shown stretched over 0..255";
     out.note = note.str();
   }
+  // Signed integers on a scale far below their type's (the planes of an
+  // 8-bit YCoCg in 16 bits) are stretched over their range too.
+  float ilo = std::numeric_limits<float>::infinity(), ihi = -ilo;
+  for (const RawImage& r : raws)
+    if (r.sample == Sample::S16 || r.sample == Sample::S32)
+      for (float v : r.values) {
+        ilo = std::min(ilo, v);
+        ihi = std::max(ihi, v);
+      }
+  const bool stretchIntegers = ilo < ihi && ihi - ilo < 4096.0f;
+  if (stretchIntegers) {
+    std::ostringstream note;
+    note << "signed samples span " << ilo << " to " << ihi << "; shown stretched over 0..255";
+    out.note = note.str();
+  }
   for (RawImage& r : raws) {
+    const bool signedInteger = r.sample == Sample::S16 || r.sample == Sample::S32;
+    if (signedInteger && stretchIntegers) {
+      for (float& v : r.values) v = std::round((v - ilo) * 255.0f / (ihi - ilo));
+      r.sample = Sample::U8;
+    }
     const bool wide = r.sample == Sample::U16 || r.sample == Sample::S16 || r.sample == Sample::S32;
     Picture p(r.width, r.height, r.channels, wide ? 16 : 8);
     for (size_t i = 0; i < r.values.size(); ++i) {

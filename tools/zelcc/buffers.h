@@ -26,9 +26,19 @@ bool blueFirst(const std::string& format);
 // scale, in the format's order (luma first for luma-chroma formats): RGB
 // as it is, BGR blue first, YCbCr (any order, any subsampling) as
 // video-range BT.601, YUV as analog-style BT.601 centred on half scale.
-// Other formats (YCC, YCoCg, HLS, Lab ...) take red, green and blue as
-// their three channels.
+// Other formats (YCC, HLS, Lab ...) take red, green and blue as their
+// three channels; YCoCg planes take the transform's integers (ycocgPlanes).
 std::array<uint16_t, 3> sourceChannels(const std::string& format, uint16_t r, uint16_t g, uint16_t b);
+
+// The planes of YCoCg for a colour given on the 16-bit scale: the lifting
+// transform or the plain one, on the 8-bit colour scale (colour side of
+// bytes) or the signed 16-bit scale, byte planes with chroma offset by 128.
+struct YCoCgForm {
+  bool lifting = false;
+  bool byteColour = true;
+  bool bytePlanes = false;
+};
+std::array<int32_t, 3> ycocgPlanes(const YCoCgForm& form, uint16_t r, uint16_t g, uint16_t b);
 
 // Whether the export reads a Bayer mosaic, and which grid kind its family
 // values select.
@@ -56,8 +66,9 @@ struct Outputs {
 
 // The destination buffers (or the in-place image) as pictures: 8-bit and
 // 16-bit samples as they are (signed ones biased to unsigned), 32s biased
-// and clamped to 16 bits, floats from 0..1 to 8 bits (or their own range,
-// when they leave 0..1), packed words unpacked to 8-bit RGB, BGR turned to
+// and clamped to 16 bits, signed samples spanning less than 4096 stretched
+// over 8 bits, floats from 0..1 to 8 bits (or their own range, when they
+// leave 0..1), packed words unpacked to 8-bit RGB, BGR turned to
 // RGB, one-bit pixels to 0 and 255, 4:2:2 streams and two-plane chroma split
 // into planes.
 Outputs destinationImages(meta::Workspace& ws, const std::vector<double>& familyValues);
