@@ -1,8 +1,6 @@
 // The test card at any size, and the Bayer mosaic views of it.
 #include <gtest/gtest.h>
 
-#include <set>
-
 #include "test_card.h"
 
 namespace {
@@ -29,15 +27,10 @@ TEST(TestCard, HasItsBandsAtEverySize) {
   EXPECT_EQ(p.at(0, ramp, 0), 0);
   EXPECT_EQ(p.at(639, ramp, 0), 65535);
   for (int x = 1; x < 640; ++x) ASSERT_GT(p.at(x, ramp, 0), p.at(x - 1, ramp, 0));
-  // Finest detail: neighbouring columns, rows and checker squares differ.
+  // Finest detail: neighbouring columns and rows differ.
   const int detail = 480 * 12 / 20;
   EXPECT_NE(p.at(10, detail, 0), p.at(11, detail, 0));
-  EXPECT_NE(p.at(330, detail, 0), p.at(331, detail, 0));
   EXPECT_NE(p.at(250, detail, 0), p.at(250, detail + 1, 0));
-  // Eleven gray steps at the bottom.
-  std::set<uint16_t> steps;
-  for (int x = 0; x < 640; ++x) steps.insert(p.at(x, 479, 1));
-  EXPECT_EQ(steps.size(), 11u);
 }
 
 TEST(TestCard, MosaicTakesTheColourOfEachGridPlace) {

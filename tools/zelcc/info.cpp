@@ -4,6 +4,7 @@
 #include <iomanip>
 #include <sstream>
 
+#include "buffers.h"
 #include "options.h"
 
 namespace zel::tool {
@@ -164,6 +165,7 @@ std::string describeExport(const Descriptor& d) {
   o << "  minimum size  " << d.minWidth << "x" << d.minHeight << "\n";
   o << "  odd sizes     " << (d.warnsOdd ? "may return StatusOddSizeWarning after the work" : "no warning") << "\n";
   if (d.writesAlpha) o << "  alpha         the destination's fourth channel is written\n";
+  if (readsMosaic(d)) o << "  run input     a Bayer mosaic of the picture, laid out as the grid argument says\n";
 
   o << "  arguments\n";
   for (size_t i = 0; i < d.slots.size(); ++i) {
