@@ -252,8 +252,10 @@ Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
           cb[k] = tcb[k];
           cr[k] = tcr[k];
         }
-        convertChroma(m.src.scheme, m.dst.scheme, r.cb, tcb, dstChromaRows, n, nonTemporal);
-        convertChroma(m.src.scheme, m.dst.scheme, r.cr, tcr, dstChromaRows, n, nonTemporal);
+        // Staging stays in the cache: only stores into the planes stream.
+        const bool streamChroma = nonTemporal && m.dst.kind == Kind::Planes;
+        convertChroma(m.src.scheme, m.dst.scheme, r.cb, tcb, dstChromaRows, n, streamChroma);
+        convertChroma(m.src.scheme, m.dst.scheme, r.cr, tcr, dstChromaRows, n, streamChroma);
       }
       for (int k = 0; k < groupRows; ++k) {
         const int chromaSlot = dstChromaRows == 1 ? 0 : k;
