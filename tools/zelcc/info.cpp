@@ -133,11 +133,12 @@ std::string checkText(const Descriptor& d, const meta::CheckStage& c) {
   switch (c.check) {
     case meta::Check::NullTop: return "null pointers";
     case meta::Check::NullPlanes: return "null plane entries";
+    case meta::Check::SizePositive: return "size at least 1x1";
     case meta::Check::Size: return "size";
     case meta::Check::Step: return "steps";
     case meta::Check::Extra: return d.extras[c.extra].name;
+    default: return "check " + std::to_string(int(c.check));
   }
-  return "?";
 }
 
 }  // namespace
