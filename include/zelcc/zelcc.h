@@ -97,6 +97,61 @@ ZELCC_API Status zeliGrayToRGB_32f_C1C4R(const float* src, int srcStep, float* d
 /* ---- 16-bit packed RGB ---- */
 
 /* ---- YCoCg ---- */
+/* Interleaved BGR (RGB for the byte-plane pair) to and from planes Y, Co, Cg
+ * that share one step. `Rev` is the lifting transform that the inverse
+ * undoes exactly; `SBGR` samples are signed 16-bit. */
+ZELCC_API Status zeliBGRToYCoCg_8u16s_C3P3R(const uint8_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                            ImageSize size);
+ZELCC_API Status zeliBGRToYCoCg_8u16s_C4P3R(const uint8_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                            ImageSize size);
+ZELCC_API Status zeliBGRToYCoCg_Rev_8u16s_C3P3R(const uint8_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                                ImageSize size);
+ZELCC_API Status zeliBGRToYCoCg_Rev_8u16s_C4P3R(const uint8_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                                ImageSize size);
+ZELCC_API Status zeliRGBToYCoCg_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], int dstStep,
+                                         ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_16s32s_C3P3R(const int16_t* src, int srcStep, int32_t* const dst[3], int dstStep,
+                                              ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_16s32s_C4P3R(const int16_t* src, int srcStep, int32_t* const dst[3], int dstStep,
+                                              ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_16s_C3P3R(const int16_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                           ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_16s_C4P3R(const int16_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                           ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_Rev_16s32s_C3P3R(const int16_t* src, int srcStep, int32_t* const dst[3],
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_Rev_16s32s_C4P3R(const int16_t* src, int srcStep, int32_t* const dst[3],
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_Rev_16s_C3P3R(const int16_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                               ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_Rev_16s_C4P3R(const int16_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                               ImageSize size);
+ZELCC_API Status zeliYCoCgToBGR_16s8u_P3C3R(const int16_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                            ImageSize size);
+ZELCC_API Status zeliYCoCgToBGR_16s8u_P3C4R(const int16_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                            ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCoCgToBGR_Rev_16s8u_P3C3R(const int16_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                                ImageSize size);
+ZELCC_API Status zeliYCoCgToBGR_Rev_16s8u_P3C4R(const int16_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                                ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCoCgToRGB_8u_P3C3R(const uint8_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                         ImageSize size);
+ZELCC_API Status zeliYCoCgToSBGR_16s_P3C3R(const int16_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                           ImageSize size);
+ZELCC_API Status zeliYCoCgToSBGR_16s_P3C4R(const int16_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                           ImageSize size, int16_t alpha);
+ZELCC_API Status zeliYCoCgToSBGR_32s16s_P3C3R(const int32_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                              ImageSize size);
+ZELCC_API Status zeliYCoCgToSBGR_32s16s_P3C4R(const int32_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                              ImageSize size, int16_t alpha);
+ZELCC_API Status zeliYCoCgToSBGR_Rev_16s_P3C3R(const int16_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                               ImageSize size);
+ZELCC_API Status zeliYCoCgToSBGR_Rev_16s_P3C4R(const int16_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                               ImageSize size, int16_t alpha);
+ZELCC_API Status zeliYCoCgToSBGR_Rev_32s16s_P3C3R(const int32_t* const src[3], int srcStep, int16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCoCgToSBGR_Rev_32s16s_P3C4R(const int32_t* const src[3], int srcStep, int16_t* dst,
+                                                  int dstStep, ImageSize size, int16_t alpha);
 
 /* ---- HLS and HSV ---- */
 
