@@ -154,6 +154,50 @@ ZELCC_API Status zeliYCoCgToSBGR_Rev_32s16s_P3C4R(const int32_t* const src[3], i
                                                   int dstStep, ImageSize size, int16_t alpha);
 
 /* ---- HLS and HSV ---- */
+/* RGB or BGR to and from hue, lightness, saturation, in 32-bit float
+ * arithmetic. The RGB members use steps unchecked (16-bit and float steps
+ * count whole samples); the BGR members reject steps below 1. */
+ZELCC_API Status zeliRGBToHLS_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_AC4P4R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[4], int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_AP4C4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* dst, int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_AP4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* const dstPlanes[4],
+                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                     int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_AC4P4R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[4], int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_AP4C4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* dst, int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_AP4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* const dstPlanes[4],
+                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                     int dstStep, ImageSize size);
 
 /* ---- XYZ, LUV and Lab ---- */
 

@@ -207,6 +207,8 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       d.warnsOdd = true;
     } else if (word == "steps") {
       d.checksSteps = true;
+    } else if (word == "samplesteps") {
+      d.stepsInSamples = true;
     } else if (word == "alphawritten") {
       d.writesAlpha = true;
     } else if (word.rfind("order=", 0) == 0) {
@@ -419,6 +421,7 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
       Buffer b;
       b.geometry = planeGeometry(side, p, w, h);
       b.step = b.geometry.rowBytes + padBytes;
+      b.pitch = d.stepsInSamples ? b.step & -b.geometry.sampleBytes : b.step;
       const int rows = std::max(b.geometry.rows, 1);
       const size_t total = size_t(kGuard) * 2 + size_t(offset) + size_t(b.step) * rows + 64;
       b.bytes.assign(total, kGuardByte);
@@ -474,7 +477,7 @@ void Workspace::fillRandom(uint32_t seed) {
   for (Buffer& b : buffers_) {
     if (!b.isSource) continue;
     for (int y = 0; y < b.geometry.rows; ++y) {
-      uint8_t* row = b.first + size_t(y) * b.step;
+      uint8_t* row = b.first + size_t(y) * b.pitch;
       if (d_.src.sample == Sample::F32) {
         // Floats in 0..1, the range colour functions take.
         std::uniform_real_distribution<float> dist(0.0f, 1.0f);
@@ -492,7 +495,7 @@ void Workspace::fillRandom(uint32_t seed) {
 void Workspace::fillDestinations(uint8_t value) {
   for (Buffer& b : buffers_) {
     if (!b.isDestination || b.isSource) continue;
-    for (int y = 0; y < b.geometry.rows; ++y) std::memset(b.first + size_t(y) * b.step, value, b.geometry.rowBytes);
+    for (int y = 0; y < b.geometry.rows; ++y) std::memset(b.first + size_t(y) * b.pitch, value, b.geometry.rowBytes);
   }
 }
 
@@ -578,12 +581,12 @@ std::string Workspace::checkGuards() const {
       return m.str();
     };
     const int rows = b.geometry.rows;
-    const uint8_t* regionEnd = b.first + (rows > 0 ? size_t(rows - 1) * b.step + b.geometry.rowBytes : 0);
+    const uint8_t* regionEnd = b.first + (rows > 0 ? size_t(rows - 1) * b.pitch + b.geometry.rowBytes : 0);
     for (const uint8_t* p = lo; p < b.first; ++p)
       if (*p != kGuardByte) return describeAt(p);
     for (int y = 0; y + 1 < rows; ++y) {
-      const uint8_t* padStart = b.first + size_t(y) * b.step + b.geometry.rowBytes;
-      for (const uint8_t* p = padStart; p < b.first + size_t(y + 1) * b.step; ++p)
+      const uint8_t* padStart = b.first + size_t(y) * b.pitch + b.geometry.rowBytes;
+      for (const uint8_t* p = padStart; p < b.first + size_t(y + 1) * b.pitch; ++p)
         if (*p != kGuardByte) return describeAt(p);
     }
     for (const uint8_t* p = regionEnd; p < hi; ++p)

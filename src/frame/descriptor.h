@@ -96,6 +96,7 @@ struct Descriptor {
   bool warnsOdd = false;        // may return StatusOddSizeWarning
   bool writesAlpha = false;     // an AC4 destination's fourth channel is written
   bool checksSteps = false;
+  bool stepsInSamples = false;  // a step is cut down to whole samples before use
   void (*impl)() = nullptr;
   Invoker invoke = nullptr;
   std::vector<ArgKind> prototype;  // kinds of the prototype's parameters
@@ -129,6 +130,7 @@ class Workspace {
     std::vector<uint8_t> bytes;  // guard + rows + guard
     uint8_t* first = nullptr;    // first byte of the region
     int step = 0;
+    int pitch = 0;  // the distance between rows that the function uses
     PlaneGeometry geometry{};
     bool isSource = false;
     bool isDestination = false;

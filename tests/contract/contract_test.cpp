@@ -181,7 +181,7 @@ void expectGuardsKept(const Descriptor& d, ImageSize size, int pad, int offset) 
       for (int y = 0; y < b.geometry.rows; ++y)
         for (int x = 0; x < size.width; ++x)
           for (int k = 0; k < px; ++k) {
-            const size_t at = start + size_t(y) * b.step + size_t(x) * 4 * px + 3 * px + k;
+            const size_t at = start + size_t(y) * b.pitch + size_t(x) * 4 * px + 3 * px + k;
             ASSERT_EQ(before[i][at], after[i][at]) << "alpha of pixel " << x << "," << y << " was written";
           }
     }

@@ -1,0 +1,387 @@
+// RGB and BGR to HLS: every member's blocks and tail against the lane
+// formulas at every width and alignment, the formulas against the colour
+// model in double precision, and the cases where rounding, branch priority
+// and the width decide a result.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <array>
+#include <cmath>
+#include <cstring>
+#include <functional>
+
+#include "spaces/hls_formulas.h"
+#include "spaces/hls_test_images.h"
+
+namespace {
+
+using namespace zel::hls;
+using zel::ApproxRcp;
+using zel::RefinedRcp;
+using zel::RoundEven;
+using zel::TruncateToInt;
+using zel::test::ChannelImage;
+
+template <typename T>
+uint32_t bits(T v) {
+  if constexpr (std::is_same_v<T, float>) {
+    uint32_t b;
+    std::memcpy(&b, &v, 4);
+    return b;
+  } else {
+    return std::make_unsigned_t<T>(v);
+  }
+}
+template <typename T>
+constexpr uint32_t flipOf() {
+  return std::is_same_v<T, int16_t> ? 0x8000u : 0u;
+}
+
+template <typename T>
+using Call = std::function<Status(ChannelImage<T>& src, ChannelImage<T>& dst, ImageSize size)>;
+
+struct Shape {
+  bool srcPlanar;
+  int srcChannels;
+  bool dstPlanar;
+  int dstChannels;
+  int redAt;        // 0 for RGB members, 2 for BGR
+  bool copyAlpha;   // else a fourth destination channel keeps its value
+};
+
+// Expected H, L, S of one pixel, as stored.
+template <class R, typename T>
+void expectedForward(const ChannelImage<T>& src, int x, int y, int redAt, bool body, T out[3]) {
+  constexpr uint32_t flip = flipOf<T>();
+  float c[3];
+  for (int k = 0; k < 3; ++k) c[k] = float(int32_t(bits(src.get(x, y, k)) ^ flip));
+  const Hls v = body ? forwardBody<R>(c[redAt], c[1], c[2 - redAt]) : forwardTail<R>(c[redAt], c[1], c[2 - redAt]);
+  out[0] = T(uint32_t(v.h) ^ flip);
+  out[1] = T(uint32_t(v.l) ^ flip);
+  out[2] = T(uint32_t(v.s) ^ flip);
+}
+
+struct Layout {
+  int offset, pad;
+};
+
+template <typename T>
+std::vector<T> fourthChannel(const ChannelImage<T>& img) {
+  std::vector<T> out;
+  if (img.channels() == 4)
+    for (int y = 0; y < img.height(); ++y)
+      for (int x = 0; x < img.width(); ++x) out.push_back(img.get(x, y, 3));
+  return out;
+}
+
+// Every width from 1 to 70 at aligned and odd placements: pixels below the
+// body end take the block formula, the rest the tail formula; a fourth
+// channel is copied or kept; nothing outside the rows changes.
+template <class R, typename T>
+void checkMember(const char* name, Call<T> call, Shape shape) {
+  SCOPED_TRACE(name);
+  const Layout layouts[] = {{0, 0}, {1, 6}, {3, 2}, {2, 10}, {16, 4}};
+  for (int width = 1; width <= 70; ++width)
+    for (const Layout& l : layouts) {
+      const int height = 2;
+      ChannelImage<T> src(shape.srcPlanar, shape.srcChannels, width, height, l.offset, l.pad);
+      ChannelImage<T> dst(shape.dstPlanar, shape.dstChannels, width, height, l.offset + 5, l.pad);
+      zel::test::fillColours(src, uint32_t(width * 31 + l.offset));
+      zel::test::fillColours(dst, uint32_t(width * 17 + 1));
+      const std::vector<T> alphaBefore = fourthChannel(dst);
+      ASSERT_EQ(call(src, dst, ImageSize{width, height}), StatusOk);
+      const int bodyEnd = width & ~(R::kBlock - 1);
+      for (int y = 0; y < height; ++y)
+        for (int x = 0; x < width; ++x) {
+          T want[3];
+          expectedForward<R, T>(src, x, y, shape.redAt, x < bodyEnd, want);
+          for (int c = 0; c < 3; ++c)
+            ASSERT_EQ(dst.get(x, y, c), want[c]) << "channel " << c << " of pixel " << x << ", width " << width
+                                                 << ", offset " << l.offset << (x < bodyEnd ? " (block)" : " (tail)");
+          if (shape.dstChannels == 4)
+            ASSERT_EQ(dst.get(x, y, 3), shape.copyAlpha ? src.get(x, y, 3) : alphaBefore[y * width + x])
+                << "fourth channel of pixel " << x << ", width " << width;
+        }
+      ASSERT_TRUE(dst.guardsIntact()) << width;
+    }
+}
+
+template <typename T>
+Call<T> packed(Status (*fn)(const T*, int, T*, int, ImageSize)) {
+  return [fn](ChannelImage<T>& s, ChannelImage<T>& d, ImageSize z) { return fn(s.data(), s.step(), d.data(), d.step(), z); };
+}
+Call<uint8_t> toPlanes(Status (*fn)(const uint8_t*, int, uint8_t* const*, int, ImageSize)) {
+  return [fn](ChannelImage<uint8_t>& s, ChannelImage<uint8_t>& d, ImageSize z) {
+    return fn(s.data(), s.step(), d.planes(), d.step(), z);
+  };
+}
+Call<uint8_t> fromPlanes(Status (*fn)(const uint8_t* const*, int, uint8_t*, int, ImageSize)) {
+  return [fn](ChannelImage<uint8_t>& s, ChannelImage<uint8_t>& d, ImageSize z) {
+    return fn(s.planes(), s.step(), d.data(), d.step(), z);
+  };
+}
+Call<uint8_t> planesToPlanes(Status (*fn)(const uint8_t* const*, int, uint8_t* const*, int, ImageSize)) {
+  return [fn](ChannelImage<uint8_t>& s, ChannelImage<uint8_t>& d, ImageSize z) {
+    return fn(s.planes(), s.step(), d.planes(), d.step(), z);
+  };
+}
+
+TEST(RgbToHls, BlocksAndTailAtEveryWidth) {
+  checkMember<RgbToHls8C3, uint8_t>("8u C3", packed(zeliRGBToHLS_8u_C3R), {false, 3, false, 3, 0, false});
+  checkMember<RgbToHls8AC4, uint8_t>("8u AC4", packed(zeliRGBToHLS_8u_AC4R), {false, 4, false, 4, 0, false});
+  checkMember<RgbToHls16, uint16_t>("16u C3", packed(zeliRGBToHLS_16u_C3R), {false, 3, false, 3, 0, false});
+  checkMember<RgbToHls16, uint16_t>("16u AC4", packed(zeliRGBToHLS_16u_AC4R), {false, 4, false, 4, 0, false});
+  checkMember<RgbToHls16, int16_t>("16s C3", packed(zeliRGBToHLS_16s_C3R), {false, 3, false, 3, 0, false});
+  checkMember<RgbToHls16, int16_t>("16s AC4", packed(zeliRGBToHLS_16s_AC4R), {false, 4, false, 4, 0, false});
+}
+
+TEST(BgrToHls, BlocksAndTailAtEveryWidth) {
+  checkMember<BgrToHls8, uint8_t>("AC4", packed(zeliBGRToHLS_8u_AC4R), {false, 4, false, 4, 2, false});
+  checkMember<BgrToHls8, uint8_t>("AC4P4", toPlanes(zeliBGRToHLS_8u_AC4P4R), {false, 4, true, 4, 2, true});
+  checkMember<BgrToHls8, uint8_t>("AP4C4", fromPlanes(zeliBGRToHLS_8u_AP4C4R), {true, 4, false, 4, 2, true});
+  checkMember<BgrToHls8, uint8_t>("AP4", planesToPlanes(zeliBGRToHLS_8u_AP4R), {true, 4, true, 4, 2, true});
+  checkMember<BgrToHls8, uint8_t>("C3P3", toPlanes(zeliBGRToHLS_8u_C3P3R), {false, 3, true, 3, 2, false});
+  checkMember<BgrToHls8, uint8_t>("P3C3", fromPlanes(zeliBGRToHLS_8u_P3C3R), {true, 3, false, 3, 2, false});
+  checkMember<BgrToHls8, uint8_t>("P3", planesToPlanes(zeliBGRToHLS_8u_P3R), {true, 3, true, 3, 2, false});
+}
+
+TEST(RgbToHls, FloatPixelsByTheFloatFormula) {
+  for (int ch : {3, 4})
+    for (int width : {1, 5, 33}) {
+      ChannelImage<float> src(false, ch, width, 3, 4, 8), dst(false, ch, width, 3, 0, 12);
+      zel::test::fillColours(src, uint32_t(width));
+      zel::test::fillColours(dst, 2);
+      const std::vector<float> alphaBefore = fourthChannel(dst);
+      const auto fn = ch == 3 ? zeliRGBToHLS_32f_C3R : zeliRGBToHLS_32f_AC4R;
+      ASSERT_EQ(fn(src.data(), src.step(), dst.data(), dst.step(), ImageSize{width, 3}), StatusOk);
+      for (int y = 0; y < 3; ++y)
+        for (int x = 0; x < width; ++x) {
+          const HlsF v = forwardFloat(src.get(x, y, 0), src.get(x, y, 1), src.get(x, y, 2));
+          EXPECT_EQ(bits(dst.get(x, y, 0)), bits(v.h));
+          EXPECT_EQ(bits(dst.get(x, y, 1)), bits(v.l));
+          EXPECT_EQ(bits(dst.get(x, y, 2)), bits(v.s));
+          if (ch == 4) EXPECT_EQ(bits(dst.get(x, y, 3)), bits(alphaBefore[y * width + x]));
+        }
+      EXPECT_TRUE(dst.guardsIntact());
+    }
+}
+
+// ---- the formulas against the colour model ----
+
+struct Model {
+  double h, l, s;  // hue in degrees, l and s in 0..1
+};
+Model modelOf(double r, double g, double b) {
+  const double mx = std::max({r, g, b}), mn = std::min({r, g, b});
+  Model m{0, (mx + mn) / 2, 0};
+  if (mx == mn) return m;
+  m.s = m.l <= 0.5 ? (mx - mn) / (mx + mn) : (mx - mn) / (2 - mx - mn);
+  if (mx == r) m.h = 60 * (g - b) / (mx - mn);
+  else if (mx == g) m.h = 120 + 60 * (b - r) / (mx - mn);
+  else m.h = 240 + 60 * (r - g) / (mx - mn);
+  if (m.h < 0) m.h += 360;
+  return m;
+}
+
+// Distance on the hue circle, in units of the sample range.
+double hueDistance(double a, double b, double range) {
+  const double d = std::fabs(a - b);
+  return std::min(d, range - d);
+}
+
+// Within one level, plus what a 12-bit reciprocal (or the float spacing
+// near 65535) can add to a truncated result.
+template <class R>
+void compareWithModel(std::mt19937& rng) {
+  const double limit = 1.0 + (R::kRefined ? 0.01 : R::kMax * 3.0 / 4096);
+  for (int i = 0; i < 200000; ++i) {
+    const float r = float(rng() % (R::kMax + 1)), g = float(rng() % (R::kMax + 1)), b = float(rng() % (R::kMax + 1));
+    const Model m = modelOf(double(r) / R::kMax, double(g) / R::kMax, double(b) / R::kMax);
+    for (bool body : {true, false}) {
+      const Hls v = body ? forwardBody<R>(r, g, b) : forwardTail<R>(r, g, b);
+      ASSERT_LE(hueDistance(v.h, m.h * R::kMax / 360, R::kMax), limit) << r << " " << g << " " << b << " body " << body;
+      ASSERT_LE(std::fabs(v.l - m.l * R::kMax), 1.0) << r << " " << g << " " << b;
+      ASSERT_LE(std::fabs(v.s - m.s * R::kMax), limit) << r << " " << g << " " << b << " body " << body;
+    }
+  }
+}
+
+TEST(HlsForwardFormulas, WithinOneLevelOfTheColourModel) {
+  std::mt19937 rng(77);
+  compareWithModel<RgbToHls8C3>(rng);
+  compareWithModel<RgbToHls8AC4>(rng);
+  compareWithModel<RgbToHls16>(rng);
+  compareWithModel<BgrToHls8>(rng);
+  for (int i = 0; i < 100000; ++i) {
+    const float r = float(rng()) / 4294967296.0f, g = float(rng()) / 4294967296.0f, b = float(rng()) / 4294967296.0f;
+    const Model m = modelOf(r, g, b);
+    const HlsF v = forwardFloat(r, g, b);
+    // Float differences lose about 1e-7 of the samples; the hue divides
+    // them by the spread.
+    const double spread = std::max({r, g, b}) - std::min({r, g, b});
+    const double tolerance = 1e-6 * (1 + 1 / std::max(spread, 1e-9));
+    ASSERT_LE(hueDistance(v.h, m.h / 360, 1.0), tolerance) << r << " " << g << " " << b;
+    ASSERT_NEAR(v.l, m.l, 1e-6);
+    ASSERT_NEAR(v.s, m.s, tolerance);
+  }
+}
+
+TEST(HlsForwardFormulas, StoredConstants) {
+  const std::pair<float, uint32_t> table[] = {{kHue8, 0x3F355555u}, {kHue16, 0x43360AABu}, {kInv8, 0x3B808081u},
+                                              {kDeg8, 0x3FB4B4B5u}, {kInv16, 0x37800080u}, {kDeg16, 0x3BB400B4u},
+                                              {kInv60, 0x3C888889u}, {kFlatLimit, 0x34000000u}};
+  for (const auto& [value, pattern] : table) EXPECT_EQ(bits(value), pattern);
+}
+
+// ---- rounding, priority and zones ----
+
+// One row of `width` identical pixels through an 8-bit packed member.
+std::vector<uint8_t> row8(Status (*fn)(const uint8_t*, int, uint8_t*, int, ImageSize), int ch, int width,
+                          std::array<uint8_t, 3> pixel) {
+  std::vector<uint8_t> src(width * ch, 0), dst(width * ch, 0);
+  for (int x = 0; x < width; ++x)
+    for (int c = 0; c < 3; ++c) src[x * ch + c] = pixel[c];
+  EXPECT_EQ(fn(src.data(), width * ch, dst.data(), width * ch, ImageSize{width, 1}), StatusOk);
+  return dst;
+}
+
+TEST(HlsForwardValues, LightnessOfAnOddSum) {
+  // (3 + 0) / 2 = 1.5: the C3 blocks round to 2, its tail truncates to 1;
+  // AC4 rounds in both zones, the BGR family truncates in both.
+  for (int width : {7, 8, 12, 13}) {
+    const auto c3 = row8(zeliRGBToHLS_8u_C3R, 3, width, {3, 0, 0});
+    const auto ac4 = row8(zeliRGBToHLS_8u_AC4R, 4, width, {3, 0, 0});
+    const auto bgr = row8(zeliBGRToHLS_8u_AC4R, 4, width, {0, 0, 3});
+    for (int x = 0; x < width; ++x) {
+      EXPECT_EQ(c3[x * 3 + 1], x < (width & ~7) ? 2 : 1) << "C3 width " << width << " pixel " << x;
+      EXPECT_EQ(ac4[x * 4 + 1], 2) << "AC4 width " << width << " pixel " << x;
+      EXPECT_EQ(bgr[x * 4 + 1], 1) << "BGR width " << width << " pixel " << x;
+    }
+    // 2.5 ties to even where the form rounds.
+    const auto c3five = row8(zeliRGBToHLS_8u_C3R, 3, width, {0, 5, 0});
+    const auto ac4five = row8(zeliRGBToHLS_8u_AC4R, 4, width, {0, 0, 5});
+    for (int x = 0; x < width; ++x) {
+      EXPECT_EQ(c3five[x * 3 + 1], 2);
+      EXPECT_EQ(ac4five[x * 4 + 1], 2);
+    }
+  }
+}
+
+TEST(HlsForwardValues, HueJustBelowZero) {
+  // R the largest, B one above G: 0.235 degrees below 360. Rounding forms
+  // give 255, truncating forms 254.
+  for (int width : {8, 9}) {
+    const auto c3 = row8(zeliRGBToHLS_8u_C3R, 3, width, {255, 0, 1});
+    const auto ac4 = row8(zeliRGBToHLS_8u_AC4R, 4, width, {255, 0, 1});
+    const auto bgr = row8(zeliBGRToHLS_8u_AC4R, 4, width, {1, 0, 255});
+    EXPECT_EQ(c3[0], 255);
+    EXPECT_EQ(c3[3 * (width - 1)], width == 8 ? 255 : 254);
+    EXPECT_EQ(ac4[0], 255);
+    EXPECT_EQ(ac4[4 * (width - 1)], 255);
+    EXPECT_EQ(bgr[0], 254);
+    EXPECT_EQ(bgr[4 * (width - 1)], 254);
+  }
+}
+
+TEST(HlsForwardValues, RedWinsATieWithGreenAndGreenWithBlue) {
+  // R = G = mx > B takes the red branch, (rcp * 60) * (G - B) + 0; the
+  // green branch would give 120 + (rcp * 60) * (B - R), which differs in
+  // the last bits where the reciprocal is not exact.
+  int differing = 0;
+  for (int mx = 1; mx < 256; ++mx)
+    for (int b = 0; b < mx; ++b) {
+      const float spread = float(mx - b), rate = ApproxRcp(spread);
+      const float red = (rate * 60.0f) * spread, green = (rate * 60.0f) * -spread + 120.0f;
+      const Hls v = forwardBody<RgbToHls8C3>(float(mx), float(mx), float(b));
+      ASSERT_EQ(v.h, RoundEven(red * kHue8)) << mx << " " << b;
+      differing += RoundEven(red * kHue8) != RoundEven(green * kHue8);
+      // G = B = mx > R: the green branch, 120 + (rcp * 60) * (B - R).
+      const float cyan = (rate * 60.0f) * spread + 120.0f;
+      ASSERT_EQ(forwardBody<RgbToHls8C3>(float(b), float(mx), float(mx)).h, RoundEven(cyan * kHue8)) << mx << " " << b;
+    }
+  EXPECT_GT(differing, 0) << "no case tells the two branches apart";
+  // Through a public function too, in a block and in the tail.
+  const auto out = row8(zeliRGBToHLS_8u_C3R, 3, 9, {200, 200, 10});
+  const float rate = ApproxRcp(190.0f), refined = RefinedRcp(190.0f);
+  EXPECT_EQ(out[0], RoundEven(((rate * 60.0f) * 190.0f) * kHue8));
+  EXPECT_EQ(out[24], TruncateToInt(((190.0f * 60.0f) * refined) * kHue8));
+}
+
+TEST(HlsForwardValues, GreyRowsEveryMember) {
+  // H and S at the type's lowest level, L the common sample, in blocks and
+  // tail alike.
+  for (int v : {0, 1, 127, 128, 254, 255}) {
+    const auto c3 = row8(zeliRGBToHLS_8u_C3R, 3, 11, {uint8_t(v), uint8_t(v), uint8_t(v)});
+    const auto ac4 = row8(zeliRGBToHLS_8u_AC4R, 4, 11, {uint8_t(v), uint8_t(v), uint8_t(v)});
+    const auto bgr = row8(zeliBGRToHLS_8u_AC4R, 4, 11, {uint8_t(v), uint8_t(v), uint8_t(v)});
+    for (int x = 0; x < 11; ++x) {
+      EXPECT_EQ(c3[3 * x], 0);
+      EXPECT_EQ(c3[3 * x + 1], v);
+      EXPECT_EQ(c3[3 * x + 2], 0);
+      EXPECT_EQ(ac4[4 * x + 1], v);
+      EXPECT_EQ(ac4[4 * x + 2], 0);
+      EXPECT_EQ(bgr[4 * x], 0);
+      EXPECT_EQ(bgr[4 * x + 1], v);
+    }
+  }
+  for (int v : {-32768, -1, 0, 32767}) {
+    std::vector<int16_t> src(4 * 7, int16_t(v)), dst(4 * 7, 5);
+    ASSERT_EQ(zeliRGBToHLS_16s_AC4R(src.data(), 56, dst.data(), 56, ImageSize{7, 1}), StatusOk);
+    for (int x = 0; x < 7; ++x) {
+      EXPECT_EQ(dst[4 * x], -32768) << v;
+      EXPECT_EQ(dst[4 * x + 1], v);
+      EXPECT_EQ(dst[4 * x + 2], -32768);
+      EXPECT_EQ(dst[4 * x + 3], 5);
+    }
+    std::vector<uint16_t> src16(3 * 7, uint16_t(v)), dst16(3 * 7, 5);
+    ASSERT_EQ(zeliRGBToHLS_16u_C3R(src16.data(), 42, dst16.data(), 42, ImageSize{7, 1}), StatusOk);
+    for (int x = 0; x < 7; ++x) {
+      EXPECT_EQ(dst16[3 * x], 0);
+      EXPECT_EQ(dst16[3 * x + 1], uint16_t(v));
+      EXPECT_EQ(dst16[3 * x + 2], 0);
+    }
+  }
+}
+
+TEST(HlsForwardValues, FloatSpreadBelowTheFlatLimit) {
+  const float src[6] = {0.01f, 0.01f + 1e-8f, 0.01f, 0.25f, 0.25f, 0.25f + 2e-7f};
+  ASSERT_GT(src[1], src[0]);
+  float dst[6];
+  ASSERT_EQ(zeliRGBToHLS_32f_C3R(src, 12, dst, 12, ImageSize{2, 1}), StatusOk);
+  EXPECT_EQ(dst[0], 0.0f);
+  EXPECT_EQ(dst[2], 0.0f);
+  EXPECT_EQ(dst[1], (src[1] + src[0]) * 0.5f);
+  EXPECT_GT(dst[5], 0.0f) << "a spread above the limit is a colour";
+}
+
+// ---- steps ----
+
+TEST(HlsForwardSteps, WholeSamplesAndUpwardRows) {
+  // An odd byte step of a 16-bit member drops its last byte; a negative
+  // step walks upwards from the first row.
+  const int width = 9, height = 3;
+  std::mt19937 rng(4);
+  std::vector<uint16_t> src(3 * width * height);
+  for (auto& v : src) v = uint16_t(rng());
+  std::vector<uint16_t> even(src.size()), odd(src.size()), up(src.size());
+  const ImageSize size{width, height};
+  ASSERT_EQ(zeliRGBToHLS_16u_C3R(src.data(), 6 * width, even.data(), 6 * width, size), StatusOk);
+  ASSERT_EQ(zeliRGBToHLS_16u_C3R(src.data(), 6 * width + 1, odd.data(), 6 * width + 1, size), StatusOk);
+  EXPECT_EQ(even, odd);
+  const int last = 3 * width * (height - 1);
+  ASSERT_EQ(zeliRGBToHLS_16u_C3R(src.data() + last, -6 * width, up.data() + last, -6 * width, size), StatusOk);
+  EXPECT_EQ(even, up);
+}
+
+TEST(HlsForwardSteps, BgrMembersRejectStepsBelowOne) {
+  uint8_t src[16] = {}, a[4] = {}, b[4] = {}, c[4] = {}, d[4] = {};
+  uint8_t* const planes[4] = {a, b, c, d};
+  // Planar members test steps before the size, the AC4 member after it.
+  EXPECT_EQ(zeliBGRToHLS_8u_AC4P4R(src, 0, planes, 4, ImageSize{0, 1}), StatusStepError);
+  EXPECT_EQ(zeliBGRToHLS_8u_AC4R(src, 0, src, 16, ImageSize{0, 1}), StatusSizeError);
+  EXPECT_EQ(zeliBGRToHLS_8u_AC4R(src, 16, src, -4, ImageSize{1, 1}), StatusStepError);
+  EXPECT_EQ(zeliBGRToHLS_8u_C3P3R(src, 12, planes, 0, ImageSize{1, 1}), StatusStepError);
+  EXPECT_EQ(zeliBGRToHLS_8u_C3P3R(src, 12, planes, 4, ImageSize{1, 1}), StatusOk);
+}
+
+}  // namespace
