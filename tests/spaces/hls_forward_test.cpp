@@ -20,34 +20,7 @@ using zel::ApproxRcp;
 using zel::RefinedRcp;
 using zel::RoundEven;
 using zel::TruncateToInt;
-using zel::test::ChannelImage;
-
-template <typename T>
-uint32_t bits(T v) {
-  if constexpr (std::is_same_v<T, float>) {
-    uint32_t b;
-    std::memcpy(&b, &v, 4);
-    return b;
-  } else {
-    return std::make_unsigned_t<T>(v);
-  }
-}
-template <typename T>
-constexpr uint32_t flipOf() {
-  return std::is_same_v<T, int16_t> ? 0x8000u : 0u;
-}
-
-template <typename T>
-using Call = std::function<Status(ChannelImage<T>& src, ChannelImage<T>& dst, ImageSize size)>;
-
-struct Shape {
-  bool srcPlanar;
-  int srcChannels;
-  bool dstPlanar;
-  int dstChannels;
-  int redAt;        // 0 for RGB members, 2 for BGR
-  bool copyAlpha;   // else a fourth destination channel keeps its value
-};
+using namespace zel::test;
 
 // Expected H, L, S of one pixel, as stored.
 template <class R, typename T>
@@ -61,69 +34,12 @@ void expectedForward(const ChannelImage<T>& src, int x, int y, int redAt, bool b
   out[2] = T(uint32_t(v.s) ^ flip);
 }
 
-struct Layout {
-  int offset, pad;
-};
-
-template <typename T>
-std::vector<T> fourthChannel(const ChannelImage<T>& img) {
-  std::vector<T> out;
-  if (img.channels() == 4)
-    for (int y = 0; y < img.height(); ++y)
-      for (int x = 0; x < img.width(); ++x) out.push_back(img.get(x, y, 3));
-  return out;
-}
-
-// Every width from 1 to 70 at aligned and odd placements: pixels below the
-// body end take the block formula, the rest the tail formula; a fourth
-// channel is copied or kept; nothing outside the rows changes.
 template <class R, typename T>
 void checkMember(const char* name, Call<T> call, Shape shape) {
-  SCOPED_TRACE(name);
-  const Layout layouts[] = {{0, 0}, {1, 6}, {3, 2}, {2, 10}, {16, 4}};
-  for (int width = 1; width <= 70; ++width)
-    for (const Layout& l : layouts) {
-      const int height = 2;
-      ChannelImage<T> src(shape.srcPlanar, shape.srcChannels, width, height, l.offset, l.pad);
-      ChannelImage<T> dst(shape.dstPlanar, shape.dstChannels, width, height, l.offset + 5, l.pad);
-      zel::test::fillColours(src, uint32_t(width * 31 + l.offset));
-      zel::test::fillColours(dst, uint32_t(width * 17 + 1));
-      const std::vector<T> alphaBefore = fourthChannel(dst);
-      ASSERT_EQ(call(src, dst, ImageSize{width, height}), StatusOk);
-      const int bodyEnd = width & ~(R::kBlock - 1);
-      for (int y = 0; y < height; ++y)
-        for (int x = 0; x < width; ++x) {
-          T want[3];
-          expectedForward<R, T>(src, x, y, shape.redAt, x < bodyEnd, want);
-          for (int c = 0; c < 3; ++c)
-            ASSERT_EQ(dst.get(x, y, c), want[c]) << "channel " << c << " of pixel " << x << ", width " << width
-                                                 << ", offset " << l.offset << (x < bodyEnd ? " (block)" : " (tail)");
-          if (shape.dstChannels == 4)
-            ASSERT_EQ(dst.get(x, y, 3), shape.copyAlpha ? src.get(x, y, 3) : alphaBefore[y * width + x])
-                << "fourth channel of pixel " << x << ", width " << width;
-        }
-      ASSERT_TRUE(dst.guardsIntact()) << width;
-    }
-}
-
-template <typename T>
-Call<T> packed(Status (*fn)(const T*, int, T*, int, ImageSize)) {
-  return [fn](ChannelImage<T>& s, ChannelImage<T>& d, ImageSize z) { return fn(s.data(), s.step(), d.data(), d.step(), z); };
-}
-Call<uint8_t> toPlanes(Status (*fn)(const uint8_t*, int, uint8_t* const*, int, ImageSize)) {
-  return [fn](ChannelImage<uint8_t>& s, ChannelImage<uint8_t>& d, ImageSize z) {
-    return fn(s.data(), s.step(), d.planes(), d.step(), z);
-  };
-}
-Call<uint8_t> fromPlanes(Status (*fn)(const uint8_t* const*, int, uint8_t*, int, ImageSize)) {
-  return [fn](ChannelImage<uint8_t>& s, ChannelImage<uint8_t>& d, ImageSize z) {
-    return fn(s.planes(), s.step(), d.data(), d.step(), z);
-  };
-}
-Call<uint8_t> planesToPlanes(Status (*fn)(const uint8_t* const*, int, uint8_t* const*, int, ImageSize)) {
-  return [fn](ChannelImage<uint8_t>& s, ChannelImage<uint8_t>& d, ImageSize z) {
-    return fn(s.planes(), s.step(), d.planes(), d.step(), z);
-  };
+  checkEveryWidth<T>(name, call, shape, R::kBlock, false,
+                     [&](const ChannelImage<T>& src, int x, int y, bool body, T* out) {
+                       expectedForward<R, T>(src, x, y, shape.redAt, body, out);
+                     });
 }
 
 TEST(RgbToHls, BlocksAndTailAtEveryWidth) {

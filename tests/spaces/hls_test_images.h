@@ -5,6 +5,10 @@
 #pragma once
 
 #include <cstdint>
+#include <cstring>
+#include <functional>
+
+#include <gtest/gtest.h>
 #include <memory>
 #include <random>
 #include <vector>
@@ -94,6 +98,7 @@ void fillHls(ChannelImage<T>& img, uint32_t seed) {
         if (kind == 3) v[0] = 0.0f;
         if (kind == 4) v[0] = 1.25f;
         if (kind == 5) v[1] = -0.125f;
+        if (kind == 6) v[1] = 0.5f;  // where the two forms of hslHigh meet
       } else {
         const T zero = std::is_signed_v<T> ? T(-32768) : T(0);
         const T top = T(std::is_signed_v<T> ? 32767 : (sizeof(T) == 1 ? 255 : 65535));
@@ -103,6 +108,107 @@ void fillHls(ChannelImage<T>& img, uint32_t seed) {
         if (kind == 4) v[1] = top;
       }
       for (int c = 0; c < img.channels(); ++c) img.set(x, y, c, v[c]);
+    }
+}
+
+// ---- calling members through images ----
+
+template <typename T>
+uint32_t bits(T v) {
+  if constexpr (std::is_same_v<T, float>) {
+    uint32_t b;
+    std::memcpy(&b, &v, 4);
+    return b;
+  } else {
+    return std::make_unsigned_t<T>(v);
+  }
+}
+template <typename T>
+constexpr uint32_t flipOf() {
+  return std::is_same_v<T, int16_t> ? 0x8000u : 0u;
+}
+
+template <typename T>
+using Call = std::function<Status(ChannelImage<T>& src, ChannelImage<T>& dst, ImageSize size)>;
+
+struct Shape {
+  bool srcPlanar;
+  int srcChannels;
+  bool dstPlanar;
+  int dstChannels;
+  int redAt;        // 0 for RGB members, 2 for BGR
+  bool copyAlpha;   // else a fourth destination channel keeps its value
+};
+
+struct Layout {
+  int offset, pad;
+};
+
+template <typename T>
+std::vector<T> fourthChannel(const ChannelImage<T>& img) {
+  std::vector<T> out;
+  if (img.channels() == 4)
+    for (int y = 0; y < img.height(); ++y)
+      for (int x = 0; x < img.width(); ++x) out.push_back(img.get(x, y, 3));
+  return out;
+}
+
+template <typename T>
+Call<T> packed(Status (*fn)(const T*, int, T*, int, ImageSize)) {
+  return [fn](ChannelImage<T>& s, ChannelImage<T>& d, ImageSize z) { return fn(s.data(), s.step(), d.data(), d.step(), z); };
+}
+inline Call<uint8_t> toPlanes(Status (*fn)(const uint8_t*, int, uint8_t* const*, int, ImageSize)) {
+  return [fn](ChannelImage<uint8_t>& s, ChannelImage<uint8_t>& d, ImageSize z) {
+    return fn(s.data(), s.step(), d.planes(), d.step(), z);
+  };
+}
+inline Call<uint8_t> fromPlanes(Status (*fn)(const uint8_t* const*, int, uint8_t*, int, ImageSize)) {
+  return [fn](ChannelImage<uint8_t>& s, ChannelImage<uint8_t>& d, ImageSize z) {
+    return fn(s.planes(), s.step(), d.data(), d.step(), z);
+  };
+}
+inline Call<uint8_t> planesToPlanes(Status (*fn)(const uint8_t* const*, int, uint8_t* const*, int, ImageSize)) {
+  return [fn](ChannelImage<uint8_t>& s, ChannelImage<uint8_t>& d, ImageSize z) {
+    return fn(s.planes(), s.step(), d.planes(), d.step(), z);
+  };
+}
+
+
+// Every width from 1 to 70 at aligned and odd placements: `expect` gives
+// the three colour channels of a pixel in destination memory order, by the
+// block formula below the body end and the tail formula past it. A fourth
+// channel is copied or keeps its value; nothing outside the rows changes.
+template <typename T, typename Expect>
+void checkEveryWidth(const char* name, Call<T> call, Shape shape, int block, bool hlsSource, Expect expect) {
+  SCOPED_TRACE(name);
+  const Layout layouts[] = {{0, 0}, {1, 6}, {3, 2}, {2, 10}, {16, 4}};
+  for (int width = 1; width <= 70; ++width)
+    for (const Layout& l : layouts) {
+      const int height = 2;
+      // Byte rows take odd paddings; wider samples whole ones, as their
+      // steps count whole samples.
+      const int pad = sizeof(T) == 1 ? l.pad + 1 : l.pad * int(sizeof(T)) / 2;
+      ChannelImage<T> src(shape.srcPlanar, shape.srcChannels, width, height, l.offset, pad);
+      ChannelImage<T> dst(shape.dstPlanar, shape.dstChannels, width, height, l.offset + 5, pad);
+      if (hlsSource) fillHls(src, uint32_t(width * 31 + l.offset));
+      else fillColours(src, uint32_t(width * 31 + l.offset));
+      fillColours(dst, uint32_t(width * 17 + 1));
+      const std::vector<T> alphaBefore = fourthChannel(dst);
+      ASSERT_EQ(call(src, dst, ImageSize{width, height}), StatusOk);
+      const int bodyEnd = width & ~(block - 1);
+      for (int y = 0; y < height; ++y)
+        for (int x = 0; x < width; ++x) {
+          T want[3];
+          expect(src, x, y, x < bodyEnd, want);
+          for (int c = 0; c < 3; ++c)
+            ASSERT_EQ(bits(dst.get(x, y, c)), bits(want[c]))
+                << "channel " << c << " of pixel " << x << ", width " << width << ", offset " << l.offset
+                << (x < bodyEnd ? " (block)" : " (tail)");
+          if (shape.dstChannels == 4)
+            ASSERT_EQ(bits(dst.get(x, y, 3)), bits(shape.copyAlpha ? src.get(x, y, 3) : alphaBefore[y * width + x]))
+                << "fourth channel of pixel " << x << ", width " << width;
+        }
+      ASSERT_TRUE(dst.guardsIntact()) << width;
     }
 }
 
