@@ -126,7 +126,8 @@ struct PixelGroup {
     if constexpr (C == N) {
       return _mm_setzero_si128();
     } else {
-      return _mm_or_si128(_mm_shuffle_epi8(lanes[C], maskOf(kScatter<E, Ch, C, 16 * I, Lane>)), mergeInto<I, C + 1, N>(lanes));
+      const __m128i part = _mm_shuffle_epi8(lanes[C], maskOf(kScatter<E, Ch, C, 16 * I, Lane>));
+      return _mm_or_si128(part, mergeInto<I, C + 1, N>(lanes));
     }
   }
   template <int I, int N, bool Stream>

@@ -176,18 +176,28 @@ uint8_t* bytes(const T* p) {
 
 bool badSize(ImageSize size) { return size.width < 1 || size.height < 1; }
 
-template <int N, typename P>
-bool planesNull(P* const* planes) {
+// A side from the caller's pointer: an image pointer, or a plane array of
+// which the array and every entry count as pointers.
+template <class Side, typename P>
+bool isNull(P* p) {
+  return !p;
+}
+template <class Side, typename P>
+bool isNull(P* const* planes) {
   if (!planes) return true;
-  for (int i = 0; i < N; ++i)
+  for (int i = 0; i < Side::kPlanes; ++i)
     if (!planes[i]) return true;
   return false;
 }
 
-template <int N, typename P>
-Planar<uint8_t, N> planar(P* const* planes, int step) {
-  Planar<uint8_t, N> side;
-  for (int i = 0; i < N; ++i) side.base[i] = bytes(planes[i]);
+template <class Side, typename P>
+Side sideOf(P* p, int step) {
+  return Side{bytes(p), step};
+}
+template <class Side, typename P>
+Side sideOf(P* const* planes, int step) {
+  Side side{};
+  for (int i = 0; i < Side::kPlanes; ++i) side.base[i] = bytes(planes[i]);
   side.step = step;
   return side;
 }
@@ -219,14 +229,15 @@ Status rgbToHlsFloat(const float* src, int srcStep, float* dst, int dstStep, Ima
 // then the size; the interleaved AC4 member tests size before steps.
 enum class Order { StepFirst, SizeFirst };
 
-template <class M, Order O, bool Forward>
-Status bgrMember(bool nullPointer, int srcStep, int dstStep, ImageSize size, const typename M::In& in,
-                 const typename M::Out& out) {
-  if (nullPointer) return StatusNullPointerError;
+template <class M, bool Forward, Order O, typename S, typename D>
+Status bgrMember(S src, int srcStep, D dst, int dstStep, ImageSize size) {
+  if (isNull<typename M::In>(src) || isNull<typename M::Out>(dst)) return StatusNullPointerError;
   const bool badStep = srcStep < 1 || dstStep < 1;
   if (O == Order::StepFirst && badStep) return StatusStepError;
   if (badSize(size)) return StatusSizeError;
   if (O == Order::SizeFirst && badStep) return StatusStepError;
+  const auto in = sideOf<typename M::In>(src, srcStep);
+  const auto out = sideOf<typename M::Out>(dst, dstStep);
   if constexpr (Forward)
     walk<M>(in, out, size, [](const auto& i, const auto& o, int w, bool a) { forwardRow<M>(i, o, w, a); });
   else
@@ -234,10 +245,16 @@ Status bgrMember(bool nullPointer, int srcStep, int dstStep, ImageSize size, con
   return StatusOk;
 }
 
-template <class In, class Out, bool Copy>
-using BgrForward = Member<BgrToHls8, BgrToHls8, 4, In, Out, 2, Copy>;
-template <class In, class Out, bool Copy>
-using BgrInverse = Member<HlsToBgr8Body, HlsToBgr8Tail, 4, In, Out, 2, Copy>;
+// The BGR family: B, G, R in memory, 4-pixel blocks, truncation.
+template <class In, class Out, bool Copy, Order O = Order::StepFirst, typename S, typename D>
+Status bgrToHls(S src, int srcStep, D dst, int dstStep, ImageSize size) {
+  return bgrMember<Member<BgrToHls8, BgrToHls8, 4, In, Out, 2, Copy>, true, O>(src, srcStep, dst, dstStep, size);
+}
+template <class In, class Out, bool Copy, typename S, typename D>
+Status hlsToBgr(S src, int srcStep, D dst, int dstStep, ImageSize size) {
+  using M = Member<HlsToBgr8Body, HlsToBgr8Tail, 4, In, Out, 2, Copy>;
+  return bgrMember<M, false, Order::StepFirst>(src, srcStep, dst, dstStep, size);
+}
 
 using Pixels3 = Packed<uint8_t, 3>;
 using Pixels4 = Packed<uint8_t, 4>;
@@ -308,93 +325,56 @@ ZEL_PUBLIC Status zeliHLSToRGB_32f_AC4R(const float* src, int srcStep, float* ds
 
 // ---- BGR to HLS ----
 ZEL_PUBLIC Status zeliBGRToHLS_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
-  using M = BgrForward<Pixels4, PackedSkipAlpha<uint8_t>, false>;
-  return bgrMember<M, Order::SizeFirst, true>(!src || !dst, srcStep, dstStep, size, {bytes(src), srcStep},
-                                        {{bytes(dst), dstStep}});
+  // The fourth byte of the destination is never written; size before steps.
+  return bgrToHls<Pixels4, PackedSkipAlpha<uint8_t>, false, Order::SizeFirst>(src, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliBGRToHLS_8u_AC4P4R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[4], int dstStep,
                                          ImageSize size) {
-  using M = BgrForward<Pixels4, Planes4, true>;
-  const bool null = !src || planesNull<4>(dstPlanes);
-  return bgrMember<M, Order::StepFirst, true>(null, srcStep, dstStep, size, {bytes(src), srcStep},
-                                        null ? Planes4{} : planar<4>(dstPlanes, dstStep));
+  return bgrToHls<Pixels4, Planes4, true>(src, srcStep, dstPlanes, dstStep, size);
 }
 ZEL_PUBLIC Status zeliBGRToHLS_8u_AP4C4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* dst, int dstStep,
                                          ImageSize size) {
-  using M = BgrForward<Planes4, Pixels4, true>;
-  const bool null = planesNull<4>(srcPlanes) || !dst;
-  return bgrMember<M, Order::StepFirst, true>(null, srcStep, dstStep, size, null ? Planes4{} : planar<4>(srcPlanes, srcStep),
-                                        {bytes(dst), dstStep});
+  return bgrToHls<Planes4, Pixels4, true>(srcPlanes, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliBGRToHLS_8u_AP4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* const dstPlanes[4],
                                        int dstStep, ImageSize size) {
-  using M = BgrForward<Planes4, Planes4, true>;
-  const bool null = planesNull<4>(srcPlanes) || planesNull<4>(dstPlanes);
-  return bgrMember<M, Order::StepFirst, true>(null, srcStep, dstStep, size, null ? Planes4{} : planar<4>(srcPlanes, srcStep),
-                                        null ? Planes4{} : planar<4>(dstPlanes, dstStep));
+  return bgrToHls<Planes4, Planes4, true>(srcPlanes, srcStep, dstPlanes, dstStep, size);
 }
 ZEL_PUBLIC Status zeliBGRToHLS_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
                                         ImageSize size) {
-  using M = BgrForward<Pixels3, Planes3, false>;
-  const bool null = !src || planesNull<3>(dstPlanes);
-  return bgrMember<M, Order::StepFirst, true>(null, srcStep, dstStep, size, {bytes(src), srcStep},
-                                        null ? Planes3{} : planar<3>(dstPlanes, dstStep));
+  return bgrToHls<Pixels3, Planes3, false>(src, srcStep, dstPlanes, dstStep, size);
 }
 ZEL_PUBLIC Status zeliBGRToHLS_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
                                         ImageSize size) {
-  using M = BgrForward<Planes3, Pixels3, false>;
-  const bool null = planesNull<3>(srcPlanes) || !dst;
-  return bgrMember<M, Order::StepFirst, true>(null, srcStep, dstStep, size, null ? Planes3{} : planar<3>(srcPlanes, srcStep),
-                                        {bytes(dst), dstStep});
+  return bgrToHls<Planes3, Pixels3, false>(srcPlanes, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliBGRToHLS_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
                                       int dstStep, ImageSize size) {
-  using M = BgrForward<Planes3, Planes3, false>;
-  const bool null = planesNull<3>(srcPlanes) || planesNull<3>(dstPlanes);
-  return bgrMember<M, Order::StepFirst, true>(null, srcStep, dstStep, size, null ? Planes3{} : planar<3>(srcPlanes, srcStep),
-                                        null ? Planes3{} : planar<3>(dstPlanes, dstStep));
+  return bgrToHls<Planes3, Planes3, false>(srcPlanes, srcStep, dstPlanes, dstStep, size);
 }
 
 // ---- HLS to BGR ----
 ZEL_PUBLIC Status zeliHLSToBGR_8u_AC4P4R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[4], int dstStep,
                                          ImageSize size) {
-  using M = BgrInverse<Pixels4, Planes4, true>;
-  const bool null = !src || planesNull<4>(dstPlanes);
-  return bgrMember<M, Order::StepFirst, false>(null, srcStep, dstStep, size, {bytes(src), srcStep},
-                                        null ? Planes4{} : planar<4>(dstPlanes, dstStep));
+  return hlsToBgr<Pixels4, Planes4, true>(src, srcStep, dstPlanes, dstStep, size);
 }
 ZEL_PUBLIC Status zeliHLSToBGR_8u_AP4C4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* dst, int dstStep,
                                          ImageSize size) {
-  using M = BgrInverse<Planes4, Pixels4, true>;
-  const bool null = planesNull<4>(srcPlanes) || !dst;
-  return bgrMember<M, Order::StepFirst, false>(null, srcStep, dstStep, size, null ? Planes4{} : planar<4>(srcPlanes, srcStep),
-                                        {bytes(dst), dstStep});
+  return hlsToBgr<Planes4, Pixels4, true>(srcPlanes, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliHLSToBGR_8u_AP4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* const dstPlanes[4],
                                        int dstStep, ImageSize size) {
-  using M = BgrInverse<Planes4, Planes4, true>;
-  const bool null = planesNull<4>(srcPlanes) || planesNull<4>(dstPlanes);
-  return bgrMember<M, Order::StepFirst, false>(null, srcStep, dstStep, size, null ? Planes4{} : planar<4>(srcPlanes, srcStep),
-                                        null ? Planes4{} : planar<4>(dstPlanes, dstStep));
+  return hlsToBgr<Planes4, Planes4, true>(srcPlanes, srcStep, dstPlanes, dstStep, size);
 }
 ZEL_PUBLIC Status zeliHLSToBGR_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
                                         ImageSize size) {
-  using M = BgrInverse<Pixels3, Planes3, false>;
-  const bool null = !src || planesNull<3>(dstPlanes);
-  return bgrMember<M, Order::StepFirst, false>(null, srcStep, dstStep, size, {bytes(src), srcStep},
-                                        null ? Planes3{} : planar<3>(dstPlanes, dstStep));
+  return hlsToBgr<Pixels3, Planes3, false>(src, srcStep, dstPlanes, dstStep, size);
 }
 ZEL_PUBLIC Status zeliHLSToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
                                         ImageSize size) {
-  using M = BgrInverse<Planes3, Pixels3, false>;
-  const bool null = planesNull<3>(srcPlanes) || !dst;
-  return bgrMember<M, Order::StepFirst, false>(null, srcStep, dstStep, size, null ? Planes3{} : planar<3>(srcPlanes, srcStep),
-                                        {bytes(dst), dstStep});
+  return hlsToBgr<Planes3, Pixels3, false>(srcPlanes, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliHLSToBGR_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
                                       int dstStep, ImageSize size) {
-  using M = BgrInverse<Planes3, Planes3, false>;
-  const bool null = planesNull<3>(srcPlanes) || planesNull<3>(dstPlanes);
-  return bgrMember<M, Order::StepFirst, false>(null, srcStep, dstStep, size, null ? Planes3{} : planar<3>(srcPlanes, srcStep),
-                                        null ? Planes3{} : planar<3>(dstPlanes, dstStep));
+  return hlsToBgr<Planes3, Planes3, false>(srcPlanes, srcStep, dstPlanes, dstStep, size);
 }

@@ -85,6 +85,7 @@ struct PackedSkipAlpha : Packed<T, 4> {
 template <typename T, int Planes>
 struct Planar {
   using Sample = T;
+  static constexpr int kPlanes = Planes;
   uint8_t* base[Planes];
   int step;
   Planar rowAt(int y) const {

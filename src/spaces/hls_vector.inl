@@ -167,7 +167,7 @@ inline int inverseGroups(const typename M::In& in, const typename M::Out& out, i
     I rgb[3];
     for (int c = 0; c < 3; ++c) {
       if constexpr (R::kGrey == Grey::Lightness) level[c] = V::select(grey, l, level[c]);
-      if constexpr (R::kGrey == Grey::CopyL && R::kOutput == Output::Level) level[c] = V::select(grey, hls[1], level[c]);
+      if constexpr (R::kGrey == Grey::CopyL) level[c] = V::select(grey, hls[1], level[c]);
       rgb[c] = outputLanes<V, R>(level[c]);
     }
     for (int k = 0; k < V::kGroups; ++k) {

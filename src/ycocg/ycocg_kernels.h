@@ -118,7 +118,9 @@ struct Wide {
       else plainForwardLanes32(b[k], g[k], r[k], out[0][k], out[1][k], out[2][k]);
     }
   }
-  static Ycc<int32_t> body(int32_t b, int32_t g, int32_t r) { return Lift ? liftForward(b, g, r) : plainForward(b, g, r); }
+  static Ycc<int32_t> body(int32_t b, int32_t g, int32_t r) {
+    return Lift ? liftForward(b, g, r) : plainForward(b, g, r);
+  }
   static Ycc<int32_t> tail(int32_t b, int32_t g, int32_t r) { return body(b, g, r); }
 };
 
@@ -141,7 +143,9 @@ struct LiftShort {
   static void block(const __m128i* bgr, __m128i (*out)[2]) {
     liftForwardLanes16(bgr[0], bgr[1], bgr[2], out[0][0], out[1][0], out[2][0]);
   }
-  static Ycc<int16_t> body(int32_t b, int32_t g, int32_t r) { return liftForward16(int16_t(b), int16_t(g), int16_t(r)); }
+  static Ycc<int16_t> body(int32_t b, int32_t g, int32_t r) {
+    return liftForward16(int16_t(b), int16_t(g), int16_t(r));
+  }
   static Ycc<int16_t> tail(int32_t b, int32_t g, int32_t r) { return body(b, g, r); }
 };
 

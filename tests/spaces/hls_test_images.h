@@ -155,7 +155,9 @@ std::vector<T> fourthChannel(const ChannelImage<T>& img) {
 
 template <typename T>
 Call<T> packed(Status (*fn)(const T*, int, T*, int, ImageSize)) {
-  return [fn](ChannelImage<T>& s, ChannelImage<T>& d, ImageSize z) { return fn(s.data(), s.step(), d.data(), d.step(), z); };
+  return [fn](ChannelImage<T>& s, ChannelImage<T>& d, ImageSize z) {
+    return fn(s.data(), s.step(), d.data(), d.step(), z);
+  };
 }
 inline Call<uint8_t> toPlanes(Status (*fn)(const uint8_t*, int, uint8_t* const*, int, ImageSize)) {
   return [fn](ChannelImage<uint8_t>& s, ChannelImage<uint8_t>& d, ImageSize z) {
