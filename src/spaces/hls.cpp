@@ -141,10 +141,14 @@ void inverseRow(const typename M::In& in, const typename M::Out& out, int width,
   for (; x < width; ++x) inverseTailPixel<M>(in, out, x);
 }
 
-// Float forward conversion: one pixel at a time, no block form.
+// Float forward conversion: one formula for every pixel, so the vector
+// groups and the last pixels agree whatever the width.
 template <int Ch>
-void forwardFloatRow(const Packed<float, Ch>& in, const Packed<float, Ch>& out, int width) {
-  for (int x = 0; x < width; ++x) {
+void forwardFloatRow(const Packed<float, Ch>& in, const Packed<float, Ch>& out, int width, bool useAvx2) {
+  int x = 0;
+  if (useAvx2) x = avx2::forwardFloatGroups<Avx>(in, out, x, width);
+  x = sse41::forwardFloatGroups<Sse>(in, out, x, width);
+  for (; x < width; ++x) {
     const HlsF v = forwardFloat(fromBits<float>(in.at(x, 0)), fromBits<float>(in.at(x, 1)),
                                 fromBits<float>(in.at(x, 2)));
     out.put(x, 0, bitsOf(v.h));
@@ -221,7 +225,8 @@ Status rgbToHlsFloat(const float* src, int srcStep, float* dst, int dstStep, Ima
   if (!src || !dst) return StatusNullPointerError;
   if (badSize(size)) return StatusSizeError;
   const Packed<float, Ch> in{bytes(src), wholeSamples<float>(srcStep)}, out{bytes(dst), wholeSamples<float>(dstStep)};
-  for (int y = 0; y < size.height; ++y) forwardFloatRow<Ch>(in.rowAt(y), out.rowAt(y), size.width);
+  const bool useAvx2 = hasAvx2();
+  for (int y = 0; y < size.height; ++y) forwardFloatRow<Ch>(in.rowAt(y), out.rowAt(y), size.width, useAvx2);
   return StatusOk;
 }
 

@@ -78,6 +78,49 @@ inline int forwardGroups(const typename M::In& in, const typename M::Out& out, i
   return x;
 }
 
+// Float samples: the one formula of every pixel, with true divisions.
+template <class V>
+inline void forwardFloatLanes(typename V::F r, typename V::F g, typename V::F b, typename V::F* out) {
+  using F = typename V::F;
+  const F zero = V::set(0.0f), half = V::set(0.5f);
+  const F mx = V::max(V::max(r, g), b), mn = V::min(V::min(r, g), b);
+  const F spread = V::sub(mx, mn), sum = V::add(mx, mn);
+  const F light = V::mul(sum, half);
+  const F flat = V::le(spread, V::set(kFlatLimit));
+  const F sat = V::select(V::le(light, half), V::div(spread, sum), V::div(spread, V::sub(V::set(2.0f), sum)));
+  const F isR = V::eq(r, mx);
+  const F isG = V::andNot(isR, V::eq(g, mx));
+  const F diff = V::select(isR, V::sub(g, b), V::select(isG, V::sub(b, r), V::sub(r, g)));
+  F hue = V::div(V::mul(diff, V::set(60.0f)), spread);
+  hue = V::select(isR, hue, V::add(hue, V::select(isG, V::set(120.0f), V::set(240.0f))));
+  hue = V::select(V::lt(hue, zero), V::add(hue, V::set(360.0f)), hue);
+  out[0] = V::select(flat, zero, V::div(hue, V::set(360.0f)));
+  out[1] = light;
+  out[2] = V::select(flat, zero, sat);
+}
+
+template <class V, class In, class Out>
+inline int forwardFloatGroups(const In& in, const Out& out, int x, int end) {
+  constexpr int kStep = 4 * V::kGroups;
+  for (; x + kStep <= end; x += kStep) {
+    __m128i raw[V::kGroups][4];
+    for (int k = 0; k < V::kGroups; ++k) in.template load<3>(x + 4 * k, raw[k]);
+    typename V::F colour[3], hls[3];
+    for (int c = 0; c < 3; ++c) {
+      __m128i parts[V::kGroups];
+      for (int k = 0; k < V::kGroups; ++k) parts[k] = raw[k][c];
+      colour[c] = V::asFloat(V::join(parts));
+    }
+    forwardFloatLanes<V>(colour[0], colour[1], colour[2], hls);
+    for (int k = 0; k < V::kGroups; ++k) {
+      const __m128i lanes[3] = {V::part(V::asInt(hls[0]), k), V::part(V::asInt(hls[1]), k),
+                                V::part(V::asInt(hls[2]), k)};
+      out.template store<3>(x + 4 * k, lanes);
+    }
+  }
+  return x;
+}
+
 // ---- inverse ----
 
 template <class V, class R>

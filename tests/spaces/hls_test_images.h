@@ -4,6 +4,7 @@
 // largest channel) as well as random colours.
 #pragma once
 
+#include <cmath>
 #include <cstdint>
 #include <cstring>
 #include <functional>
@@ -78,6 +79,11 @@ void fillColours(ChannelImage<T>& img, uint32_t seed) {
       const uint32_t kind = rng() % 8;
       if (kind == 0) v[1] = v[2] = v[0];
       if (kind == 1) v[(rng() % 3 + 1) % 3] = v[rng() % 3];  // ties in any order
+      if constexpr (std::is_same_v<T, float>) {
+        // Floats are not clamped: values past 0..1, infinities, NaN.
+        const float odd[] = {-0.5f, 1.5f, -0.0f, INFINITY, -INFINITY, NAN};
+        if (kind == 2) v[rng() % 3] = odd[rng() % 6];
+      }
       for (int c = 0; c < img.channels(); ++c) img.set(x, y, c, v[c]);
     }
 }
