@@ -190,6 +190,10 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       }
       Extra e{f[0], kinds.at(f[1]), std::atof(f[2].c_str()), {}};
       for (size_t k = 3; k < f.size(); ++k) {
+        if (f[k] == "optional" && e.kind == ArgKind::Pointer) {
+          e.optional = true;
+          continue;
+        }
         const size_t eq = f[k].find('=');
         if (eq == std::string::npos) {
           error = "bad value list in extras of " + d.name;
@@ -203,11 +207,23 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
         error = "bad min= in extras of " + d.name;
         return false;
       }
+    } else if (word.rfind("mult=", 0) == 0) {
+      if (std::sscanf(word.c_str() + 5, "%dx%d", &d.multWidth, &d.multHeight) != 2 || d.multWidth < 1 ||
+          d.multHeight < 1) {
+        error = "bad mult= in extras of " + d.name;
+        return false;
+      }
+    } else if (word.rfind("room=", 0) == 0) {
+      if (std::sscanf(word.c_str() + 5, "%dx%d", &d.roomWidth, &d.roomHeight) != 2) {
+        error = "bad room= in extras of " + d.name;
+        return false;
+      }
     } else if (word == "warn") {
       d.warnsOdd = true;
     } else if (word == "steps") {
       d.checksSteps = true;
     } else if (word == "samplesteps") {
+      // 16-bit and 32-bit steps are shifted into samples, odd bytes dropped.
       d.stepsInSamples = true;
     } else if (word == "alphawritten") {
       d.writesAlpha = true;
@@ -234,6 +250,7 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
     if (o == "null") d.order.push_back({Check::NullTop});
     else if (o == "planes") d.order.push_back({Check::NullPlanes});
     else if (o == "size") d.order.push_back({Check::Size});
+    else if (o == "positive") d.order.push_back({Check::SizePositive});
     else if (o == "step") d.order.push_back({Check::Step});
     else {
       auto it = std::find_if(d.extras.begin(), d.extras.end(), [&](const Extra& e) { return e.name == o; });
@@ -415,13 +432,13 @@ const Descriptor* findDescriptor(const std::string& name) {
 
 Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offset)
     : d_(d), size_(size), pad_(padBytes) {
-  const int w = std::max(size.width, 0), h = std::max(size.height, 0);
+  const int w = std::max(std::max(size.width, 0), d.roomWidth), h = std::max(std::max(size.height, 0), d.roomHeight);
   auto addSide = [&](const Side& side, int sideIndex) {
     for (int p = 0; p < side.planes(); ++p) {
       Buffer b;
       b.geometry = planeGeometry(side, p, w, h);
       b.step = b.geometry.rowBytes + padBytes;
-      b.pitch = d.stepsInSamples ? b.step & -b.geometry.sampleBytes : b.step;
+      b.pitch = d.stepsInSamples ? b.step / b.geometry.sampleBytes * b.geometry.sampleBytes : b.step;
       const int rows = std::max(b.geometry.rows, 1);
       const size_t total = size_t(kGuard) * 2 + size_t(offset) + size_t(b.step) * rows + 64;
       b.bytes.assign(total, kGuardByte);
