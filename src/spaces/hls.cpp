@@ -207,11 +207,11 @@ Side sideOf(P* const* planes, int step) {
 }
 
 // RGB members: pointers, then size; steps unchecked.
-template <class Recipe, class Body, int Block, typename T, int Ch, bool Forward>
+template <class Body, class Tail, int Block, typename T, int Ch, bool Forward>
 Status rgbMember(const T* src, int srcStep, T* dst, int dstStep, ImageSize size) {
   if (!src || !dst) return StatusNullPointerError;
   if (badSize(size)) return StatusSizeError;
-  using M = Member<Recipe, Body, Block, Packed<T, Ch>, Packed<T, Ch>, 0, false>;
+  using M = Member<Body, Tail, Block, Packed<T, Ch>, Packed<T, Ch>, 0, false>;
   const Packed<T, Ch> in{bytes(src), wholeSamples<T>(srcStep)}, out{bytes(dst), wholeSamples<T>(dstStep)};
   if constexpr (Forward)
     walk<M>(in, out, size, [](const auto& i, const auto& o, int w, bool a) { forwardRow<M>(i, o, w, a); });
