@@ -204,8 +204,107 @@ ZELCC_API Status zeliYCrCb420ToBGR_Filter_8u_P3C4R(const uint8_t* const src[3], 
 /* ---- 16-bit packed RGB ---- */
 
 /* ---- YCoCg ---- */
+/* Interleaved BGR (RGB for the byte-plane pair) to and from planes Y, Co, Cg
+ * that share one step. `Rev` is the lifting transform that the inverse
+ * undoes exactly; `SBGR` samples are signed 16-bit. */
+ZELCC_API Status zeliBGRToYCoCg_8u16s_C3P3R(const uint8_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                            ImageSize size);
+ZELCC_API Status zeliBGRToYCoCg_8u16s_C4P3R(const uint8_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                            ImageSize size);
+ZELCC_API Status zeliBGRToYCoCg_Rev_8u16s_C3P3R(const uint8_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                                ImageSize size);
+ZELCC_API Status zeliBGRToYCoCg_Rev_8u16s_C4P3R(const uint8_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                                ImageSize size);
+ZELCC_API Status zeliRGBToYCoCg_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], int dstStep,
+                                         ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_16s32s_C3P3R(const int16_t* src, int srcStep, int32_t* const dst[3], int dstStep,
+                                              ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_16s32s_C4P3R(const int16_t* src, int srcStep, int32_t* const dst[3], int dstStep,
+                                              ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_16s_C3P3R(const int16_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                           ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_16s_C4P3R(const int16_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                           ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_Rev_16s32s_C3P3R(const int16_t* src, int srcStep, int32_t* const dst[3],
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_Rev_16s32s_C4P3R(const int16_t* src, int srcStep, int32_t* const dst[3],
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_Rev_16s_C3P3R(const int16_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                               ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_Rev_16s_C4P3R(const int16_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                               ImageSize size);
+ZELCC_API Status zeliYCoCgToBGR_16s8u_P3C3R(const int16_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                            ImageSize size);
+ZELCC_API Status zeliYCoCgToBGR_16s8u_P3C4R(const int16_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                            ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCoCgToBGR_Rev_16s8u_P3C3R(const int16_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                                ImageSize size);
+ZELCC_API Status zeliYCoCgToBGR_Rev_16s8u_P3C4R(const int16_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                                ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCoCgToRGB_8u_P3C3R(const uint8_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                         ImageSize size);
+ZELCC_API Status zeliYCoCgToSBGR_16s_P3C3R(const int16_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                           ImageSize size);
+ZELCC_API Status zeliYCoCgToSBGR_16s_P3C4R(const int16_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                           ImageSize size, int16_t alpha);
+ZELCC_API Status zeliYCoCgToSBGR_32s16s_P3C3R(const int32_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                              ImageSize size);
+ZELCC_API Status zeliYCoCgToSBGR_32s16s_P3C4R(const int32_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                              ImageSize size, int16_t alpha);
+ZELCC_API Status zeliYCoCgToSBGR_Rev_16s_P3C3R(const int16_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                               ImageSize size);
+ZELCC_API Status zeliYCoCgToSBGR_Rev_16s_P3C4R(const int16_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                               ImageSize size, int16_t alpha);
+ZELCC_API Status zeliYCoCgToSBGR_Rev_32s16s_P3C3R(const int32_t* const src[3], int srcStep, int16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCoCgToSBGR_Rev_32s16s_P3C4R(const int32_t* const src[3], int srcStep, int16_t* dst,
+                                                  int dstStep, ImageSize size, int16_t alpha);
 
 /* ---- HLS and HSV ---- */
+/* RGB or BGR to and from hue, lightness, saturation, in 32-bit float
+ * arithmetic. The RGB members use steps unchecked (16-bit and float steps
+ * count whole samples); the BGR members reject steps below 1. */
+ZELCC_API Status zeliRGBToHLS_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_AC4P4R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[4], int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_AP4C4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* dst, int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_AP4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* const dstPlanes[4],
+                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                     int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_AC4P4R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[4], int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_AP4C4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* dst, int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_AP4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* const dstPlanes[4],
+                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                     int dstStep, ImageSize size);
 
 /* ---- XYZ, LUV and Lab ---- */
 
