@@ -101,6 +101,36 @@ ZELCC_API Status zeliGrayToRGB_32f_C1C4R(const float* src, int srcStep, float* d
 /* ---- HLS and HSV ---- */
 
 /* ---- XYZ, LUV and Lab ---- */
+ZELCC_API Status zeliRGBToXYZ_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliXYZToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliXYZToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliXYZToRGB_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliXYZToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliXYZToRGB_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliXYZToRGB_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliXYZToRGB_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliXYZToRGB_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep,
+                                       ImageSize size);
 
 /* ---- Colour twist ---- */
 

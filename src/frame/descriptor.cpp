@@ -207,6 +207,9 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       d.warnsOdd = true;
     } else if (word == "steps") {
       d.checksSteps = true;
+    } else if (word == "samplesteps") {
+      // Steps shifted right to whole samples (16-bit and float members).
+      d.stepsInSamples = true;
     } else if (word == "alphawritten") {
       d.writesAlpha = true;
     } else if (word.rfind("order=", 0) == 0) {
@@ -418,7 +421,10 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
     for (int p = 0; p < side.planes(); ++p) {
       Buffer b;
       b.geometry = planeGeometry(side, p, w, h);
-      b.step = b.geometry.rowBytes + padBytes;
+      // A member that counts steps in samples moves by whole samples only.
+      const int sb = b.geometry.sampleBytes;
+      const int pad = d.stepsInSamples ? (padBytes + sb - 1) / sb * sb : padBytes;
+      b.step = b.geometry.rowBytes + pad;
       const int rows = std::max(b.geometry.rows, 1);
       const size_t total = size_t(kGuard) * 2 + size_t(offset) + size_t(b.step) * rows + 64;
       b.bytes.assign(total, kGuardByte);

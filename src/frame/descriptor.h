@@ -96,6 +96,7 @@ struct Descriptor {
   bool warnsOdd = false;        // may return StatusOddSizeWarning
   bool writesAlpha = false;     // an AC4 destination's fourth channel is written
   bool checksSteps = false;
+  bool stepsInSamples = false;  // byte steps shifted to whole samples: odd bytes are dropped
   void (*impl)() = nullptr;
   Invoker invoke = nullptr;
   std::vector<ArgKind> prototype;  // kinds of the prototype's parameters
