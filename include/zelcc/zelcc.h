@@ -99,6 +99,22 @@ ZELCC_API Status zeliGrayToRGB_32f_C1C4R(const float* src, int srcStep, float* d
 /* ---- YCoCg ---- */
 
 /* ---- HLS and HSV ---- */
+ZELCC_API Status zeliRGBToHSV_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliRGBToHSV_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToHSV_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToHSV_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliHSVToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliHSVToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliHSVToRGB_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliHSVToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
 
 /* ---- XYZ, LUV and Lab ---- */
 ZELCC_API Status zeliRGBToXYZ_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
