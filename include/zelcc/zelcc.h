@@ -117,6 +117,22 @@ ZELCC_API Status zeliHSVToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_
                                        ImageSize size);
 
 /* ---- XYZ, LUV and Lab ---- */
+ZELCC_API Status zeliRGBToLab_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliBGRToLab_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliBGRToLab_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliRGBToLab_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToLab_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliLabToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliLabToBGR_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliLabToBGR_16u8u_C3R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliLabToRGB_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliLabToBGR_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
 ZELCC_API Status zeliRGBToXYZ_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
                                      ImageSize size);
 ZELCC_API Status zeliRGBToXYZ_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
