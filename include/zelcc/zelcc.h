@@ -117,6 +117,42 @@ ZELCC_API Status zeliHSVToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_
                                        ImageSize size);
 
 /* ---- XYZ, LUV and Lab ---- */
+ZELCC_API Status zeliBGRToLUV_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToLUV_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliLUVToBGR_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliLUVToBGR_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliLUVToRGB_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliLUVToRGB_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliLUVToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliLUVToRGB_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliLUVToRGB_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliLUVToRGB_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliLUVToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliLUVToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliRGBToLUV_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliRGBToLUV_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToLUV_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliRGBToLUV_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToLUV_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliRGBToLUV_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToLUV_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToLUV_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
 ZELCC_API Status zeliRGBToLab_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
                                      ImageSize size);
 ZELCC_API Status zeliBGRToLab_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
