@@ -31,23 +31,23 @@ using namespace zel::lanes;
 
 template <int Stride>
 int rgbToXyzBlocks8u(Lanes lanes, const uint8_t* src, uint8_t* dst, int n) {
-  return lanes == Lanes::Avx2 ? avx2::fixedBlocks8u<lanes::F8, Stride, 15>(kForwardBody, src, dst, n)
-                              : sse::fixedBlocks8u<lanes::F4, Stride, 15>(kForwardBody, src, dst, n);
+  return lanes == Lanes::Avx2 ? avx2::fixedBlocks8u<lanes::F8, Stride, true>(src, dst, n)
+                              : sse::fixedBlocks8u<lanes::F4, Stride, true>(src, dst, n);
 }
 template <int Stride>
 int xyzToRgbBlocks8u(Lanes lanes, const uint8_t* src, uint8_t* dst, int n) {
-  return lanes == Lanes::Avx2 ? avx2::fixedBlocks8u<lanes::F8, Stride, 13>(kInverseBody, src, dst, n)
-                              : sse::fixedBlocks8u<lanes::F4, Stride, 13>(kInverseBody, src, dst, n);
+  return lanes == Lanes::Avx2 ? avx2::fixedBlocks8u<lanes::F8, Stride, false>(src, dst, n)
+                              : sse::fixedBlocks8u<lanes::F4, Stride, false>(src, dst, n);
 }
 template <int Stride, typename T>
 int rgbToXyzBlocks16(Lanes lanes, const T* src, T* dst, int n) {
-  return lanes == Lanes::Avx2 ? avx2::floatBlocks16<lanes::F8, Stride>(kRgbToXyz, src, dst, n)
-                              : sse::floatBlocks16<lanes::F4, Stride>(kRgbToXyz, src, dst, n);
+  return lanes == Lanes::Avx2 ? avx2::floatBlocks16<lanes::F8, Stride, T, true>(src, dst, n)
+                              : sse::floatBlocks16<lanes::F4, Stride, T, true>(src, dst, n);
 }
 template <int Stride, typename T>
 int xyzToRgbBlocks16(Lanes lanes, const T* src, T* dst, int n) {
-  return lanes == Lanes::Avx2 ? avx2::floatBlocks16<lanes::F8, Stride>(kXyzToRgb, src, dst, n)
-                              : sse::floatBlocks16<lanes::F4, Stride>(kXyzToRgb, src, dst, n);
+  return lanes == Lanes::Avx2 ? avx2::floatBlocks16<lanes::F8, Stride, T, false>(src, dst, n)
+                              : sse::floatBlocks16<lanes::F4, Stride, T, false>(src, dst, n);
 }
 template <int Stride>
 int rgbToXyzBlocks32f(Lanes lanes, const float* src, float* dst, int n) {
