@@ -22,10 +22,12 @@ inline constexpr float kInv8 = 0.003921569f;
 inline constexpr float kInv16 = 1.5259022e-5f;
 inline constexpr float kHueEps = 1.1920929e-7f;
 
-// Which branch of the hue wins when two channels share the largest value:
-// the blocks test R, then G, then B and take the first; the last pixels of a
-// row test all three in that order and the last test that holds wins.
-enum class Ties { FirstWins, LastWins };
+// Which branch of the hue wins when two channels share the largest value.
+// The blocks take the green branch where G is the largest and R is not, the
+// blue branch where B is the largest and the green one was not taken, and
+// the red branch otherwise. The last pixels of a row test R, G, B in order
+// and the last test that holds wins.
+enum class Ties { Block, Tail };
 
 // 8u forward with unrefined reciprocals; V is the largest sample.
 inline Levels rgbToHsv8u(int32_t red, int32_t green, int32_t blue, Ties ties) {
@@ -38,8 +40,10 @@ inline Levels rgbToHsv8u(int32_t red, int32_t green, int32_t blue, Ties ties) {
   const float ar = (mx - r) * rd, ag = (mx - g) * rd, ab = (mx - b) * rd;
   const float fromR = ab - ag, fromG = (ar - ab) + 2.0f, fromB = (ag - ar) + 4.0f;
   float h;
-  if (ties == Ties::FirstWins) {
-    h = mx == r ? fromR : (mx == g ? fromG : fromB);
+  if (ties == Ties::Block) {
+    const bool green = mx == g && mx != r;
+    const bool blue = mx == b && !green;
+    h = green ? fromG : (blue ? fromB : fromR);
   } else {
     h = fromR;
     if (mx == g) h = fromG;
@@ -51,11 +55,11 @@ inline Levels rgbToHsv8u(int32_t red, int32_t green, int32_t blue, Ties ties) {
 }
 // The block saturates to 8 bits, the tail keeps the low bits.
 inline Levels rgbToHsvBody8u(int32_t r, int32_t g, int32_t b) {
-  Levels o = rgbToHsv8u(r, g, b, Ties::FirstWins);
+  Levels o = rgbToHsv8u(r, g, b, Ties::Block);
   for (int32_t& c : o.c) c = c < 0 ? 0 : (c > 255 ? 255 : c);
   return o;
 }
-inline Levels rgbToHsvTail8u(int32_t r, int32_t g, int32_t b) { return rgbToHsv8u(r, g, b, Ties::LastWins); }
+inline Levels rgbToHsvTail8u(int32_t r, int32_t g, int32_t b) { return rgbToHsv8u(r, g, b, Ties::Tail); }
 
 // 16u forward, one pixel at a time: integer max and min, true divisions,
 // the last test that holds wins a tie, and a hue only just below 0 stays

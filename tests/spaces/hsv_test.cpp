@@ -120,23 +120,31 @@ TEST(HsvReference, InverseSextants) {
   }
 }
 
-TEST(HsvReference, TiesGoToRedInBlocksAndToTheLaterBranchInTheTail) {
+TEST(HsvReference, TiesBetweenHueBranches) {
   // R = G = max: the block takes the red branch, the tail the green one.
   // Both are one sextant, up to the reciprocal's rounding.
   int differing = 0;
   for (int m = 2; m < 256; ++m)
     for (int b = 0; b < m; b += 13) {
-      const Levels body = rgbToHsv8u(m, m, b, Ties::FirstWins), tail = rgbToHsv8u(m, m, b, Ties::LastWins);
+      const Levels body = rgbToHsv8u(m, m, b, Ties::Block), tail = rgbToHsv8u(m, m, b, Ties::Tail);
       EXPECT_NEAR(body.c[0], 42.5, 1.0);
       EXPECT_NEAR(tail.c[0], 42.5, 1.0);
       differing += body.c[0] != tail.c[0];
+      // R = B = max: the blue branch in both.
+      EXPECT_EQ(rgbToHsv8u(m, b, m, Ties::Block).c[0], rgbToHsv8u(m, b, m, Ties::Tail).c[0]);
+      // G = B = max: green in the block, blue in the tail; three sextants.
+      EXPECT_NEAR(rgbToHsv8u(b, m, m, Ties::Block).c[0], 127.5, 1.0);
+      EXPECT_NEAR(rgbToHsv8u(b, m, m, Ties::Tail).c[0], 127.5, 1.0);
     }
   EXPECT_GT(differing, 0) << "the branch order made no difference anywhere";
   // Through the export: width 4 is all body, width 3 all tail.
   const auto blocks = convertRow(zeliRGBToHSV_8u_C3R, repeat<uint8_t>({200, 200, 50}, 4), 3);
   const auto tails = convertRow(zeliRGBToHSV_8u_C3R, repeat<uint8_t>({200, 200, 50}, 3), 3);
-  EXPECT_EQ(blocks[0], rgbToHsv8u(200, 200, 50, Ties::FirstWins).c[0]);
-  EXPECT_EQ(tails[0], rgbToHsv8u(200, 200, 50, Ties::LastWins).c[0]);
+  EXPECT_EQ(blocks[0], rgbToHsv8u(200, 200, 50, Ties::Block).c[0]);
+  EXPECT_EQ(tails[0], rgbToHsv8u(200, 200, 50, Ties::Tail).c[0]);
+  // 16u, one pixel at a time, lets the last test win: G = B gives blue's
+  // (4 - aR) + aG = 3 sextants, the same as green's (aR + 2) - aB.
+  EXPECT_EQ(rgbToHsv16u(0, 65535, 65535).c[0], 32768);
 }
 
 // ---- every member over all widths ----
