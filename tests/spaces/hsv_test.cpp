@@ -10,29 +10,14 @@ namespace {
 
 using namespace zel::spaces::hsv;
 using zel::spaces::StepUnit;
+using zel::test::convertRow;
 using zel::test::Member;
+using zel::test::repeat;
 
 template <typename T, Levels (*F)(int32_t, int32_t, int32_t)>
 void levelsPixel(const T* in, T* out) {
   const Levels o = F(zel::spaces::level(in), zel::spaces::level(in + 1), zel::spaces::level(in + 2));
   for (int k = 0; k < 3; ++k) zel::spaces::storeLevel(out + k, o.c[k]);
-}
-
-template <typename T>
-std::vector<T> convertRow(Status (*fn)(const T*, int, T*, int, ImageSize), const std::vector<T>& src, int stride) {
-  const int width = int(src.size()) / stride;
-  std::vector<T> dst(src.size(), T(0x55));
-  const int step = width * stride * int(sizeof(T));
-  EXPECT_EQ(fn(src.data(), step, dst.data(), step, ImageSize{width, 1}), StatusOk);
-  return dst;
-}
-
-// `width` copies of one pixel.
-template <typename T>
-std::vector<T> repeat(std::initializer_list<T> pixel, int width) {
-  std::vector<T> out;
-  for (int x = 0; x < width; ++x) out.insert(out.end(), pixel);
-  return out;
 }
 
 TEST(HsvReference, GreyAndBlackHaveNoHueOrSaturation) {
@@ -51,7 +36,7 @@ TEST(HsvReference, GreyAndBlackHaveNoHueOrSaturation) {
         EXPECT_EQ(out[x * 4], 0);
         EXPECT_EQ(out[x * 4 + 1], 0);
         EXPECT_EQ(out[x * 4 + 2], g);
-        EXPECT_EQ(out[x * 4 + 3], 0x55);
+        EXPECT_EQ(out[x * 4 + 3], 7);
       }
     }
   }
@@ -166,66 +151,50 @@ uint16_t hsvWord(std::mt19937& rng) {
   }
 }
 
-template <int Stride>
-Member<uint8_t, uint8_t> forward8u() {
-  Member<uint8_t, uint8_t> m;
-  m.name = "RGBToHSV_8u";
-  m.srcStride = m.dstStride = Stride;
-  m.body = levelsPixel<uint8_t, rgbToHsvBody8u>;
-  m.tail = levelsPixel<uint8_t, rgbToHsvTail8u>;
-  m.unit = StepUnit::Samples;
-  m.sample = [](std::mt19937& rng) {
-    // Few distinct values, so that ties between channels are frequent.
-    const uint32_t r = rng();
-    return (r & 1) ? uint8_t(r >> 8) : uint8_t(((r >> 8) % 4) * 85);
-  };
-  return m;
+// Few distinct values, so that ties between channels are frequent.
+uint8_t tiedByte(std::mt19937& rng) {
+  const uint32_t r = rng();
+  return (r & 1) ? uint8_t(r >> 8) : uint8_t(((r >> 8) % 4) * 85);
 }
 
-template <int Stride>
-Member<uint16_t, uint16_t> forward16u() {
-  Member<uint16_t, uint16_t> m;
-  m.name = "RGBToHSV_16u";
-  m.srcStride = m.dstStride = Stride;
-  m.block = 0;
-  m.tail = levelsPixel<uint16_t, rgbToHsv16u>;
-  m.unit = StepUnit::Samples;
-  m.sample = hsvWord;
-  return m;
-}
-
-template <int Stride, typename T>
-Member<T, T> inverse() {
-  Member<T, T> m;
-  m.name = sizeof(T) == 1 ? "HSVToRGB_8u" : "HSVToRGB_16u";
-  m.srcStride = m.dstStride = Stride;
-  m.body = m.tail = sizeof(T) == 1 ? levelsPixel<T, hsvToRgb8u> : levelsPixel<T, hsvToRgb16u>;
-  m.unit = StepUnit::Samples;
-  if constexpr (sizeof(T) == 1)
-    m.sample = hsvByte;
-  else
-    m.sample = hsvWord;
-  return m;
-}
-
-TEST(HsvMembers, FollowTheirFormulas) {
-  zel::test::expectExportFollowsFormulas(zeliRGBToHSV_8u_C3R, forward8u<3>());
-  zel::test::expectExportFollowsFormulas(zeliRGBToHSV_8u_AC4R, forward8u<4>());
-  zel::test::expectExportFollowsFormulas(zeliRGBToHSV_16u_C3R, forward16u<3>());
-  zel::test::expectExportFollowsFormulas(zeliRGBToHSV_16u_AC4R, forward16u<4>());
-  zel::test::expectExportFollowsFormulas(zeliHSVToRGB_8u_C3R, inverse<3, uint8_t>());
-  zel::test::expectExportFollowsFormulas(zeliHSVToRGB_8u_AC4R, inverse<4, uint8_t>());
-  zel::test::expectExportFollowsFormulas(zeliHSVToRGB_16u_C3R, inverse<3, uint16_t>());
-  zel::test::expectExportFollowsFormulas(zeliHSVToRGB_16u_AC4R, inverse<4, uint16_t>());
-}
-
-TEST(HsvMembers, VectorBodiesMatchTheBodyFormulas) {
-  zel::test::expectBlocksFollowBody(rgbToHsvBlocks8u<3>, forward8u<3>());
-  zel::test::expectBlocksFollowBody(rgbToHsvBlocks8u<4>, forward8u<4>());
-  zel::test::expectBlocksFollowBody(hsvToRgbBlocks<3, uint8_t>, inverse<3, uint8_t>());
-  zel::test::expectBlocksFollowBody(hsvToRgbBlocks<4, uint8_t>, inverse<4, uint8_t>());
-  zel::test::expectBlocksFollowBody(hsvToRgbBlocks<3, uint16_t>, inverse<3, uint16_t>());
-  zel::test::expectBlocksFollowBody(hsvToRgbBlocks<4, uint16_t>, inverse<4, uint16_t>());
+TEST(HsvMembers, FollowTheirFormulasInEveryZone) {
+  using M8 = Member<uint8_t, uint8_t>;
+  using M16 = Member<uint16_t, uint16_t>;
+  const auto forwardBody = levelsPixel<uint8_t, rgbToHsvBody8u>, forwardTail = levelsPixel<uint8_t, rgbToHsvTail8u>;
+  const auto inverse8 = levelsPixel<uint8_t, hsvToRgb8u>;
+  const auto inverse16 = levelsPixel<uint16_t, hsvToRgb16u>;
+  zel::test::expectMembers<uint8_t, uint8_t>({
+      M8("RGBToHSV_8u_C3", zeliRGBToHSV_8u_C3R).zones(4, rgbToHsvBlocks8u<3>, forwardBody, forwardTail).samples(tiedByte),
+      M8("RGBToHSV_8u_AC4", zeliRGBToHSV_8u_AC4R)
+          .stride(4)
+          .zones(4, rgbToHsvBlocks8u<4>, forwardBody, forwardTail)
+          .samples(tiedByte),
+      M8("HSVToRGB_8u_C3", zeliHSVToRGB_8u_C3R).zones(4, hsvToRgbBlocks<3, uint8_t>, inverse8, inverse8).samples(hsvByte),
+      M8("HSVToRGB_8u_AC4", zeliHSVToRGB_8u_AC4R)
+          .stride(4)
+          .zones(4, hsvToRgbBlocks<4, uint8_t>, inverse8, inverse8)
+          .samples(hsvByte),
+  });
+  zel::test::expectMembers<uint16_t, uint16_t>({
+      M16("RGBToHSV_16u_C3", zeliRGBToHSV_16u_C3R)
+          .oneFormula(levelsPixel<uint16_t, rgbToHsv16u>)
+          .stepsInSamples()
+          .samples(hsvWord),
+      M16("RGBToHSV_16u_AC4", zeliRGBToHSV_16u_AC4R)
+          .stride(4)
+          .oneFormula(levelsPixel<uint16_t, rgbToHsv16u>)
+          .stepsInSamples()
+          .samples(hsvWord),
+      M16("HSVToRGB_16u_C3", zeliHSVToRGB_16u_C3R)
+          .zones(4, hsvToRgbBlocks<3, uint16_t>, inverse16, inverse16)
+          .stepsInSamples()
+          .samples(hsvWord),
+      M16("HSVToRGB_16u_AC4", zeliHSVToRGB_16u_AC4R)
+          .stride(4)
+          .zones(4, hsvToRgbBlocks<4, uint16_t>, inverse16, inverse16)
+          .stepsInSamples()
+          .samples(hsvWord),
+  });
 }
 
 TEST(HsvMembers, SixteenBitStepsDropAnOddByte) {

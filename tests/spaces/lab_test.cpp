@@ -13,23 +13,9 @@ namespace {
 
 using namespace zel::spaces::lab;
 using zel::spaces::CubeRootTable;
+using zel::test::convertRow;
 using zel::test::Member;
-
-template <typename S, typename D>
-std::vector<D> convertRow(Status (*fn)(const S*, int, D*, int, ImageSize), const std::vector<S>& src) {
-  const int width = int(src.size()) / 3;
-  std::vector<D> dst(src.size(), D(0));
-  EXPECT_EQ(fn(src.data(), width * 3 * int(sizeof(S)), dst.data(), width * 3 * int(sizeof(D)), ImageSize{width, 1}),
-            StatusOk);
-  return dst;
-}
-
-template <typename T>
-std::vector<T> repeat(std::initializer_list<T> pixel, int width) {
-  std::vector<T> out;
-  for (int x = 0; x < width; ++x) out.insert(out.end(), pixel);
-  return out;
-}
+using zel::test::repeat;
 
 // Lab of linear RGB in double precision, for the float forms.
 Floats exactLab(double r, double g, double b) {
@@ -43,8 +29,8 @@ Floats exactLab(double r, double g, double b) {
 
 TEST(LabReference, BlackAndWhiteAreNeutral) {
   for (int width : {3, 4, 5}) {
-    const auto black = convertRow<uint8_t, uint8_t>(zeliRGBToLab_8u_C3R, repeat<uint8_t>({0, 0, 0}, width));
-    const auto white = convertRow<uint8_t, uint8_t>(zeliBGRToLab_8u_C3R, repeat<uint8_t>({255, 255, 255}, width));
+    const auto black = convertRow(zeliRGBToLab_8u_C3R, repeat<uint8_t>({0, 0, 0}, width));
+    const auto white = convertRow(zeliBGRToLab_8u_C3R, repeat<uint8_t>({255, 255, 255}, width));
     for (int x = 0; x < width; ++x) {
       EXPECT_EQ(black[x * 3], 0);
       EXPECT_EQ(black[x * 3 + 1], 128);
@@ -60,7 +46,7 @@ TEST(LabReference, BlackAndWhiteAreNeutral) {
   EXPECT_EQ(zel::TruncateToInt(y * zel::spaces::kCubeIndexScale), 127);
   // Greys in the 16-bit coding: a and b near 128 * 255.
   for (int v : {1, 50, 128, 255}) {
-    const auto out = convertRow<uint8_t, uint16_t>(
+    const auto out = convertRow(
         zeliBGRToLab_8u16u_C3R, repeat<uint8_t>({uint8_t(v), uint8_t(v), uint8_t(v)}, 5));
     for (int x = 0; x < 5; ++x) {
       EXPECT_NEAR(out[x * 3 + 1], 32640, 40) << v;
@@ -110,21 +96,21 @@ TEST(LabReference, InverseHasNoLinearSegment) {
   // L = 0 with neutral a, b: fy = 16/116, Y about 0.669 of 255, so the
   // result is 1, 1, 1 and not black.
   for (int width : {3, 4, 5}) {
-    const auto rgb = convertRow<uint8_t, uint8_t>(zeliLabToRGB_8u_C3R, repeat<uint8_t>({0, 128, 128}, width));
+    const auto rgb = convertRow(zeliLabToRGB_8u_C3R, repeat<uint8_t>({0, 128, 128}, width));
     for (uint8_t v : rgb) EXPECT_EQ(v, 1);
   }
   // Float outputs are not clamped: a saturated Lab leaves 0..1.
-  const auto rgb = convertRow<float, float>(zeliLabToRGB_32f_C3R, repeat<float>({60.0f, 120.0f, -110.0f}, 5));
+  const auto rgb = convertRow(zeliLabToRGB_32f_C3R, repeat<float>({60.0f, 120.0f, -110.0f}, 5));
   bool outside = false;
   for (float v : rgb) outside |= v < 0.0f || v > 1.0f;
   EXPECT_TRUE(outside);
   // The 16-bit coding of neutral black: the same as 8u.
-  const auto grey = convertRow<uint16_t, uint8_t>(zeliLabToBGR_16u8u_C3R, repeat<uint16_t>({0, 32640, 32640}, 3));
+  const auto grey = convertRow(zeliLabToBGR_16u8u_C3R, repeat<uint16_t>({0, 32640, 32640}, 3));
   for (uint8_t v : grey) EXPECT_EQ(v, 1);
 }
 
 std::vector<uint8_t> bytes(Status (*fn)(const uint8_t*, int, uint8_t*, int, ImageSize), const std::vector<uint8_t>& s) {
-  return convertRow<uint8_t, uint8_t>(fn, s);
+  return convertRow(fn, s);
 }
 
 std::vector<uint8_t> swapOuter(std::vector<uint8_t> v) {
@@ -146,57 +132,33 @@ TEST(LabReference, BgrNamesSwapTheRgbSide) {
 // ---- every member over all widths ----
 
 template <typename S, typename D, bool Bgr>
-Member<S, D> forward(const char* name) {
-  Member<S, D> m;
-  m.name = name;
-  m.body = forwardPixel<S, D, Bgr, Zone::Body>;
-  m.tail = forwardPixel<S, D, Bgr, Zone::Tail>;
-  return m;
+Member<S, D> forward(const char* name, Status (*fn)(const S*, int, D*, int, ImageSize)) {
+  return Member<S, D>(name, fn).zones(4, forwardBlocks<S, D, Bgr>, forwardPixel<S, D, Bgr, Zone::Body>,
+                                      forwardPixel<S, D, Bgr, Zone::Tail>);
 }
 
 template <typename S, typename D, bool Bgr>
-Member<S, D> inverse(const char* name) {
-  Member<S, D> m;
-  m.name = name;
-  m.body = m.tail = inversePixel<S, D, Bgr>;
-  if constexpr (std::is_same_v<S, float>) {
-    m.sample = [](std::mt19937& rng) { return float(std::uniform_real_distribution<double>(-128, 127)(rng)); };
-  }
-  return m;
+Member<S, D> inverse(const char* name, Status (*fn)(const S*, int, D*, int, ImageSize)) {
+  return Member<S, D>(name, fn).zones(4, inverseBlocks<S, D, Bgr>, inversePixel<S, D, Bgr>, inversePixel<S, D, Bgr>);
 }
 
-TEST(LabMembers, FollowTheirFormulas) {
-  zel::test::expectExportFollowsFormulas(zeliRGBToLab_8u_C3R, forward<uint8_t, uint8_t, false>("RGBToLab_8u"));
-  zel::test::expectExportFollowsFormulas(zeliBGRToLab_8u_C3R, forward<uint8_t, uint8_t, true>("BGRToLab_8u"));
-  zel::test::expectExportFollowsFormulas(zeliBGRToLab_8u16u_C3R,
-                                         forward<uint8_t, uint16_t, true>("BGRToLab_8u16u"));
-  zel::test::expectExportFollowsFormulas(zeliRGBToLab_32f_C3R, forward<float, float, false>("RGBToLab_32f"));
-  zel::test::expectExportFollowsFormulas(zeliBGRToLab_32f_C3R, forward<float, float, true>("BGRToLab_32f"));
-  zel::test::expectExportFollowsFormulas(zeliLabToRGB_8u_C3R, inverse<uint8_t, uint8_t, false>("LabToRGB_8u"));
-  zel::test::expectExportFollowsFormulas(zeliLabToBGR_8u_C3R, inverse<uint8_t, uint8_t, true>("LabToBGR_8u"));
-  zel::test::expectExportFollowsFormulas(zeliLabToBGR_16u8u_C3R,
-                                         inverse<uint16_t, uint8_t, true>("LabToBGR_16u8u"));
-  zel::test::expectExportFollowsFormulas(zeliLabToRGB_32f_C3R, inverse<float, float, false>("LabToRGB_32f"));
-  zel::test::expectExportFollowsFormulas(zeliLabToBGR_32f_C3R, inverse<float, float, true>("LabToBGR_32f"));
-}
+float labFloat(std::mt19937& rng) { return float(std::uniform_real_distribution<double>(-128, 127)(rng)); }
 
-TEST(LabMembers, VectorBodiesMatchTheBodyFormulas) {
-  zel::test::expectBlocksFollowBody(forwardBlocks<uint8_t, uint8_t, false>,
-                                    forward<uint8_t, uint8_t, false>("RGBToLab_8u"));
-  zel::test::expectBlocksFollowBody(forwardBlocks<uint8_t, uint8_t, true>,
-                                    forward<uint8_t, uint8_t, true>("BGRToLab_8u"));
-  zel::test::expectBlocksFollowBody(forwardBlocks<uint8_t, uint16_t, true>,
-                                    forward<uint8_t, uint16_t, true>("BGRToLab_8u16u"));
-  zel::test::expectBlocksFollowBody(forwardBlocks<float, float, false>, forward<float, float, false>("RGBToLab_32f"));
-  zel::test::expectBlocksFollowBody(forwardBlocks<float, float, true>, forward<float, float, true>("BGRToLab_32f"));
-  zel::test::expectBlocksFollowBody(inverseBlocks<uint8_t, uint8_t, false>,
-                                    inverse<uint8_t, uint8_t, false>("LabToRGB_8u"));
-  zel::test::expectBlocksFollowBody(inverseBlocks<uint8_t, uint8_t, true>,
-                                    inverse<uint8_t, uint8_t, true>("LabToBGR_8u"));
-  zel::test::expectBlocksFollowBody(inverseBlocks<uint16_t, uint8_t, true>,
-                                    inverse<uint16_t, uint8_t, true>("LabToBGR_16u8u"));
-  zel::test::expectBlocksFollowBody(inverseBlocks<float, float, false>, inverse<float, float, false>("LabToRGB_32f"));
-  zel::test::expectBlocksFollowBody(inverseBlocks<float, float, true>, inverse<float, float, true>("LabToBGR_32f"));
+TEST(LabMembers, FollowTheirFormulasInEveryZone) {
+  zel::test::expectMembers<uint8_t, uint8_t>({
+      forward<uint8_t, uint8_t, false>("RGBToLab_8u", zeliRGBToLab_8u_C3R),
+      forward<uint8_t, uint8_t, true>("BGRToLab_8u", zeliBGRToLab_8u_C3R),
+      inverse<uint8_t, uint8_t, false>("LabToRGB_8u", zeliLabToRGB_8u_C3R),
+      inverse<uint8_t, uint8_t, true>("LabToBGR_8u", zeliLabToBGR_8u_C3R),
+  });
+  zel::test::expectMembers<uint8_t, uint16_t>({forward<uint8_t, uint16_t, true>("BGRToLab_8u16u", zeliBGRToLab_8u16u_C3R)});
+  zel::test::expectMembers<uint16_t, uint8_t>({inverse<uint16_t, uint8_t, true>("LabToBGR_16u8u", zeliLabToBGR_16u8u_C3R)});
+  zel::test::expectMembers<float, float>({
+      forward<float, float, false>("RGBToLab_32f", zeliRGBToLab_32f_C3R),
+      forward<float, float, true>("BGRToLab_32f", zeliBGRToLab_32f_C3R),
+      inverse<float, float, false>("LabToRGB_32f", zeliLabToRGB_32f_C3R).samples(labFloat),
+      inverse<float, float, true>("LabToBGR_32f", zeliLabToBGR_32f_C3R).samples(labFloat),
+  });
 }
 
 TEST(LabMembers, FloatStepsStayInBytes) {

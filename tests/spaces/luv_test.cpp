@@ -13,23 +13,9 @@ namespace {
 
 using namespace zel::spaces::luv;
 using zel::spaces::StepUnit;
+using zel::test::convertRow;
 using zel::test::Member;
-
-template <typename S, typename D>
-std::vector<D> convertRow(Status (*fn)(const S*, int, D*, int, ImageSize), const std::vector<S>& src, int stride) {
-  const int width = int(src.size()) / stride;
-  std::vector<D> dst(src.size(), D(0x7));
-  const int step = width * stride * int(sizeof(S));
-  EXPECT_EQ(fn(src.data(), step, dst.data(), step, ImageSize{width, 1}), StatusOk);
-  return dst;
-}
-
-template <typename T>
-std::vector<T> repeat(std::initializer_list<T> pixel, int width) {
-  std::vector<T> out;
-  for (int x = 0; x < width; ++x) out.insert(out.end(), pixel);
-  return out;
-}
+using zel::test::repeat;
 
 // CIE L*u*v* of linear RGB in double precision.
 Floats exactLuv(double r, double g, double b) {
@@ -46,7 +32,7 @@ TEST(LuvReference, BlackInTheSixteenBitZones) {
   // A block adds 3 to the zero D and codes U, V from it; the last pixels of
   // a row code them as zero. Width 4 is one block, width 3 has none.
   for (int width : {3, 4, 5, 8}) {
-    const auto out = convertRow<uint16_t, uint16_t>(zeliRGBToLUV_16u_C3R, repeat<uint16_t>({0, 0, 0}, width), 3);
+    const auto out = convertRow(zeliRGBToLUV_16u_C3R, repeat<uint16_t>({0, 0, 0}, width), 3);
     const int body = width & ~3;
     for (int x = 0; x < width; ++x) {
       EXPECT_EQ(out[x * 3], 0);
@@ -55,7 +41,7 @@ TEST(LuvReference, BlackInTheSixteenBitZones) {
     }
   }
   // 16s: the same levels, biased back.
-  const auto s = convertRow<int16_t, int16_t>(zeliRGBToLUV_16s_AC4R, repeat<int16_t>({-32768, -32768, -32768, 0}, 5), 4);
+  const auto s = convertRow(zeliRGBToLUV_16s_AC4R, repeat<int16_t>({-32768, -32768, -32768, 0}, 5), 4);
   EXPECT_EQ(s[1], 24807 - 32768);
   EXPECT_EQ(s[2], 35019 - 32768);
   EXPECT_EQ(s[4 * 4], -32768);
@@ -68,8 +54,8 @@ TEST(LuvReference, BlackInTheEightBitForms) {
   // U from 96.525 and V from 136.26, in the table form (both zones) and in
   // the power form.
   for (int width : {3, 4, 5}) {
-    const auto table = convertRow<uint8_t, uint8_t>(zeliRGBToLUV_8u_C3R, repeat<uint8_t>({0, 0, 0}, width), 3);
-    const auto power = convertRow<uint8_t, uint8_t>(zeliRGBToLUV_8u_AC4R, repeat<uint8_t>({0, 0, 0, 0}, width), 4);
+    const auto table = convertRow(zeliRGBToLUV_8u_C3R, repeat<uint8_t>({0, 0, 0}, width), 3);
+    const auto power = convertRow(zeliRGBToLUV_8u_AC4R, repeat<uint8_t>({0, 0, 0, 0}, width), 4);
     for (int x = 0; x < width; ++x) {
       EXPECT_EQ(table[x * 3], 0);
       EXPECT_EQ(table[x * 3 + 1], 97);
@@ -146,8 +132,8 @@ TEST(LuvReference, SixteenBitTailsRoundOrTruncateByMember) {
   std::mt19937 rng(2);
   for (int i = 0; i < 200; ++i) {
     const uint16_t r = uint16_t(rng()), g = uint16_t(rng()), b = uint16_t(rng());
-    const auto c3 = convertRow<uint16_t, uint16_t>(zeliRGBToLUV_16u_C3R, repeat<uint16_t>({r, g, b}, 5), 3);
-    const auto ac4 = convertRow<uint16_t, uint16_t>(zeliRGBToLUV_16u_AC4R, repeat<uint16_t>({r, g, b, 0}, 5), 4);
+    const auto c3 = convertRow(zeliRGBToLUV_16u_C3R, repeat<uint16_t>({r, g, b}, 5), 3);
+    const auto ac4 = convertRow(zeliRGBToLUV_16u_AC4R, repeat<uint16_t>({r, g, b, 0}, 5), 4);
     for (int k = 0; k < 3; ++k) {
       EXPECT_EQ(c3[k], ac4[k]);
       EXPECT_LE(ac4[16 + k], c3[12 + k]);
@@ -161,7 +147,7 @@ TEST(LuvReference, InverseOfZeroLightness) {
   // The tail gives black; a block runs on the guarded L and gives values
   // near 0 that depend on U and V.
   for (int width : {3, 4}) {
-    const auto out = convertRow<uint8_t, uint8_t>(zeliLUVToRGB_8u_C3R, repeat<uint8_t>({0, 97, 136}, width), 3);
+    const auto out = convertRow(zeliLUVToRGB_8u_C3R, repeat<uint8_t>({0, 97, 136}, width), 3);
     for (uint8_t v : out) EXPECT_LE(v, 2);
   }
   bool dependsOnChroma = false;
@@ -177,7 +163,7 @@ TEST(LuvReference, InverseOfZeroLightness) {
     }
   EXPECT_TRUE(dependsOnChroma);
   // 16-bit tails: black is 0 in 16u and -32768 in 16s.
-  const auto s = convertRow<int16_t, int16_t>(zeliLUVToRGB_16s_C3R, repeat<int16_t>({-32768, 100, -200}, 3), 3);
+  const auto s = convertRow(zeliLUVToRGB_16s_C3R, repeat<int16_t>({-32768, 100, -200}, 3), 3);
   for (int16_t v : s) EXPECT_EQ(v, -32768);
 }
 
@@ -192,7 +178,7 @@ TEST(LuvReference, FloatInverseClampsOnlyInTheTail) {
     EXPECT_LE(tail.c[k], 1.0f);
   }
   EXPECT_TRUE(negative);
-  const auto out = convertRow<float, float>(zeliLUVToRGB_32f_C3R, repeat<float>({50.0f, -120.0f, 100.0f}, 5), 3);
+  const auto out = convertRow(zeliLUVToRGB_32f_C3R, repeat<float>({50.0f, -120.0f, 100.0f}, 5), 3);
   for (int k = 0; k < 3; ++k) {
     EXPECT_EQ(out[k], body.c[k]);
     EXPECT_EQ(out[12 + k], tail.c[k]);
@@ -211,75 +197,6 @@ T luvWord(std::mt19937& rng) {
   return (r & 7) == 0 ? T(std::is_signed_v<T> ? -32768 : 0) : T(r >> 8);
 }
 
-template <bool Bgr>
-Member<uint8_t, uint8_t> forwardTable(const char* name) {
-  Member<uint8_t, uint8_t> m;
-  m.name = name;
-  m.body = forwardTablePixel<Bgr, Zone::Body>;
-  m.tail = forwardTablePixel<Bgr, Zone::Tail>;
-  m.sample = luvByte;
-  return m;
-}
-
-Member<uint8_t, uint8_t> forwardPower() {
-  Member<uint8_t, uint8_t> m;
-  m.name = "RGBToLUV_8u_AC4";
-  m.srcStride = m.dstStride = 4;
-  m.block = 0;
-  m.tail = forwardPowerPixel;
-  m.sample = luvByte;
-  return m;
-}
-
-template <int Stride, bool Bgr>
-Member<float, float> forwardFloat(const char* name) {
-  Member<float, float> m;
-  m.name = name;
-  m.srcStride = m.dstStride = Stride;
-  m.body = forward32fPixel<Bgr, Zone::Body>;
-  m.tail = forward32fPixel<Bgr, Zone::Tail>;
-  m.sample = [](std::mt19937& rng) {
-    const uint32_t r = rng();
-    return (r & 7) == 0 ? 0.0f : float(r >> 8) / 16777216.0f;
-  };
-  return m;
-}
-
-template <int Stride, typename T>
-Member<T, T> forwardWide(const char* name) {
-  Member<T, T> m;
-  m.name = name;
-  m.srcStride = m.dstStride = Stride;
-  m.body = forward16Pixel<T, Zone::Body>;
-  m.tail = forward16Pixel<T, Zone::Tail, Stride == 4 && std::is_same_v<T, uint16_t>>;
-  m.unit = StepUnit::Samples;
-  m.sample = luvWord<T>;
-  return m;
-}
-
-template <int Stride, bool Bgr>
-Member<uint8_t, uint8_t> inverse8u(const char* name) {
-  Member<uint8_t, uint8_t> m;
-  m.name = name;
-  m.srcStride = m.dstStride = Stride;
-  m.body = inverse8uPixel<Bgr, Stride == 4, Zone::Body>;
-  m.tail = inverse8uPixel<Bgr, Stride == 4, Zone::Tail>;
-  m.sample = luvByte;
-  return m;
-}
-
-template <int Stride, typename T>
-Member<T, T> inverseWide(const char* name) {
-  Member<T, T> m;
-  m.name = name;
-  m.srcStride = m.dstStride = Stride;
-  m.body = inverse16Pixel<T, Zone::Body>;
-  m.tail = inverse16Pixel<T, Zone::Tail>;
-  m.unit = StepUnit::Samples;
-  m.sample = luvWord<T>;
-  return m;
-}
-
 // L, U, V over their ranges, with zero and tiny lightness now and then.
 float luvFloat(std::mt19937& rng) {
   const uint32_t r = rng();
@@ -289,63 +206,88 @@ float luvFloat(std::mt19937& rng) {
     default: return float(r >> 8) / 16777216.0f * 300.0f - 140.0f;
   }
 }
+float unitFloat(std::mt19937& rng) {
+  const uint32_t r = rng();
+  return (r & 7) == 0 ? 0.0f : float(r >> 8) / 16777216.0f;
+}
 
+using M8 = Member<uint8_t, uint8_t>;
+using M32 = Member<float, float>;
+
+template <typename T, int Stride>
+Member<T, T> forwardWide(const char* name, Status (*fn)(const T*, int, T*, int, ImageSize)) {
+  constexpr bool truncating = Stride == 4 && std::is_same_v<T, uint16_t>;
+  return Member<T, T>(name, fn)
+      .stride(Stride)
+      .zones(4, forward16Blocks<Stride, T>, forward16Pixel<T, Zone::Body>, forward16Pixel<T, Zone::Tail, truncating>)
+      .stepsInSamples()
+      .samples(luvWord<T>);
+}
+template <typename T, int Stride>
+Member<T, T> inverseWide(const char* name, Status (*fn)(const T*, int, T*, int, ImageSize)) {
+  return Member<T, T>(name, fn)
+      .stride(Stride)
+      .zones(4, inverse16Blocks<Stride, T>, inverse16Pixel<T, Zone::Body>, inverse16Pixel<T, Zone::Tail>)
+      .stepsInSamples()
+      .samples(luvWord<T>);
+}
 template <int Stride, bool Bgr>
-Member<float, float> inverseFloat(const char* name) {
-  Member<float, float> m;
-  m.name = name;
-  m.srcStride = m.dstStride = Stride;
-  m.body = inverse32fPixel<Bgr, Zone::Body>;
-  m.tail = inverse32fPixel<Bgr, Zone::Tail>;
-  if (Stride == 4) {
-    m.block = 0;
-    m.unit = StepUnit::Samples;
-  }
-  m.sample = luvFloat;
-  return m;
+M8 inverse8u(const char* name, M8::Export fn) {
+  return M8(name, fn)
+      .stride(Stride)
+      .zones(4, inverse8uBlocks<Stride, Bgr>, inverse8uPixel<Bgr, Stride == 4, Zone::Body>,
+             inverse8uPixel<Bgr, Stride == 4, Zone::Tail>)
+      .samples(luvByte);
+}
+template <int Stride, bool Bgr>
+M32 forwardFloat(const char* name, M32::Export fn) {
+  return M32(name, fn)
+      .stride(Stride)
+      .zones(4, forward32fBlocks<Stride, Bgr>, forward32fPixel<Bgr, Zone::Body>, forward32fPixel<Bgr, Zone::Tail>)
+      .samples(unitFloat);
 }
 
-TEST(LuvMembers, ForwardFollowTheirFormulas) {
-  zel::test::expectExportFollowsFormulas(zeliRGBToLUV_8u_C3R, forwardTable<false>("RGBToLUV_8u_C3"));
-  zel::test::expectExportFollowsFormulas(zeliBGRToLUV_8u_C3R, forwardTable<true>("BGRToLUV_8u_C3"));
-  zel::test::expectExportFollowsFormulas(zeliRGBToLUV_8u_AC4R, forwardPower());
-  zel::test::expectExportFollowsFormulas(zeliRGBToLUV_32f_C3R, forwardFloat<3, false>("RGBToLUV_32f_C3"));
-  zel::test::expectExportFollowsFormulas(zeliRGBToLUV_32f_AC4R, forwardFloat<4, false>("RGBToLUV_32f_AC4"));
-  zel::test::expectExportFollowsFormulas(zeliBGRToLUV_32f_C3R, forwardFloat<3, true>("BGRToLUV_32f_C3"));
-  zel::test::expectExportFollowsFormulas(zeliRGBToLUV_16u_C3R, forwardWide<3, uint16_t>("RGBToLUV_16u_C3"));
-  zel::test::expectExportFollowsFormulas(zeliRGBToLUV_16u_AC4R, forwardWide<4, uint16_t>("RGBToLUV_16u_AC4"));
-  zel::test::expectExportFollowsFormulas(zeliRGBToLUV_16s_C3R, forwardWide<3, int16_t>("RGBToLUV_16s_C3"));
-  zel::test::expectExportFollowsFormulas(zeliRGBToLUV_16s_AC4R, forwardWide<4, int16_t>("RGBToLUV_16s_AC4"));
-}
-
-TEST(LuvMembers, InverseFollowTheirFormulas) {
-  zel::test::expectExportFollowsFormulas(zeliLUVToRGB_8u_C3R, inverse8u<3, false>("LUVToRGB_8u_C3"));
-  zel::test::expectExportFollowsFormulas(zeliLUVToBGR_8u_C3R, inverse8u<3, true>("LUVToBGR_8u_C3"));
-  zel::test::expectExportFollowsFormulas(zeliLUVToRGB_8u_AC4R, inverse8u<4, false>("LUVToRGB_8u_AC4"));
-  zel::test::expectExportFollowsFormulas(zeliLUVToRGB_16u_C3R, inverseWide<3, uint16_t>("LUVToRGB_16u_C3"));
-  zel::test::expectExportFollowsFormulas(zeliLUVToRGB_16u_AC4R, inverseWide<4, uint16_t>("LUVToRGB_16u_AC4"));
-  zel::test::expectExportFollowsFormulas(zeliLUVToRGB_16s_C3R, inverseWide<3, int16_t>("LUVToRGB_16s_C3"));
-  zel::test::expectExportFollowsFormulas(zeliLUVToRGB_16s_AC4R, inverseWide<4, int16_t>("LUVToRGB_16s_AC4"));
-  zel::test::expectExportFollowsFormulas(zeliLUVToRGB_32f_C3R, inverseFloat<3, false>("LUVToRGB_32f_C3"));
-  zel::test::expectExportFollowsFormulas(zeliLUVToBGR_32f_C3R, inverseFloat<3, true>("LUVToBGR_32f_C3"));
-  zel::test::expectExportFollowsFormulas(zeliLUVToRGB_32f_AC4R, inverseFloat<4, false>("LUVToRGB_32f_AC4"));
-}
-
-TEST(LuvMembers, VectorBodiesMatchTheBodyFormulas) {
-  zel::test::expectBlocksFollowBody(forwardTableBlocks<false>, forwardTable<false>("RGBToLUV_8u_C3"));
-  zel::test::expectBlocksFollowBody(forwardTableBlocks<true>, forwardTable<true>("BGRToLUV_8u_C3"));
-  zel::test::expectBlocksFollowBody(forward32fBlocks<3, false>, forwardFloat<3, false>("RGBToLUV_32f_C3"));
-  zel::test::expectBlocksFollowBody(forward32fBlocks<4, false>, forwardFloat<4, false>("RGBToLUV_32f_AC4"));
-  zel::test::expectBlocksFollowBody(forward32fBlocks<3, true>, forwardFloat<3, true>("BGRToLUV_32f_C3"));
-  zel::test::expectBlocksFollowBody(forward16Blocks<3, uint16_t>, forwardWide<3, uint16_t>("RGBToLUV_16u_C3"));
-  zel::test::expectBlocksFollowBody(forward16Blocks<4, int16_t>, forwardWide<4, int16_t>("RGBToLUV_16s_AC4"));
-  zel::test::expectBlocksFollowBody(inverse8uBlocks<3, false>, inverse8u<3, false>("LUVToRGB_8u_C3"));
-  zel::test::expectBlocksFollowBody(inverse8uBlocks<3, true>, inverse8u<3, true>("LUVToBGR_8u_C3"));
-  zel::test::expectBlocksFollowBody(inverse8uBlocks<4, false>, inverse8u<4, false>("LUVToRGB_8u_AC4"));
-  zel::test::expectBlocksFollowBody(inverse16Blocks<3, int16_t>, inverseWide<3, int16_t>("LUVToRGB_16s_C3"));
-  zel::test::expectBlocksFollowBody(inverse16Blocks<4, uint16_t>, inverseWide<4, uint16_t>("LUVToRGB_16u_AC4"));
-  zel::test::expectBlocksFollowBody(inverse32fBlocks<false>, inverseFloat<3, false>("LUVToRGB_32f_C3"));
-  zel::test::expectBlocksFollowBody(inverse32fBlocks<true>, inverseFloat<3, true>("LUVToBGR_32f_C3"));
+TEST(LuvMembers, FollowTheirFormulasInEveryZone) {
+  zel::test::expectMembers<uint8_t, uint8_t>({
+      M8("RGBToLUV_8u_C3", zeliRGBToLUV_8u_C3R)
+          .zones(4, forwardTableBlocks<false>, forwardTablePixel<false, Zone::Body>, forwardTablePixel<false, Zone::Tail>)
+          .samples(luvByte),
+      M8("BGRToLUV_8u_C3", zeliBGRToLUV_8u_C3R)
+          .zones(4, forwardTableBlocks<true>, forwardTablePixel<true, Zone::Body>, forwardTablePixel<true, Zone::Tail>)
+          .samples(luvByte),
+      M8("RGBToLUV_8u_AC4", zeliRGBToLUV_8u_AC4R).stride(4).oneFormula(forwardPowerPixel).samples(luvByte),
+      inverse8u<3, false>("LUVToRGB_8u_C3", zeliLUVToRGB_8u_C3R),
+      inverse8u<3, true>("LUVToBGR_8u_C3", zeliLUVToBGR_8u_C3R),
+      inverse8u<4, false>("LUVToRGB_8u_AC4", zeliLUVToRGB_8u_AC4R),
+  });
+  zel::test::expectMembers<uint16_t, uint16_t>({
+      forwardWide<uint16_t, 3>("RGBToLUV_16u_C3", zeliRGBToLUV_16u_C3R),
+      forwardWide<uint16_t, 4>("RGBToLUV_16u_AC4", zeliRGBToLUV_16u_AC4R),
+      inverseWide<uint16_t, 3>("LUVToRGB_16u_C3", zeliLUVToRGB_16u_C3R),
+      inverseWide<uint16_t, 4>("LUVToRGB_16u_AC4", zeliLUVToRGB_16u_AC4R),
+  });
+  zel::test::expectMembers<int16_t, int16_t>({
+      forwardWide<int16_t, 3>("RGBToLUV_16s_C3", zeliRGBToLUV_16s_C3R),
+      forwardWide<int16_t, 4>("RGBToLUV_16s_AC4", zeliRGBToLUV_16s_AC4R),
+      inverseWide<int16_t, 3>("LUVToRGB_16s_C3", zeliLUVToRGB_16s_C3R),
+      inverseWide<int16_t, 4>("LUVToRGB_16s_AC4", zeliLUVToRGB_16s_AC4R),
+  });
+  zel::test::expectMembers<float, float>({
+      forwardFloat<3, false>("RGBToLUV_32f_C3", zeliRGBToLUV_32f_C3R),
+      forwardFloat<4, false>("RGBToLUV_32f_AC4", zeliRGBToLUV_32f_AC4R),
+      forwardFloat<3, true>("BGRToLUV_32f_C3", zeliBGRToLUV_32f_C3R),
+      M32("LUVToRGB_32f_C3", zeliLUVToRGB_32f_C3R)
+          .zones(4, inverse32fBlocks<false>, inverse32fPixel<false, Zone::Body>, inverse32fPixel<false, Zone::Tail>)
+          .samples(luvFloat),
+      M32("LUVToBGR_32f_C3", zeliLUVToBGR_32f_C3R)
+          .zones(4, inverse32fBlocks<true>, inverse32fPixel<true, Zone::Body>, inverse32fPixel<true, Zone::Tail>)
+          .samples(luvFloat),
+      M32("LUVToRGB_32f_AC4", zeliLUVToRGB_32f_AC4R)
+          .stride(4)
+          .oneFormula(inverse32fPixel<false, Zone::Tail>)
+          .stepsInSamples()
+          .samples(luvFloat),
+  });
 }
 
 TEST(LuvMembers, StepUnitsDifferAmongTheFloatMembers) {

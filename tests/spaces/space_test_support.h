@@ -20,18 +20,62 @@ namespace zel::test {
 using spaces::Lanes;
 using spaces::StepUnit;
 
+// One export: its formulas by zone, its vector body, how it counts steps
+// and what its source samples look like. Built with chained setters.
 template <typename S, typename D>
 struct Member {
+  using Export = Status (*)(const S*, int, D*, int, ImageSize);
+  using Blocks = int (*)(Lanes, const S*, D*, int);
+  using Pixel = std::function<void(const S* in, D* out)>;  // writes the 3 samples of a pixel
   std::string name;
+  Export fn = nullptr;
   int srcStride = 3, dstStride = 3;
   // Pixels [0, width AND NOT (block - 1)) take `body`, the rest `tail`;
   // block 0 means one formula for the whole row (`tail`).
-  int block = 4;
-  std::function<void(const S* in, D* out)> body, tail;  // writes the 3 samples of a pixel
+  int block = 0;
+  Blocks blocks = nullptr;  // the vector body, checked against `body`
+  Pixel body, tail;
   StepUnit unit = StepUnit::Bytes;
-  // One source sample; random bits (or 0..1 floats) when empty.
-  std::function<S(std::mt19937&)> sample;
+  std::function<S(std::mt19937&)> sample;  // random bits (or 0..1 floats) when empty
+
+  Member(std::string n, Export f) : name(std::move(n)), fn(f) {}
+  Member& stride(int s) { srcStride = dstStride = s; return *this; }
+  Member& zones(int b, Blocks v, Pixel inBody, Pixel inTail) {
+    block = b, blocks = v, body = std::move(inBody), tail = std::move(inTail);
+    return *this;
+  }
+  Member& oneFormula(Pixel f) {
+    tail = std::move(f);
+    return *this;
+  }
+  Member& stepsInSamples() {
+    unit = StepUnit::Samples;
+    return *this;
+  }
+  Member& samples(std::function<S(std::mt19937&)> g) {
+    sample = std::move(g);
+    return *this;
+  }
 };
+
+// One row through an export, the destination filled with 7s first.
+template <typename S, typename D>
+std::vector<D> convertRow(Status (*fn)(const S*, int, D*, int, ImageSize), const std::vector<S>& src, int stride = 3) {
+  const int width = int(src.size()) / stride;
+  std::vector<D> dst(src.size(), D(7));
+  EXPECT_EQ(fn(src.data(), width * stride * int(sizeof(S)), dst.data(), width * stride * int(sizeof(D)),
+               ImageSize{width, 1}),
+            StatusOk);
+  return dst;
+}
+
+// `width` copies of one pixel.
+template <typename T>
+std::vector<T> repeat(std::initializer_list<T> pixel, int width) {
+  std::vector<T> out;
+  for (int x = 0; x < width; ++x) out.insert(out.end(), pixel);
+  return out;
+}
 
 template <typename T>
 T randomSample(std::mt19937& rng) {
@@ -89,8 +133,7 @@ void expectSameRows(const Member<S, D>& m, const std::vector<D>& want, const Tes
 // Widths 1..70 at several alignments and paddings: every pixel as its zone's
 // formula says, nothing outside the rows written, the source unchanged.
 template <typename S, typename D>
-void expectExportFollowsFormulas(Status (*fn)(const S*, int, D*, int, ImageSize), const Member<S, D>& m,
-                                 uint32_t seed = 1) {
+void expectExportFollowsFormulas(const Member<S, D>& m, uint32_t seed = 1) {
   // A member counting steps in samples needs whole-sample padding.
   const int padUnit = m.unit == StepUnit::Samples ? int(sizeof(S) > sizeof(D) ? sizeof(S) : sizeof(D)) : 1;
   for (int width = 1; width <= 70; ++width)
@@ -111,7 +154,7 @@ void expectExportFollowsFormulas(Status (*fn)(const S*, int, D*, int, ImageSize)
         for (int i = 0; i < width * m.srcStride; ++i) srcCopy.push_back(src.get(i, y));
       const std::vector<D> want = expectedRows(m, src, dst, width);
       const std::string where = "width " + std::to_string(width) + (variant ? " misaligned" : "");
-      ASSERT_EQ(fn(src.data(), src.step(), dst.data(), dst.step(), ImageSize{width, height}), StatusOk) << where;
+      ASSERT_EQ(m.fn(src.data(), src.step(), dst.data(), dst.step(), ImageSize{width, height}), StatusOk) << where;
       expectSameRows(m, want, dst, width, where);
       EXPECT_TRUE(dst.guardsIntact()) << m.name << " " << where << ": a byte outside the rows changed";
       for (int y = 0; y < height; ++y)
@@ -124,7 +167,7 @@ void expectExportFollowsFormulas(Status (*fn)(const S*, int, D*, int, ImageSize)
 // A vector body alone, both lane widths, at odd alignments: each converted
 // pixel equals the body formula, and nothing past the converted pixels moves.
 template <typename S, typename D>
-void expectBlocksFollowBody(int (*blocks)(Lanes, const S*, D*, int), const Member<S, D>& m, uint32_t seed = 7) {
+void expectBlocksFollowBody(const Member<S, D>& m, uint32_t seed = 7) {
   for (Lanes lanes : {Lanes::Sse4, Lanes::Avx2}) {
     if (lanes == Lanes::Avx2 && !hasAvx2()) continue;
     const int laneCount = lanes == Lanes::Avx2 ? 8 : 4;
@@ -136,7 +179,7 @@ void expectBlocksFollowBody(int (*blocks)(Lanes, const S*, D*, int), const Membe
       for (int i = 0; i < n * m.dstStride; ++i) dst.set(i, 0, D(rng()));
       std::vector<D> want(size_t(n) * m.dstStride);
       for (int i = 0; i < int(want.size()); ++i) want[i] = dst.get(i, 0);
-      const int done = blocks(lanes, src.data(), dst.data(), n);
+      const int done = m.blocks(lanes, src.data(), dst.data(), n);
       ASSERT_EQ(done, n / laneCount * laneCount) << m.name;
       for (int x = 0; x < done; ++x) {
         S in[8];
@@ -152,6 +195,15 @@ void expectBlocksFollowBody(int (*blocks)(Lanes, const S*, D*, int), const Membe
         }
       ASSERT_TRUE(dst.guardsIntact()) << m.name << " " << where;
     }
+  }
+}
+
+// Both checks, for each member of a list.
+template <typename S, typename D>
+void expectMembers(const std::vector<Member<S, D>>& members) {
+  for (const Member<S, D>& m : members) {
+    expectExportFollowsFormulas(m);
+    if (m.blocks) expectBlocksFollowBody(m);
   }
 }
 

@@ -10,7 +10,9 @@ namespace {
 
 using namespace zel::spaces::xyz;
 using zel::spaces::StepUnit;
+using zel::test::convertRow;
 using zel::test::Member;
+using zel::test::repeat;
 using zel::test::TestImage;
 
 // Formulas as pixel functions for the checks.
@@ -29,16 +31,6 @@ void floatsPixel(const float* in, float* out) {
 uint8_t byteSample(std::mt19937& rng) {
   const uint32_t r = rng();
   return (r & 3) == 0 ? uint8_t(r & 0x100 ? 255 : 0) : uint8_t(r >> 8);
-}
-
-template <typename T>
-std::vector<T> convertRow(Status (*fn)(const T*, int, T*, int, ImageSize), std::vector<T> src, int stride) {
-  const int width = int(src.size()) / stride;
-  std::vector<T> dst(src.size(), T(0));
-  EXPECT_EQ(fn(src.data(), width * stride * int(sizeof(T)), dst.data(), width * stride * int(sizeof(T)),
-               ImageSize{width, 1}),
-            StatusOk);
-  return dst;
 }
 
 TEST(XyzReference, WhiteTakesEachZonesMatrix) {
@@ -119,77 +111,69 @@ TEST(XyzReference, FloatForwardClampsOnlyZ) {
 
 // ---- every member over all widths ----
 
-template <int Stride>
-Member<uint8_t, uint8_t> member8u(bool forward) {
-  Member<uint8_t, uint8_t> m;
-  m.name = forward ? "RGBToXYZ_8u" : "XYZToRGB_8u";
-  m.srcStride = m.dstStride = Stride;
-  m.block = Stride == 3 ? 8 : 4;
-  m.body = forward ? levelsPixel<uint8_t, rgbToXyzBody8u> : levelsPixel<uint8_t, xyzToRgbBody8u>;
-  m.tail = forward ? levelsPixel<uint8_t, rgbToXyzTail8u> : levelsPixel<uint8_t, xyzToRgbTail8u>;
-  m.sample = byteSample;
-  return m;
-}
+using M8 = Member<uint8_t, uint8_t>;
+using M16 = Member<uint16_t, uint16_t>;
+using M16s = Member<int16_t, int16_t>;
+using M32 = Member<float, float>;
 
-template <typename T, int Stride>
-Member<T, T> member16(bool forward) {
-  Member<T, T> m;
-  m.name = std::string(forward ? "RGBToXYZ" : "XYZToRGB") + (sizeof(T) == 2 && T(-1) < 0 ? "_16s" : "_16u");
-  m.srcStride = m.dstStride = Stride;
-  m.body = m.tail = forward ? levelsPixel<T, rgbToXyz16> : levelsPixel<T, xyzToRgb16>;
-  m.unit = StepUnit::Samples;
-  return m;
-}
+// Beyond 0..1 too, so that the float clamps act.
+float wideFloat(std::mt19937& rng) { return float(std::uniform_real_distribution<double>(-0.5, 1.8)(rng)); }
 
-template <int Stride>
-Member<float, float> member32f(bool forward) {
-  Member<float, float> m;
-  m.name = forward ? "RGBToXYZ_32f" : "XYZToRGB_32f";
-  m.srcStride = m.dstStride = Stride;
-  m.body = m.tail = forward ? floatsPixel<rgbToXyz32f> : floatsPixel<xyzToRgb32f>;
-  m.block = forward ? 4 : 0;
-  m.unit = StepUnit::Samples;
-  // Beyond 0..1 too, so that the clamps act.
-  m.sample = [](std::mt19937& rng) { return float(std::uniform_real_distribution<double>(-0.5, 1.8)(rng)); };
-  return m;
-}
-
-TEST(XyzMembers, EightBitFollowTheirZoneFormulas) {
-  zel::test::expectExportFollowsFormulas(zeliRGBToXYZ_8u_C3R, member8u<3>(true));
-  zel::test::expectExportFollowsFormulas(zeliRGBToXYZ_8u_AC4R, member8u<4>(true));
-  zel::test::expectExportFollowsFormulas(zeliXYZToRGB_8u_C3R, member8u<3>(false));
-  zel::test::expectExportFollowsFormulas(zeliXYZToRGB_8u_AC4R, member8u<4>(false));
-}
-
-TEST(XyzMembers, SixteenBitFollowTheFloatMatrix) {
-  zel::test::expectExportFollowsFormulas(zeliRGBToXYZ_16u_C3R, member16<uint16_t, 3>(true));
-  zel::test::expectExportFollowsFormulas(zeliRGBToXYZ_16u_AC4R, member16<uint16_t, 4>(true));
-  zel::test::expectExportFollowsFormulas(zeliRGBToXYZ_16s_C3R, member16<int16_t, 3>(true));
-  zel::test::expectExportFollowsFormulas(zeliRGBToXYZ_16s_AC4R, member16<int16_t, 4>(true));
-  zel::test::expectExportFollowsFormulas(zeliXYZToRGB_16u_C3R, member16<uint16_t, 3>(false));
-  zel::test::expectExportFollowsFormulas(zeliXYZToRGB_16u_AC4R, member16<uint16_t, 4>(false));
-  zel::test::expectExportFollowsFormulas(zeliXYZToRGB_16s_C3R, member16<int16_t, 3>(false));
-  zel::test::expectExportFollowsFormulas(zeliXYZToRGB_16s_AC4R, member16<int16_t, 4>(false));
-}
-
-TEST(XyzMembers, FloatFollowTheirFormulas) {
-  zel::test::expectExportFollowsFormulas(zeliRGBToXYZ_32f_C3R, member32f<3>(true));
-  zel::test::expectExportFollowsFormulas(zeliRGBToXYZ_32f_AC4R, member32f<4>(true));
-  zel::test::expectExportFollowsFormulas(zeliXYZToRGB_32f_C3R, member32f<3>(false));
-  zel::test::expectExportFollowsFormulas(zeliXYZToRGB_32f_AC4R, member32f<4>(false));
-}
-
-TEST(XyzMembers, VectorBodiesMatchTheBodyFormulas) {
-  zel::test::expectBlocksFollowBody(rgbToXyzBlocks8u<3>, member8u<3>(true));
-  zel::test::expectBlocksFollowBody(rgbToXyzBlocks8u<4>, member8u<4>(true));
-  zel::test::expectBlocksFollowBody(xyzToRgbBlocks8u<3>, member8u<3>(false));
-  zel::test::expectBlocksFollowBody(xyzToRgbBlocks8u<4>, member8u<4>(false));
-  zel::test::expectBlocksFollowBody(rgbToXyzBlocks16<3, uint16_t>, member16<uint16_t, 3>(true));
-  zel::test::expectBlocksFollowBody(rgbToXyzBlocks16<4, int16_t>, member16<int16_t, 4>(true));
-  zel::test::expectBlocksFollowBody(xyzToRgbBlocks16<4, uint16_t>, member16<uint16_t, 4>(false));
-  zel::test::expectBlocksFollowBody(xyzToRgbBlocks16<3, int16_t>, member16<int16_t, 3>(false));
-  zel::test::expectBlocksFollowBody(rgbToXyzBlocks32f<3>, member32f<3>(true));
-  zel::test::expectBlocksFollowBody(rgbToXyzBlocks32f<4>, member32f<4>(true));
+TEST(XyzMembers, FollowTheirFormulasInEveryZone) {
+  // 8u: C3 blocks of 8 pixels, AC4 blocks of 4, two fixed-point tables.
+  zel::test::expectMembers<uint8_t, uint8_t>({
+      M8("RGBToXYZ_8u_C3", zeliRGBToXYZ_8u_C3R)
+          .zones(8, rgbToXyzBlocks8u<3>, levelsPixel<uint8_t, rgbToXyzBody8u>, levelsPixel<uint8_t, rgbToXyzTail8u>)
+          .samples(byteSample),
+      M8("RGBToXYZ_8u_AC4", zeliRGBToXYZ_8u_AC4R)
+          .stride(4)
+          .zones(4, rgbToXyzBlocks8u<4>, levelsPixel<uint8_t, rgbToXyzBody8u>, levelsPixel<uint8_t, rgbToXyzTail8u>)
+          .samples(byteSample),
+      M8("XYZToRGB_8u_C3", zeliXYZToRGB_8u_C3R)
+          .zones(8, xyzToRgbBlocks8u<3>, levelsPixel<uint8_t, xyzToRgbBody8u>, levelsPixel<uint8_t, xyzToRgbTail8u>)
+          .samples(byteSample),
+      M8("XYZToRGB_8u_AC4", zeliXYZToRGB_8u_AC4R)
+          .stride(4)
+          .zones(4, xyzToRgbBlocks8u<4>, levelsPixel<uint8_t, xyzToRgbBody8u>, levelsPixel<uint8_t, xyzToRgbTail8u>)
+          .samples(byteSample),
+  });
+  // 16-bit: one float formula in both zones.
+  auto wide = [](auto member, auto blocks, auto formula, int stride) {
+    return member.stride(stride).zones(4, blocks, formula, formula).stepsInSamples();
+  };
+  zel::test::expectMembers<uint16_t, uint16_t>({
+      wide(M16("RGBToXYZ_16u_C3", zeliRGBToXYZ_16u_C3R), rgbToXyzBlocks16<3, uint16_t>,
+           levelsPixel<uint16_t, rgbToXyz16>, 3),
+      wide(M16("RGBToXYZ_16u_AC4", zeliRGBToXYZ_16u_AC4R), rgbToXyzBlocks16<4, uint16_t>,
+           levelsPixel<uint16_t, rgbToXyz16>, 4),
+      wide(M16("XYZToRGB_16u_C3", zeliXYZToRGB_16u_C3R), xyzToRgbBlocks16<3, uint16_t>,
+           levelsPixel<uint16_t, xyzToRgb16>, 3),
+      wide(M16("XYZToRGB_16u_AC4", zeliXYZToRGB_16u_AC4R), xyzToRgbBlocks16<4, uint16_t>,
+           levelsPixel<uint16_t, xyzToRgb16>, 4),
+  });
+  zel::test::expectMembers<int16_t, int16_t>({
+      wide(M16s("RGBToXYZ_16s_C3", zeliRGBToXYZ_16s_C3R), rgbToXyzBlocks16<3, int16_t>,
+           levelsPixel<int16_t, rgbToXyz16>, 3),
+      wide(M16s("RGBToXYZ_16s_AC4", zeliRGBToXYZ_16s_AC4R), rgbToXyzBlocks16<4, int16_t>,
+           levelsPixel<int16_t, rgbToXyz16>, 4),
+      wide(M16s("XYZToRGB_16s_C3", zeliXYZToRGB_16s_C3R), xyzToRgbBlocks16<3, int16_t>,
+           levelsPixel<int16_t, xyzToRgb16>, 3),
+      wide(M16s("XYZToRGB_16s_AC4", zeliXYZToRGB_16s_AC4R), xyzToRgbBlocks16<4, int16_t>,
+           levelsPixel<int16_t, xyzToRgb16>, 4),
+  });
+  // Float: the inverse has no block form.
+  zel::test::expectMembers<float, float>({
+      wide(M32("RGBToXYZ_32f_C3", zeliRGBToXYZ_32f_C3R), rgbToXyzBlocks32f<3>, floatsPixel<rgbToXyz32f>, 3)
+          .samples(wideFloat),
+      wide(M32("RGBToXYZ_32f_AC4", zeliRGBToXYZ_32f_AC4R), rgbToXyzBlocks32f<4>, floatsPixel<rgbToXyz32f>, 4)
+          .samples(wideFloat),
+      M32("XYZToRGB_32f_C3", zeliXYZToRGB_32f_C3R).oneFormula(floatsPixel<xyzToRgb32f>).stepsInSamples().samples(wideFloat),
+      M32("XYZToRGB_32f_AC4", zeliXYZToRGB_32f_AC4R)
+          .stride(4)
+          .oneFormula(floatsPixel<xyzToRgb32f>)
+          .stepsInSamples()
+          .samples(wideFloat),
+  });
 }
 
 TEST(XyzMembers, WideSamplesCountStepsInWholeSamples) {
