@@ -85,14 +85,121 @@ ZELCC_API Status zeliGrayToRGB_32f_C1C4R(const float* src, int srcStep, float* d
                                          ImageSize size, float alpha);
 
 /* ---- RGB to and from YCbCr and YUV at full resolution ---- */
+/* RGB to video-range YCbCr: Y in 16..235, Cb and Cr in 16..240. */
+ZELCC_API Status zeliRGBToYCbCr_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
+                                         ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
+                                          ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                       int dstStep, ImageSize size);
+/* Video-range YCbCr to RGB or BGR. */
+ZELCC_API Status zeliYCbCrToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                         ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB_8u_P3C4R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                         ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCrToRGB_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                       int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                         ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR_8u_P3C4R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                         ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCrToBGR_709CSC_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst,
+                                                int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR_709CSC_8u_P3C4R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst,
+                                                int dstStep, ImageSize size, uint8_t alpha);
 
 /* ---- Photo YCC ---- */
 
 /* ---- RGB to and from chroma-subsampled YCbCr and YUV ---- */
 
 /* ---- Repacking between subsampled layouts ---- */
+ZELCC_API Status zeliCbYCr422ToYCbCr411_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliCbYCr422ToYCbCr420_8u_C2P2R(const uint8_t* src, int srcStep, uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliCbYCr422ToYCbCr420_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliCbYCr422ToYCbCr422_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliCbYCr422ToYCbCr422_8u_C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliCbYCr422ToYCrCb420_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr411To420_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr411ToYCbCr420_8u_P2P3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr411ToYCbCr420_8u_P3P2R(const uint8_t* const src[3], const int srcStep[3], uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliYCbCr411ToYCbCr420_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr411ToYCbCr422_8u_P2C2R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr411ToYCbCr422_8u_P2P3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr411ToYCbCr422_8u_P3C2R(const uint8_t* const src[3], const int srcStep[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr411ToYCbCr422_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr411ToYCrCb420_8u_P2P3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr411ToYCrCb422_8u_P3C2R(const uint8_t* const src[3], const int srcStep[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr411ToYCrCb422_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr411_8u_P2P3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr411_8u_P3P2R(const uint8_t* const src[3], const int srcStep[3], uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420To411_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr420ToCbYCr422_8u_P2C2R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToYCbCr411_8u_P2P3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr420ToYCbCr411_8u_P3P2R(const uint8_t* const src[3], const int srcStep[3], uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToYCbCr422_8u_P2C2R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToYCbCr422_8u_P2P3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr420ToYCbCr422_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr420ToYCrCb420_8u_P2P3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr420_8u_P2P3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr420_8u_P3P2R(const uint8_t* const src[3], const int srcStep[3], uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToCbYCr422_8u_C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToCbYCr422_8u_P3C2R(const uint8_t* const src[3], const int srcStep[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToGray_8u_C2C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToYCbCr411_8u_C2P2R(const uint8_t* src, int srcStep, uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToYCbCr411_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr422ToYCbCr411_8u_P3P2R(const uint8_t* const src[3], const int srcStep[3], uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToYCbCr411_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr422ToYCbCr420_8u_C2P2R(const uint8_t* src, int srcStep, uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToYCbCr420_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr422ToYCbCr420_8u_P3P2R(const uint8_t* const src[3], const int srcStep[3], uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToYCbCr420_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr422ToYCrCb420_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr422ToYCrCb422_8u_C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToYCrCb422_8u_P3C2R(const uint8_t* const src[3], const int srcStep[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr422_8u_P3C2R(const uint8_t* const src[3], const int srcStep[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCrCb420ToCbYCr422_8u_P3C2R(const uint8_t* const src[3], const int srcStep[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCrCb420ToYCbCr411_8u_P3P2R(const uint8_t* const src[3], const int srcStep[3], uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliYCrCb420ToYCbCr420_8u_P3P2R(const uint8_t* const src[3], const int srcStep[3], uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliYCrCb420ToYCbCr422_8u_P3C2R(const uint8_t* const src[3], const int srcStep[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCrCb420ToYCbCr422_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCrCb422ToYCbCr411_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCrCb422ToYCbCr420_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCrCb422ToYCbCr422_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
 
 /* ---- Filtered, interlaced and 1620 chroma resampling ---- */
+ZELCC_API Status zeliYCbCr1620To420_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3],
+                                           const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr420To1620_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3],
+                                           const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr420To422_Interlace_8u_P3R(const uint8_t* const src[3], const int srcStep[3],
+                                                    uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr422To420_Interlace_8u_P3R(const uint8_t* const src[3], const int srcStep[3],
+                                                    uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliCbYCr422ToYCbCr420_Interlace_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3],
+                                                           const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr420ToCbYCr422_Interlace_8u_P3C2R(const uint8_t* const src[3], const int srcStep[3],
+                                                           uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToYCbCr422_Filter_8u_P3R(const uint8_t* const src[3], const int srcStep[3],
+                                                      uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCrCb420ToYCbCr422_Filter_8u_P3R(const uint8_t* const src[3], const int srcStep[3],
+                                                      uint8_t* const dst[3], const int dstStep[3], ImageSize size);
+ZELCC_API Status zeliYCbCr420ToYCbCr422_Filter_8u_P2P3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr,
+                                                        int srcCbCrStep, uint8_t* const dst[3], const int dstStep[3],
+                                                        ImageSize size);
+/* `layout`: 1 first slice, 4 middle slice, 16 last slice, 21 a whole frame. */
+ZELCC_API Status zeliYCbCr420ToYCbCr422_Filter_8u_P2C2R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr,
+                                                        int srcCbCrStep, uint8_t* dst, int dstStep, ImageSize size,
+                                                        int layout);
+ZELCC_API Status zeliYCbCr420ToYCrCb420_Filter_8u_P2P3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr,
+                                                        int srcCbCrStep, uint8_t* const dst[3], const int dstStep[3],
+                                                        ImageSize size, int layout);
+ZELCC_API Status zeliYCrCb420ToBGR_Filter_8u_P3C4R(const uint8_t* const src[3], const int srcStep[3], uint8_t* dst,
+                                                   int dstStep, ImageSize size, uint8_t alpha);
 
 /* ---- 16-bit packed RGB ---- */
 
@@ -201,16 +308,154 @@ ZELCC_API Status zeliXYZToRGB_32f_AC4R(const float* src, int srcStep, float* dst
                                        ImageSize size);
 
 /* ---- Colour twist ---- */
+/* Row i of `twist`: weights of the three inputs and a constant in sample units for output i; */
+/* integer results are clamped, then rounded to nearest. Steps must be at least 1. */
+ZELCC_API Status zeliColorTwist32f_16s_AC4IR(int16_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size,
+                                            const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16s_C3IR(int16_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16s_IP3R(int16_t* const srcDstPlanes[3], int srcDstStep, ImageSize size,
+                                            const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16s_P3R(const int16_t* const srcPlanes[3], int srcStep, int16_t* const dstPlanes[3],
+                                           int dstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_AC4IR(uint16_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                            ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_C3IR(uint16_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_IP3R(uint16_t* const srcDstPlanes[3], int srcDstStep, ImageSize size,
+                                            const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_P3R(const uint16_t* const srcPlanes[3], int srcStep,
+                                           uint16_t* const dstPlanes[3], int dstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_AC4IR(int8_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_AC4R(const int8_t* src, int srcStep, int8_t* dst, int dstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_C3IR(int8_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_C3R(const int8_t* src, int srcStep, int8_t* dst, int dstStep, ImageSize size,
+                                          const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_IP3R(int8_t* const srcDstPlanes[3], int srcDstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_P3R(const int8_t* const srcPlanes[3], int srcStep, int8_t* const dstPlanes[3],
+                                          int dstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_AC4IR(uint8_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_C3IR(uint8_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                          const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_IP3R(uint8_t* const srcDstPlanes[3], int srcDstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                          int dstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_AC4IR(float* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                         const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_C3IR(float* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                        const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_C4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                        const float twist[4][4]);
+ZELCC_API Status zeliColorTwist_32f_IP3R(float* const srcDstPlanes[3], int srcDstStep, ImageSize size,
+                                         const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_P3R(const float* const srcPlanes[3], int srcStep, float* const dstPlanes[3],
+                                        int dstStep, ImageSize size, const float twist[3][4]);
 
 /* ---- Gamma ---- */
+/* The video transfer function (Fwd) and its inverse (Inv) on R, G, B; 32f maps vMin..vMax onto 0..1 */
+/* and returns StatusEmptyRangeError unless vMax - vMin > 0. Steps must be at least 1. */
+ZELCC_API Status zeliGammaFwd_16u_AC4IR(uint16_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_16u_C3IR(uint16_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_16u_IP3R(uint16_t* const srcDstPlanes[3], int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_16u_P3R(const uint16_t* const srcPlanes[3], int srcStep, uint16_t* const dstPlanes[3],
+                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_32f_AC4IR(float* srcDst, int srcDstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaFwd_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                       float vMin, float vMax);
+ZELCC_API Status zeliGammaFwd_32f_C3IR(float* srcDst, int srcDstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaFwd_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                      float vMin, float vMax);
+ZELCC_API Status zeliGammaFwd_32f_IP3R(float* const srcDstPlanes[3], int srcDstStep, ImageSize size, float vMin,
+                                       float vMax);
+ZELCC_API Status zeliGammaFwd_32f_P3R(const float* const srcPlanes[3], int srcStep, float* const dstPlanes[3],
+                                      int dstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaFwd_8u_AC4IR(uint8_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_8u_C3IR(uint8_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_8u_IP3R(uint8_t* const srcDstPlanes[3], int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                     int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_AC4IR(uint16_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_C3IR(uint16_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_IP3R(uint16_t* const srcDstPlanes[3], int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_P3R(const uint16_t* const srcPlanes[3], int srcStep, uint16_t* const dstPlanes[3],
+                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_32f_AC4IR(float* srcDst, int srcDstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaInv_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                       float vMin, float vMax);
+ZELCC_API Status zeliGammaInv_32f_C3IR(float* srcDst, int srcDstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaInv_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                      float vMin, float vMax);
+ZELCC_API Status zeliGammaInv_32f_IP3R(float* const srcDstPlanes[3], int srcDstStep, ImageSize size, float vMin,
+                                       float vMax);
+ZELCC_API Status zeliGammaInv_32f_P3R(const float* const srcPlanes[3], int srcStep, float* const dstPlanes[3],
+                                      int dstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaInv_8u_AC4IR(uint8_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_8u_C3IR(uint8_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_8u_IP3R(uint8_t* const srcDstPlanes[3], int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                     int dstStep, ImageSize size);
 
 /* ---- Gray conversion ---- */
+/* Weighted sums of R, G, B; a null `coeffs` selects 0.299, 0.587, 0.114. */
+ZELCC_API Status zeliRGBToGray_16s_AC4C1R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_16s_C3C1R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_16u_AC4C1R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_16u_C3C1R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_32f_AC4C1R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_32f_C3C1R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_8u_AC4C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_8u_C3C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliColorToGray_16s_AC4C1R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size,
+                                            const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_16s_C3C1R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size,
+                                           const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_16u_AC4C1R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                            ImageSize size, const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_16u_C3C1R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size,
+                                           const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_32f_AC4C1R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                            const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_32f_C3C1R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                           const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_64f_AC4C1R(const double* src, int srcStep, double* dst, int dstStep, ImageSize size,
+                                            const double coeffs[3]);
+ZELCC_API Status zeliColorToGray_64f_C3C1R(const double* src, int srcStep, double* dst, int dstStep, ImageSize size,
+                                           const double coeffs[3]);
+ZELCC_API Status zeliColorToGray_8u_AC4C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                           const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_8u_C3C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                          const float coeffs[3]);
 
 /* ---- Bit-depth reduction ---- */
 
 /* ---- Bayer demosaicing ---- */
 
 /* ---- Tone mapping ---- */
+/* Float samples to 8 bits by 255 / maximum (Linear, no saturation) or 255 / (2 * mean) (Mean, */
+/* saturated). StatusNothingDoneWarning leaves dst as it was when the maximum or mean is negative. */
+ZELCC_API Status zeliToneMapLinear_32f8u_C1R(const float* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliToneMapMean_32f8u_C1R(const float* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
 
 #ifdef __cplusplus
 }

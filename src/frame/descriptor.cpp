@@ -190,6 +190,10 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       }
       Extra e{f[0], kinds.at(f[1]), std::atof(f[2].c_str()), {}};
       for (size_t k = 3; k < f.size(); ++k) {
+        if (f[k] == "optional" && e.kind == ArgKind::Pointer) {
+          e.optional = true;
+          continue;
+        }
         const size_t eq = f[k].find('=');
         if (eq == std::string::npos) {
           error = "bad value list in extras of " + d.name;
@@ -203,12 +207,23 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
         error = "bad min= in extras of " + d.name;
         return false;
       }
+    } else if (word.rfind("mult=", 0) == 0) {
+      if (std::sscanf(word.c_str() + 5, "%dx%d", &d.multWidth, &d.multHeight) != 2 || d.multWidth < 1 ||
+          d.multHeight < 1) {
+        error = "bad mult= in extras of " + d.name;
+        return false;
+      }
+    } else if (word.rfind("room=", 0) == 0) {
+      if (std::sscanf(word.c_str() + 5, "%dx%d", &d.roomWidth, &d.roomHeight) != 2) {
+        error = "bad room= in extras of " + d.name;
+        return false;
+      }
     } else if (word == "warn") {
       d.warnsOdd = true;
     } else if (word == "steps") {
       d.checksSteps = true;
     } else if (word == "samplesteps") {
-      // Steps shifted right to whole samples (16-bit and float members).
+      // 16-bit and 32-bit steps are shifted into samples, odd bytes dropped.
       d.stepsInSamples = true;
     } else if (word == "alphawritten") {
       d.writesAlpha = true;
@@ -235,6 +250,7 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
     if (o == "null") d.order.push_back({Check::NullTop});
     else if (o == "planes") d.order.push_back({Check::NullPlanes});
     else if (o == "size") d.order.push_back({Check::Size});
+    else if (o == "positive") d.order.push_back({Check::SizePositive});
     else if (o == "step") d.order.push_back({Check::Step});
     else {
       auto it = std::find_if(d.extras.begin(), d.extras.end(), [&](const Extra& e) { return e.name == o; });
@@ -416,15 +432,13 @@ const Descriptor* findDescriptor(const std::string& name) {
 
 Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offset)
     : d_(d), size_(size), pad_(padBytes) {
-  const int w = std::max(size.width, 0), h = std::max(size.height, 0);
+  const int w = std::max(std::max(size.width, 0), d.roomWidth), h = std::max(std::max(size.height, 0), d.roomHeight);
   auto addSide = [&](const Side& side, int sideIndex) {
     for (int p = 0; p < side.planes(); ++p) {
       Buffer b;
       b.geometry = planeGeometry(side, p, w, h);
-      // A member that counts steps in samples moves by whole samples only.
-      const int sb = b.geometry.sampleBytes;
-      const int pad = d.stepsInSamples ? (padBytes + sb - 1) / sb * sb : padBytes;
-      b.step = b.geometry.rowBytes + pad;
+      b.step = b.geometry.rowBytes + padBytes;
+      b.pitch = d.stepsInSamples ? b.step / b.geometry.sampleBytes * b.geometry.sampleBytes : b.step;
       const int rows = std::max(b.geometry.rows, 1);
       const size_t total = size_t(kGuard) * 2 + size_t(offset) + size_t(b.step) * rows + 64;
       b.bytes.assign(total, kGuardByte);
@@ -480,7 +494,7 @@ void Workspace::fillRandom(uint32_t seed) {
   for (Buffer& b : buffers_) {
     if (!b.isSource) continue;
     for (int y = 0; y < b.geometry.rows; ++y) {
-      uint8_t* row = b.first + size_t(y) * b.step;
+      uint8_t* row = b.first + size_t(y) * b.pitch;
       if (d_.src.sample == Sample::F32) {
         // Floats in 0..1, the range colour functions take.
         std::uniform_real_distribution<float> dist(0.0f, 1.0f);
@@ -498,7 +512,7 @@ void Workspace::fillRandom(uint32_t seed) {
 void Workspace::fillDestinations(uint8_t value) {
   for (Buffer& b : buffers_) {
     if (!b.isDestination || b.isSource) continue;
-    for (int y = 0; y < b.geometry.rows; ++y) std::memset(b.first + size_t(y) * b.step, value, b.geometry.rowBytes);
+    for (int y = 0; y < b.geometry.rows; ++y) std::memset(b.first + size_t(y) * b.pitch, value, b.geometry.rowBytes);
   }
 }
 
@@ -584,12 +598,12 @@ std::string Workspace::checkGuards() const {
       return m.str();
     };
     const int rows = b.geometry.rows;
-    const uint8_t* regionEnd = b.first + (rows > 0 ? size_t(rows - 1) * b.step + b.geometry.rowBytes : 0);
+    const uint8_t* regionEnd = b.first + (rows > 0 ? size_t(rows - 1) * b.pitch + b.geometry.rowBytes : 0);
     for (const uint8_t* p = lo; p < b.first; ++p)
       if (*p != kGuardByte) return describeAt(p);
     for (int y = 0; y + 1 < rows; ++y) {
-      const uint8_t* padStart = b.first + size_t(y) * b.step + b.geometry.rowBytes;
-      for (const uint8_t* p = padStart; p < b.first + size_t(y + 1) * b.step; ++p)
+      const uint8_t* padStart = b.first + size_t(y) * b.pitch + b.geometry.rowBytes;
+      for (const uint8_t* p = padStart; p < b.first + size_t(y + 1) * b.pitch; ++p)
         if (*p != kGuardByte) return describeAt(p);
     }
     for (const uint8_t* p = regionEnd; p < hi; ++p)

@@ -4,6 +4,7 @@
 // through these descriptors; nothing here is part of the library itself.
 #pragma once
 
+#include <algorithm>
 #include <cstdint>
 #include <string>
 #include <vector>
@@ -54,10 +55,13 @@ struct Extra {
   double good;
   std::vector<BadValue> bad;
   int stage = -1;  // where its check stands in the order (index into Descriptor::order)
+  bool optional = false;  // a pointer whose null is valid (it selects a default)
 };
 
 // Steps of the argument checks, in the order a member runs them.
-enum class Check { NullTop, NullPlanes, Size, Step, Extra };
+// SizePositive: a test of width and height >= 1 standing before a later
+// test of the minima (Size then covers only what lies between).
+enum class Check { NullTop, NullPlanes, SizePositive, Size, Step, Extra };
 struct CheckStage {
   Check check;
   int extra = -1;  // for Check::Extra
@@ -92,15 +96,23 @@ struct Descriptor {
   std::vector<Extra> extras;
   std::vector<CheckStage> order;
   std::vector<ArgSlot> slots;
-  int minWidth = 1, minHeight = 1;
+  int minWidth = 1, minHeight = 1;  // a minimum of 0: that dimension is not checked
+  int multWidth = 1, multHeight = 1;  // required multiples
+  int roomWidth = 0, roomHeight = 0;  // buffers cover at least this size: members that write past a tiny region
   bool warnsOdd = false;        // may return StatusOddSizeWarning
   bool writesAlpha = false;     // an AC4 destination's fourth channel is written
   bool checksSteps = false;
-  bool stepsInSamples = false;  // byte steps shifted to whole samples: odd bytes are dropped
+  bool stepsInSamples = false;  // byte steps are cut down to whole samples
   void (*impl)() = nullptr;
   Invoker invoke = nullptr;
   std::vector<ArgKind> prototype;  // kinds of the prototype's parameters
   bool isImageFunction() const { return invoke != nullptr; }
+  // The smallest valid size at least w x h.
+  ImageSize validSize(int w, int h) const {
+    w = std::max(w, std::max(minWidth, 1));
+    h = std::max(h, std::max(minHeight, 1));
+    return ImageSize{(w + multWidth - 1) / multWidth * multWidth, (h + multHeight - 1) / multHeight * multHeight};
+  }
   const Extra* extra(const std::string& name) const {
     for (const Extra& e : extras)
       if (e.name == name) return &e;
@@ -129,7 +141,8 @@ class Workspace {
   struct Buffer {
     std::vector<uint8_t> bytes;  // guard + rows + guard
     uint8_t* first = nullptr;    // first byte of the region
-    int step = 0;
+    int step = 0;   // the step argument
+    int pitch = 0;  // where the rows lie: the step, or its whole samples
     PlaneGeometry geometry{};
     bool isSource = false;
     bool isDestination = false;

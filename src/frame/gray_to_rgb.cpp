@@ -28,6 +28,19 @@ alignas(32) const int8_t kTriple8Avx[3][32] = {
     {10, 11, 11, 11, 12, 12, 12, 13, 13, 13, 14, 14, 14, 15, 15, 15, 0, 0, 0, 1, 1, 1, 2, 2, 2, 3, 3, 3, 4, 4, 4, 5},
     {5, 5, 6, 6, 6, 7, 7, 7, 8, 8, 8, 9, 9, 9, 10, 10, 10, 11, 11, 11, 12, 12, 12, 13, 13, 13, 14, 14, 14, 15, 15, 15}};
 
+alignas(32) const int8_t kTriple16Avx[3][32] = {
+    {0, 1, 0, 1, 0, 1, 2, 3, 2, 3, 2, 3, 4, 5, 4, 5, 4, 5, 6, 7, 6, 7, 6, 7, 8, 9, 8, 9, 8, 9, 10, 11},
+    {10, 11, 10, 11, 12, 13, 12, 13, 12, 13, 14, 15, 14, 15, 14, 15, 0, 1, 0, 1, 0, 1, 2, 3, 2, 3, 2, 3, 4, 5, 4, 5},
+    {4, 5, 6, 7, 6, 7, 6, 7, 8, 9, 8, 9, 8, 9, 10, 11, 10, 11, 10, 11, 12, 13, 12, 13, 12, 13, 14, 15, 14, 15, 14, 15}};
+// Four gray bytes to four pixels of four bytes, the fourth byte cleared for
+// alpha; the second lane takes the next four pixels.
+alignas(32) const int8_t kQuad8Avx[2][32] = {
+    {0, 0, 0, -1, 1, 1, 1, -1, 2, 2, 2, -1, 3, 3, 3, -1, 4, 4, 4, -1, 5, 5, 5, -1, 6, 6, 6, -1, 7, 7, 7, -1},
+    {8, 8, 8, -1, 9, 9, 9, -1, 10, 10, 10, -1, 11, 11, 11, -1, 12, 12, 12, -1, 13, 13, 13, -1, 14, 14, 14, -1,
+     15, 15, 15, -1}};
+alignas(32) const int32_t kTriple32Avx[3][8] = {
+    {0, 0, 0, 1, 1, 1, 2, 2}, {2, 3, 3, 3, 4, 4, 4, 5}, {5, 5, 6, 6, 6, 7, 7, 7}};
+
 inline __m128i mask(const int8_t* m) { return _mm_load_si128(reinterpret_cast<const __m128i*>(m)); }
 
 template <typename T, int Channels>
@@ -130,13 +143,39 @@ ZEL_AVX2 int avx8uC3(const uint8_t* s, uint8_t* d, int n) {
   return x;
 }
 
+ZEL_AVX2 int avx16uC3(const uint16_t* s, uint16_t* d, int n) {
+  int x = 0;
+  const __m256i m0 = load256(kTriple16Avx[0]), m1 = load256(kTriple16Avx[1]), m2 = load256(kTriple16Avx[2]);
+  for (; x + 16 <= n; x += 16) {
+    uint16_t* o = d + 3 * x;
+    store256(o, _mm256_shuffle_epi8(broadcast128(s + x), m0));
+    store256(o + 16, _mm256_shuffle_epi8(load256(s + x), m1));
+    store256(o + 32, _mm256_shuffle_epi8(broadcast128(s + x + 8), m2));
+  }
+  return x;
+}
+
+ZEL_AVX2 int avx32fC3(const float* s, float* d, int n) {
+  int x = 0;
+  const __m256i i0 = load256(kTriple32Avx[0]), i1 = load256(kTriple32Avx[1]), i2 = load256(kTriple32Avx[2]);
+  for (; x + 8 <= n; x += 8) {
+    const __m256i g = load256(s + x);  // moved as integers: bit exact
+    float* o = d + 3 * x;
+    store256(o, _mm256_permutevar8x32_epi32(g, i0));
+    store256(o + 8, _mm256_permutevar8x32_epi32(g, i1));
+    store256(o + 16, _mm256_permutevar8x32_epi32(g, i2));
+  }
+  return x;
+}
+
 ZEL_AVX2 int avx8uC4(const uint8_t* s, uint8_t* d, int n, uint8_t alpha) {
   int x = 0;
   const __m256i a = _mm256_set1_epi32(int32_t(uint32_t(alpha) << 24));
-  const __m256i spread = _mm256_set1_epi32(0x00010101);
-  for (; x + 8 <= n; x += 8) {
-    const __m256i g = _mm256_cvtepu8_epi32(load64(s + x));
-    store256(d + 4 * x, _mm256_or_si256(_mm256_mullo_epi32(g, spread), a));
+  const __m256i q0 = load256(kQuad8Avx[0]), q1 = load256(kQuad8Avx[1]);
+  for (; x + 16 <= n; x += 16) {
+    const __m256i g = broadcast128(s + x);
+    store256(d + 4 * x, _mm256_or_si256(_mm256_shuffle_epi8(g, q0), a));
+    store256(d + 4 * x + 32, _mm256_or_si256(_mm256_shuffle_epi8(g, q1), a));
   }
   return x;
 }
@@ -168,9 +207,11 @@ void grayRowKernel(const T* src, T* dst, int count, T alpha) {
     if (avx2) done = avx8uC3(src, dst, count);
     done += sse8uC3(src + done, dst + 3 * done, count - done);
   } else if constexpr (std::is_same_v<T, uint16_t> && Channels == 3) {
-    done = sse16uC3(src, dst, count);
+    if (avx2) done = avx16uC3(src, dst, count);
+    done += sse16uC3(src + done, dst + 3 * done, count - done);
   } else if constexpr (std::is_same_v<T, float> && Channels == 3) {
-    done = sse32fC3(src, dst, count);
+    if (avx2) done = avx32fC3(src, dst, count);
+    done += sse32fC3(src + done, dst + 3 * done, count - done);
   } else if constexpr (std::is_same_v<T, uint8_t> && Channels == 4) {
     if (avx2) done = avx8uC4(src, dst, count, alpha);
     done += sse8uC4(src + done, dst + 4 * done, count - done, alpha);

@@ -72,8 +72,8 @@ std::vector<D> convertRow(Status (*fn)(const S*, int, D*, int, ImageSize), const
 // `width` copies of one pixel.
 template <typename T>
 std::vector<T> repeat(std::initializer_list<T> pixel, int width) {
-  std::vector<T> out;
-  for (int x = 0; x < width; ++x) out.insert(out.end(), pixel);
+  std::vector<T> out(size_t(width) * pixel.size());
+  for (size_t i = 0; i < out.size(); ++i) out[i] = pixel.begin()[i % pixel.size()];
   return out;
 }
 

@@ -1,0 +1,141 @@
+// Times our exports on 1920x1080 frames, single thread, against the
+// conversions of other libraries, and prints megapixels per second with the
+// ratio ours / peer.
+//
+//   zelcc_bench                 every export that has a peer
+//   zelcc_bench --all           every export
+//   zelcc_bench --only=REGEX    exports whose name matches
+// Google Benchmark's own flags (--benchmark_min_time=...) pass through.
+#include <benchmark/benchmark.h>
+
+#include <cstdio>
+#include <algorithm>
+#include <cstring>
+#include <map>
+#include <memory>
+#include <regex>
+
+#include "frame/descriptor.h"
+#include "peers.h"
+
+#ifdef ZELCC_BENCH_OPENCV
+#include <opencv2/core.hpp>
+#endif
+
+namespace {
+
+using namespace zel::meta;
+using zel::bench::kHeight;
+using zel::bench::kWidth;
+
+constexpr double kMegapixels = double(kWidth) * kHeight / 1e6;
+
+struct Result {
+  double seconds = 0;  // per frame
+};
+
+// Collects the time of every run while printing nothing of its own.
+class Collector : public benchmark::BenchmarkReporter {
+ public:
+  bool ReportContext(const Context&) override { return true; }
+  void ReportRuns(const std::vector<Run>& runs) override {
+    for (const Run& r : runs)
+      if (r.iterations > 0 && !r.error_occurred)
+        results[r.run_name.function_name].seconds = r.real_accumulated_time / double(r.iterations);
+  }
+  std::map<std::string, Result> results;
+};
+
+struct Row {
+  std::string exportName;
+  std::vector<std::string> peerLabels;
+};
+
+}  // namespace
+
+int main(int argc, char** argv) {
+  bool all = false;
+  std::string only;
+  std::vector<char*> rest;
+  for (int i = 0; i < argc; ++i) {
+    if (std::strcmp(argv[i], "--all") == 0) all = true;
+    else if (std::strncmp(argv[i], "--only=", 7) == 0) only = argv[i] + 7;
+    else rest.push_back(argv[i]);
+  }
+  int restCount = int(rest.size());
+  benchmark::Initialize(&restCount, rest.data());
+#ifdef ZELCC_BENCH_OPENCV
+  cv::setNumThreads(1);
+#endif
+
+  std::vector<std::string> names;
+  if (all || !only.empty()) {
+    for (const Descriptor& d : allDescriptors())
+      if (d.isImageFunction()) names.push_back(d.name);
+  } else {
+    names = zel::bench::exportsWithPeers();
+  }
+  if (!only.empty()) {
+    const std::regex re(only);
+    std::vector<std::string> kept;
+    for (const auto& n : names)
+      if (std::regex_search(n, re)) kept.push_back(n);
+    names = kept;
+  }
+
+  std::vector<Row> rows;
+  for (const std::string& name : names) {
+    const Descriptor* d = findDescriptor(name);
+    if (!d || !d->isImageFunction()) continue;
+    Row row{name, {}};
+    // Ours, through the generic argument list of the descriptor.
+    auto ws = std::make_shared<Workspace>(*d, ImageSize{kWidth, kHeight});
+    ws->fillRandom(1);
+    auto args = std::make_shared<std::vector<Arg>>(ws->arguments());
+    benchmark::RegisterBenchmark(name.c_str(), [ws, args](benchmark::State& state) {
+      for (auto _ : state) {
+        const Status s = ws->call(*args);
+        if (s < 0) state.SkipWithError("the export returned an error");
+      }
+    })->Unit(benchmark::kMillisecond)->UseRealTime();
+    std::vector<zel::bench::Peer> peers = zel::bench::peersOf(name);
+    // Every export is also set against a copy of the bytes it writes.
+    size_t outBytes = 0;
+    for (Workspace::Buffer& b : ws->buffers())
+      if (b.isDestination) outBytes += size_t(b.geometry.rowBytes) * b.geometry.rows;
+    if (std::none_of(peers.begin(), peers.end(), [](const zel::bench::Peer& p) { return p.label.rfind("memcpy", 0) == 0; }))
+      peers.push_back(zel::bench::memcpyPeer(outBytes));
+    for (zel::bench::Peer& peer : peers) {
+      const std::string id = name + " | " + peer.label;
+      row.peerLabels.push_back(peer.label);
+      auto run = std::make_shared<std::function<void()>>(peer.run);
+      benchmark::RegisterBenchmark(id.c_str(), [run](benchmark::State& state) {
+        for (auto _ : state) (*run)();
+      })->Unit(benchmark::kMillisecond)->UseRealTime();
+    }
+    rows.push_back(row);
+  }
+
+  Collector collector;
+  benchmark::RunSpecifiedBenchmarks(&collector);
+
+  std::printf("\n%dx%d, single thread, megapixels per second\n\n", kWidth, kHeight);
+  std::printf("| export | ours MP/s | peer | peer MP/s | ours/peer |\n|---|---:|---|---:|---:|\n");
+  for (const Row& row : rows) {
+    auto ours = collector.results.find(row.exportName);
+    if (ours == collector.results.end()) continue;
+    const double oursMps = kMegapixels / ours->second.seconds;
+    if (row.peerLabels.empty()) {
+      std::printf("| %s | %.1f | - | - | - |\n", row.exportName.c_str(), oursMps);
+      continue;
+    }
+    for (const std::string& label : row.peerLabels) {
+      auto peer = collector.results.find(row.exportName + " | " + label);
+      if (peer == collector.results.end()) continue;
+      const double peerMps = kMegapixels / peer->second.seconds;
+      std::printf("| %s | %.1f | %s | %.1f | %.2f |\n", row.exportName.c_str(), oursMps, label.c_str(), peerMps,
+                  oursMps / peerMps);
+    }
+  }
+  return 0;
+}
