@@ -306,7 +306,107 @@ ZELCC_API Status zeliHLSToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], int sr
 ZELCC_API Status zeliHLSToBGR_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
                                      int dstStep, ImageSize size);
 
+/* RGB to and from hue, saturation, value. */
+ZELCC_API Status zeliRGBToHSV_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliRGBToHSV_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToHSV_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToHSV_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliHSVToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliHSVToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliHSVToRGB_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliHSVToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
+
 /* ---- XYZ, LUV and Lab ---- */
+ZELCC_API Status zeliBGRToLUV_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToLUV_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliLUVToBGR_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliLUVToBGR_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliLUVToRGB_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliLUVToRGB_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliLUVToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliLUVToRGB_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliLUVToRGB_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliLUVToRGB_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliLUVToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliLUVToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliRGBToLUV_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliRGBToLUV_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToLUV_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliRGBToLUV_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToLUV_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliRGBToLUV_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToLUV_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToLUV_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliRGBToLab_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliBGRToLab_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliBGRToLab_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliRGBToLab_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToLab_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliLabToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliLabToBGR_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliLabToBGR_16u8u_C3R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliLabToRGB_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliLabToBGR_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliXYZToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliXYZToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliXYZToRGB_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliXYZToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliXYZToRGB_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliXYZToRGB_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliXYZToRGB_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliXYZToRGB_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep,
+                                       ImageSize size);
 
 /* ---- Colour twist ---- */
 /* Row i of `twist`: weights of the three inputs and a constant in sample units for output i; */
