@@ -85,6 +85,24 @@ ZELCC_API Status zeliGrayToRGB_32f_C1C4R(const float* src, int srcStep, float* d
                                          ImageSize size, float alpha);
 
 /* ---- RGB to and from YCbCr and YUV at full resolution ---- */
+/* Full-range YUV: Y with no offset, U and V centred on 128. */
+ZELCC_API Status zeliRGBToYUV_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYUV_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYUV_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
+                                       ImageSize size);
+/* The fourth plane receives the source's fourth bytes; its pointer is not tested. */
+ZELCC_API Status zeliRGBToYUV_8u_AC4P4R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[4], int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliRGBToYUV_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                     int dstStep, ImageSize size);
+ZELCC_API Status zeliYUVToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYUVToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYUVToRGB_8u_C3C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                       uint8_t alpha);
+ZELCC_API Status zeliYUVToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliYUVToRGB_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                     int dstStep, ImageSize size);
 
 /* ---- Photo YCC ---- */
 

@@ -209,6 +209,10 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       d.checksSteps = true;
     } else if (word == "alphawritten") {
       d.writesAlpha = true;
+    } else if (word.rfind("planestested=", 0) == 0) {
+      d.testedPlanes = std::atoi(word.c_str() + 13);
+    } else if (word == "elementsteps") {
+      d.elementSteps = true;
     } else if (word.rfind("order=", 0) == 0) {
       std::string rest = word.substr(6);
       std::replace(rest.begin(), rest.end(), ',', ' ');
@@ -231,6 +235,8 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
   for (const std::string& o : order) {
     if (o == "null") d.order.push_back({Check::NullTop});
     else if (o == "planes") d.order.push_back({Check::NullPlanes});
+    else if (o == "srcplanes") d.order.push_back({Check::NullPlanes, -1, 0});
+    else if (o == "dstplanes") d.order.push_back({Check::NullPlanes, -1, 1});
     else if (o == "size") d.order.push_back({Check::Size});
     else if (o == "step") d.order.push_back({Check::Step});
     else {
@@ -419,6 +425,8 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
       Buffer b;
       b.geometry = planeGeometry(side, p, w, h);
       b.step = b.geometry.rowBytes + padBytes;
+      // A step in elements drops the low bits of a byte step.
+      b.stride = d.elementSteps ? b.step / b.geometry.sampleBytes * b.geometry.sampleBytes : b.step;
       const int rows = std::max(b.geometry.rows, 1);
       const size_t total = size_t(kGuard) * 2 + size_t(offset) + size_t(b.step) * rows + 64;
       b.bytes.assign(total, kGuardByte);
@@ -474,7 +482,7 @@ void Workspace::fillRandom(uint32_t seed) {
   for (Buffer& b : buffers_) {
     if (!b.isSource) continue;
     for (int y = 0; y < b.geometry.rows; ++y) {
-      uint8_t* row = b.first + size_t(y) * b.step;
+      uint8_t* row = b.first + size_t(y) * b.stride;
       if (d_.src.sample == Sample::F32) {
         // Floats in 0..1, the range colour functions take.
         std::uniform_real_distribution<float> dist(0.0f, 1.0f);
@@ -492,7 +500,7 @@ void Workspace::fillRandom(uint32_t seed) {
 void Workspace::fillDestinations(uint8_t value) {
   for (Buffer& b : buffers_) {
     if (!b.isDestination || b.isSource) continue;
-    for (int y = 0; y < b.geometry.rows; ++y) std::memset(b.first + size_t(y) * b.step, value, b.geometry.rowBytes);
+    for (int y = 0; y < b.geometry.rows; ++y) std::memset(b.first + size_t(y) * b.stride, value, b.geometry.rowBytes);
   }
 }
 
@@ -578,12 +586,12 @@ std::string Workspace::checkGuards() const {
       return m.str();
     };
     const int rows = b.geometry.rows;
-    const uint8_t* regionEnd = b.first + (rows > 0 ? size_t(rows - 1) * b.step + b.geometry.rowBytes : 0);
+    const uint8_t* regionEnd = b.first + (rows > 0 ? size_t(rows - 1) * b.stride + b.geometry.rowBytes : 0);
     for (const uint8_t* p = lo; p < b.first; ++p)
       if (*p != kGuardByte) return describeAt(p);
     for (int y = 0; y + 1 < rows; ++y) {
-      const uint8_t* padStart = b.first + size_t(y) * b.step + b.geometry.rowBytes;
-      for (const uint8_t* p = padStart; p < b.first + size_t(y + 1) * b.step; ++p)
+      const uint8_t* padStart = b.first + size_t(y) * b.stride + b.geometry.rowBytes;
+      for (const uint8_t* p = padStart; p < b.first + size_t(y + 1) * b.stride; ++p)
         if (*p != kGuardByte) return describeAt(p);
     }
     for (const uint8_t* p = regionEnd; p < hi; ++p)

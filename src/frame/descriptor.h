@@ -61,6 +61,7 @@ enum class Check { NullTop, NullPlanes, Size, Step, Extra };
 struct CheckStage {
   Check check;
   int extra = -1;  // for Check::Extra
+  int side = -1;   // for Check::NullPlanes: 0 source, 1 destination, -1 every plane array
 };
 
 // Argument roles in prototype order.
@@ -96,6 +97,8 @@ struct Descriptor {
   bool warnsOdd = false;        // may return StatusOddSizeWarning
   bool writesAlpha = false;     // an AC4 destination's fourth channel is written
   bool checksSteps = false;
+  int testedPlanes = 0;         // plane entries tested for null per array; 0: all
+  bool elementSteps = false;    // steps are used as step / sample size elements
   void (*impl)() = nullptr;
   Invoker invoke = nullptr;
   std::vector<ArgKind> prototype;  // kinds of the prototype's parameters
@@ -128,7 +131,8 @@ class Workspace {
   struct Buffer {
     std::vector<uint8_t> bytes;  // guard + rows + guard
     uint8_t* first = nullptr;    // first byte of the region
-    int step = 0;
+    int step = 0;    // the step argument
+    int stride = 0;  // bytes from one row to the next as the function walks them
     PlaneGeometry geometry{};
     bool isSource = false;
     bool isDestination = false;

@@ -65,9 +65,10 @@ std::vector<Failure> failuresOf(const Descriptor& d, const CheckStage& stage) {
     case Check::NullPlanes:
       for (const ArgSlot& s : d.slots) {
         const int side = s.role == Role::SrcPlanes ? 0 : s.role == Role::DstPlanes ? 1 : s.role == Role::SrcDstPlanes ? 2 : -1;
-        if (side < 0) continue;
+        if (side < 0 || (stage.side >= 0 && stage.side != side)) continue;
         const Side& sd = side == 1 ? d.dst : d.src;
-        for (int k = 0; k < sd.planes(); ++k)
+        const int tested = d.testedPlanes > 0 ? std::min(d.testedPlanes, sd.planes()) : sd.planes();
+        for (int k = 0; k < tested; ++k)
           out.push_back({"null plane " + std::to_string(k) + " of side " + std::to_string(side), StatusNullPointerError,
                          [side, k](Workspace& w, std::vector<Arg>&, ImageSize&) { w.planeArray(side)[k] = nullptr; }});
       }
@@ -181,7 +182,7 @@ void expectGuardsKept(const Descriptor& d, ImageSize size, int pad, int offset) 
       for (int y = 0; y < b.geometry.rows; ++y)
         for (int x = 0; x < size.width; ++x)
           for (int k = 0; k < px; ++k) {
-            const size_t at = start + size_t(y) * b.step + size_t(x) * 4 * px + 3 * px + k;
+            const size_t at = start + size_t(y) * b.stride + size_t(x) * 4 * px + 3 * px + k;
             ASSERT_EQ(before[i][at], after[i][at]) << "alpha of pixel " << x << "," << y << " was written";
           }
     }
