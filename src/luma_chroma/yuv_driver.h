@@ -2,6 +2,8 @@
 // interleaved rows and over plane sets that share one step.
 #pragma once
 
+#include <cstddef>
+
 #include "frame/image_layout.h"
 #include "frame/row_driver.h"
 #include "luma_chroma/yuv_rows.h"
@@ -35,6 +37,19 @@ inline Status walkInterleaved(const uint8_t* src, int srcStep, uint8_t* dst, int
   if (sizeBelowOne(size)) return StatusSizeError;
   const Path path = bestPath();
   plainWalk(size.height, [&](int y) { row(rowAt(src, srcStep, y), rowAt(dst, dstStep, y), size.width, path); });
+  return StatusOk;
+}
+
+// The same with steps turned into element counts, step >> 1 for 16-bit
+// samples and step >> 2 for 32-bit ones: an uneven step loses its low bits.
+// `row(src, dst, width)` converts one row.
+template <typename T, typename Row>
+inline Status walkElements(const T* src, int srcStep, T* dst, int dstStep, ImageSize size, Row row) {
+  if (!src || !dst) return StatusNullPointerError;
+  if (sizeBelowOne(size)) return StatusSizeError;
+  constexpr int shift = sizeof(T) == 4 ? 2 : sizeof(T) == 2 ? 1 : 0;
+  const std::ptrdiff_t srcElements = srcStep >> shift, dstElements = dstStep >> shift;
+  plainWalk(size.height, [&](int y) { row(src + y * srcElements, dst + y * dstElements, size.width); });
   return StatusOk;
 }
 

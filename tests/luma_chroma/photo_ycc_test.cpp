@@ -1,0 +1,410 @@
+// Photo YCC: worked values of every form, the vector forms against the scalar
+// ones, and the sixteen members at every width with their zones, fourth
+// samples and element steps.
+#include <gtest/gtest.h>
+
+#include <array>
+#include <cmath>
+#include <cstring>
+#include <functional>
+#include <limits>
+#include <random>
+
+#include "luma_chroma/photo_ycc_forms.h"
+#include "luma_chroma/photo_ycc_kernels.h"
+#include "support/test_image.h"
+#include "zelcc/zelcc.h"
+
+namespace {
+
+using namespace zel;
+using zel::test::TestImage;
+
+std::string str(Pixel8 p) {
+  return std::to_string(p.c0) + "," + std::to_string(p.c1) + "," + std::to_string(p.c2);
+}
+std::string str(Word3 w) {
+  return std::to_string(w.c0) + "," + std::to_string(w.c1) + "," + std::to_string(w.c2);
+}
+bool same(Pixel8 a, Pixel8 b) { return a.c0 == b.c0 && a.c1 == b.c1 && a.c2 == b.c2; }
+Word3 signedWords(int a, int b, int c) { return {uint16_t(a), uint16_t(b), uint16_t(c)}; }
+uint32_t bits(float f) {
+  uint32_t u;
+  std::memcpy(&u, &f, 4);
+  return u;
+}
+
+// ---------------------------------------------------------------- values
+
+TEST(PhotoYccForms, EightBitBlackAndWhiteAgreeInBodyAndTail) {
+  EXPECT_EQ(str(rgbToYccLanes(0, 0, 0)), "0,156,137");
+  EXPECT_EQ(str(rgbToYccWide(0, 0, 0)), "0,156,137");
+  // White: L = 16316 in the body, MulHighS16(16316, 2921) = 727, >> 2 = 181.
+  EXPECT_EQ(str(rgbToYccLanes(255, 255, 255)), "181,156,137");
+  EXPECT_EQ(str(rgbToYccWide(255, 255, 255)), "181,156,137");
+  EXPECT_EQ(str(yccToRgbLanes(181, 156, 137)), "245,245,245");
+  EXPECT_EQ(str(yccToRgbWide(181, 156, 137)), "245,245,245");
+  EXPECT_EQ(str(yccToRgbLanes(0, 156, 137)), "0,0,0");
+}
+
+TEST(PhotoYccForms, EightBitBodyAndTailPartInTheLastBit) {
+  // The inverse body carries 5563 and the tail 5564; the forward forms round
+  // differently. Both pairs must differ somewhere, by one at most.
+  int forward = 0, inverse = 0;
+  for (int a = 0; a < 256; a += 3)
+    for (int b = 0; b < 256; b += 3)
+      for (int c = 0; c < 256; c += 3) {
+        const Pixel8 f1 = rgbToYccLanes(a, b, c), f2 = rgbToYccWide(a, b, c);
+        const Pixel8 i1 = yccToRgbLanes(a, b, c), i2 = yccToRgbWide(a, b, c);
+        ASSERT_LE(std::abs(f1.c0 - f2.c0) + std::abs(f1.c1 - f2.c1) + std::abs(f1.c2 - f2.c2), 3);
+        ASSERT_LE(std::abs(i1.c0 - i2.c0), 1);
+        ASSERT_LE(std::abs(i1.c2 - i2.c2), 1);
+        forward += !same(f1, f2);
+        inverse += !same(i1, i2);
+      }
+  EXPECT_GT(forward, 0);
+  EXPECT_GT(inverse, 0);
+}
+
+TEST(PhotoYccForms, SixteenBitValuesWorkedInSinglePrecision) {
+  struct Row {
+    int in[3];
+    const char *body, *tail;
+  };
+  // White: 65535 x 0.7132668 rounds to 46744.
+  const Row forward16u[] = {{{65535, 65535, 65535}, "46744,40092,35209", "46744,40092,35209"},
+                            {{65535, 0, 0}, "13976,31532,59646", "13976,31532,59645"},
+                            {{0, 65535, 0}, "27439,23286,14746", "27439,23286,14747"},
+                            {{1000, 30000, 60000}, "17653,55492,22576", "17653,55492,22576"}};
+  for (const Row& r : forward16u) {
+    const Float3 f = rgbToYccBody16(float(r.in[0]), float(r.in[1]), float(r.in[2]));
+    EXPECT_EQ(str(Word3{roundToWord(f.c0), roundToWord(f.c1), roundToWord(f.c2)}), r.body);
+    EXPECT_EQ(str(rgbToYccTail16u(r.in[0], r.in[1], r.in[2])), r.tail);
+  }
+  const Row inverse16u[] = {{{46744, 40092, 35209}, "63497,63497,63497", "63497,63497,63497"},
+                            {{0, 0, 0}, "0,49894,0", "0,49894,0"},
+                            {{20000, 30000, 60000}, "65535,8525,4785", "65535,8525,4785"}};
+  for (const Row& r : inverse16u) {
+    const Float3 f = yccToRgbBody16(float(r.in[0]), float(r.in[1]), float(r.in[2]));
+    EXPECT_EQ(str(Word3{roundToWord(f.c0), roundToWord(f.c1), roundToWord(f.c2)}), r.body);
+    EXPECT_EQ(str(yccToRgbTail16u(r.in[0], r.in[1], r.in[2])), r.tail);
+  }
+  // Signed samples: the tails as stored bit patterns.
+  EXPECT_EQ(str(rgbToYccTail16s(-20000, 5000, 30000)), str(signedWords(-9128, 20266, -8397)));
+  EXPECT_EQ(str(rgbToYccTail16s(-32768, -32768, -32768)), str(signedWords(-32768, 7324, 2441)));
+  EXPECT_EQ(str(yccToRgbTail16s(-2768, 17232, -12768)), str(signedWords(-19720, 17821, 29958)));
+  EXPECT_EQ(str(yccToRgbTail16s(0, 0, 0)), str(signedWords(7297, 17158, -4500)));
+  // The signed body is the unsigned body on samples plus 32768: one above
+  // the tail here.
+  const Float3 f = yccToRgbBody16(-2768 + 32768.0f, 17232 + 32768.0f, -12768 + 32768.0f);
+  EXPECT_EQ(str(Word3{roundToSignedWord(f.c0), roundToSignedWord(f.c1), roundToSignedWord(f.c2)}),
+            str(signedWords(-19719, 17822, 29959)));
+}
+
+TEST(PhotoYccForms, FloatValuesBitForBit) {
+  struct Row {
+    float in[3];
+    uint32_t out[3];
+  };
+  const Row forward[] = {{{1.0f, 1.0f, 1.0f}, {0x3f3698a7, 0x3f1c9c9d, 0x3f09898a}},
+                         {{0.25f, 0.5f, 0.75f}, {0x3ea5b4c6, 0x3f3dbe52, 0x3edb95aa}}};
+  for (const Row& r : forward) {
+    const Float3 v = rgbToYcc32f(r.in[0], r.in[1], r.in[2]);
+    EXPECT_EQ(bits(v.c0), r.out[0]);
+    EXPECT_EQ(bits(v.c1), r.out[1]);
+    EXPECT_EQ(bits(v.c2), r.out[2]);
+  }
+  const Row inverse[] = {{{1.0f, 0.6117647f, 0.5372549f}, {0x3f800000, 0x3f800000, 0x3f800000}},
+                         {{0.5f, 0.2f, 0.9f}, {0x3f800000, 0x3f052249, 0x00000000}},
+                         {{0.3f, 0.7f, 0.4f}, {0x3e214a5a, 0x3efe5ddc, 0x3f1a6c6e}}};
+  for (const Row& r : inverse) {
+    const Float3 v = yccToRgb32f(r.in[0], r.in[1], r.in[2]);
+    EXPECT_EQ(bits(v.c0), r.out[0]);
+    EXPECT_EQ(bits(v.c1), r.out[1]);
+    EXPECT_EQ(bits(v.c2), r.out[2]);
+  }
+}
+
+// ---------------------------------------------------------------- lanes
+
+template <typename Scalar, typename Vec>
+void expectEightBitLanes(const char* name, Scalar scalar, Vec vec) {
+  alignas(16) int16_t a[8], b[8], c[8];
+  alignas(16) int16_t o[3][8];
+  int n = 0;
+  for (int x = 0; x < 256; x += 2)
+    for (int y = 0; y < 256; y += 3)
+      for (int z = 0; z < 256; z += 5) {
+        a[n] = int16_t(x), b[n] = int16_t(y), c[n] = int16_t(z);
+        if (++n < 8) continue;
+        n = 0;
+        const Lanes3 r = vec(_mm_load_si128(reinterpret_cast<__m128i*>(a)), _mm_load_si128(reinterpret_cast<__m128i*>(b)),
+                             _mm_load_si128(reinterpret_cast<__m128i*>(c)));
+        _mm_store_si128(reinterpret_cast<__m128i*>(o[0]), r.c0);
+        _mm_store_si128(reinterpret_cast<__m128i*>(o[1]), r.c1);
+        _mm_store_si128(reinterpret_cast<__m128i*>(o[2]), r.c2);
+        for (int k = 0; k < 8; ++k) {
+          const Pixel8 got{SaturateU8(o[0][k]), SaturateU8(o[1][k]), SaturateU8(o[2][k])};
+          const Pixel8 want = scalar(a[k], b[k], c[k]);
+          if (!same(got, want)) FAIL() << name << " at " << a[k] << "," << b[k] << "," << c[k];
+        }
+      }
+}
+
+template <typename Scalar, typename Vec>
+ZEL_AVX2 void expectEightBitLanesAvx2(const char* name, Scalar scalar, Vec vec) {
+  alignas(32) int16_t in[3][16], o[3][16];
+  std::mt19937 rng(5);
+  for (int round = 0; round < 20000; ++round) {
+    for (auto& ch : in)
+      for (int16_t& v : ch) v = int16_t(rng() & 255);
+    const Lanes3x16 r = vec(_mm256_load_si256(reinterpret_cast<__m256i*>(in[0])),
+                            _mm256_load_si256(reinterpret_cast<__m256i*>(in[1])),
+                            _mm256_load_si256(reinterpret_cast<__m256i*>(in[2])));
+    _mm256_store_si256(reinterpret_cast<__m256i*>(o[0]), r.c0);
+    _mm256_store_si256(reinterpret_cast<__m256i*>(o[1]), r.c1);
+    _mm256_store_si256(reinterpret_cast<__m256i*>(o[2]), r.c2);
+    for (int k = 0; k < 16; ++k) {
+      const Pixel8 got{SaturateU8(o[0][k]), SaturateU8(o[1][k]), SaturateU8(o[2][k])};
+      if (!same(got, scalar(in[0][k], in[1][k], in[2][k]))) FAIL() << name << " lane " << k;
+    }
+  }
+}
+
+TEST(PhotoYccForms, EightBitVectorFormsGiveTheScalarBits) {
+  using S = Pixel8 (*)(int, int, int);
+  using V = Lanes3 (*)(__m128i, __m128i, __m128i);
+  expectEightBitLanes("rgbToYccLanes", S(rgbToYccLanes), V(rgbToYccLanes));
+  expectEightBitLanes("yccToRgbLanes", S(yccToRgbLanes), V(yccToRgbLanes));
+  if (!hasAvx2()) return;
+  using X = Lanes3x16 (*)(__m256i, __m256i, __m256i);
+  expectEightBitLanesAvx2("rgbToYccLanes", S(rgbToYccLanes), X(rgbToYccLanes));
+  expectEightBitLanesAvx2("yccToRgbLanes", S(yccToRgbLanes), X(yccToRgbLanes));
+}
+
+TEST(PhotoYccForms, FloatVectorFormsGiveTheScalarBits) {
+  std::mt19937 rng(9);
+  std::uniform_real_distribution<float> unit(-0.25f, 1.25f);
+  for (int round = 0; round < 50000; ++round) {
+    alignas(16) float w[3][4], u[3][4];
+    for (int c = 0; c < 3; ++c)
+      for (int k = 0; k < 4; ++k) {
+        w[c][k] = float(rng() & 0xFFFF);
+        u[c][k] = unit(rng);
+      }
+    auto load = [](const float* p) { return _mm_load_ps(p); };
+    const Floats3 f16 = rgbToYccBody16(load(w[0]), load(w[1]), load(w[2]));
+    const Floats3 i16 = yccToRgbBody16(load(w[0]), load(w[1]), load(w[2]));
+    const Floats3 f32 = rgbToYcc32f(load(u[0]), load(u[1]), load(u[2]));
+    const Floats3 i32 = yccToRgb32f(load(u[0]), load(u[1]), load(u[2]));
+    alignas(16) float o[4][3][4];
+    const Floats3* all[4] = {&f16, &i16, &f32, &i32};
+    for (int v = 0; v < 4; ++v) {
+      _mm_store_ps(o[v][0], all[v]->c0);
+      _mm_store_ps(o[v][1], all[v]->c1);
+      _mm_store_ps(o[v][2], all[v]->c2);
+    }
+    for (int k = 0; k < 4; ++k) {
+      const Float3 s[4] = {rgbToYccBody16(w[0][k], w[1][k], w[2][k]), yccToRgbBody16(w[0][k], w[1][k], w[2][k]),
+                           rgbToYcc32f(u[0][k], u[1][k], u[2][k]), yccToRgb32f(u[0][k], u[1][k], u[2][k])};
+      for (int v = 0; v < 4; ++v) {
+        ASSERT_EQ(bits(o[v][0][k]), bits(s[v].c0)) << "form " << v;
+        ASSERT_EQ(bits(o[v][1][k]), bits(s[v].c1)) << "form " << v;
+        ASSERT_EQ(bits(o[v][2][k]), bits(s[v].c2)) << "form " << v;
+      }
+    }
+  }
+}
+
+TEST(PhotoYccForms, ClampKeepsNaNAndNegativeZero) {
+  const float nan = std::numeric_limits<float>::quiet_NaN();
+  alignas(16) float in[4] = {nan, -0.0f, 1.5f, -3.0f}, out[4];
+  _mm_store_ps(out, clampUnit(_mm_load_ps(in)));
+  for (int k = 0; k < 4; ++k) EXPECT_EQ(bits(out[k]), bits(clampUnit(in[k]))) << k;
+  EXPECT_TRUE(std::isnan(out[0]));
+  EXPECT_EQ(bits(out[1]), bits(-0.0f));
+}
+
+// ---------------------------------------------------------------- members
+
+// One member: how to call it, and the expected samples of pixel x of a row
+// of `width` given its three source samples.
+template <typename T>
+struct Member {
+  const char* name;
+  int channels;
+  std::function<Status(const T*, int, T*, int, ImageSize)> run;
+  std::function<std::array<T, 3>(const T* px, int x, int width)> expected;
+};
+
+template <typename T>
+std::array<T, 3> fromPixel(Pixel8 p) {
+  return {T(p.c0), T(p.c1), T(p.c2)};
+}
+
+std::vector<Member<uint8_t>> eightBitMembers() {
+  using P = const uint8_t*;
+  auto zones = [](int block, Pixel8 (*body)(int, int, int), Pixel8 (*tail)(int, int, int)) {
+    return [=](P p, int x, int width) {
+      return fromPixel<uint8_t>((x < (width & ~(block - 1)) ? body : tail)(p[0], p[1], p[2]));
+    };
+  };
+  return {{"zeliRGBToYCC_8u_C3R", 3, zeliRGBToYCC_8u_C3R, zones(8, rgbToYccLanes, rgbToYccWide)},
+          {"zeliRGBToYCC_8u_AC4R", 4, zeliRGBToYCC_8u_AC4R, zones(4, rgbToYccLanes, rgbToYccWide)},
+          {"zeliYCCToRGB_8u_C3R", 3, zeliYCCToRGB_8u_C3R, zones(8, yccToRgbLanes, yccToRgbWide)},
+          {"zeliYCCToRGB_8u_AC4R", 4, zeliYCCToRGB_8u_AC4R, zones(4, yccToRgbLanes, yccToRgbWide)}};
+}
+
+// 16-bit members: the float body below width AND NOT 3, rounded; the tail of
+// the sample type after it.
+template <typename T>
+std::function<std::array<T, 3>(const T*, int, int)> wordZones(Float3 (*body)(float, float, float),
+                                                               Word3 (*tail)(int, int, int)) {
+  return [=](const T* p, int x, int width) {
+    const bool isSigned = std::is_signed_v<T>;
+    Word3 w;
+    if (x < (width & ~3)) {
+      const float bias = isSigned ? 32768.0f : 0.0f;
+      const Float3 f = body(float(p[0]) + bias, float(p[1]) + bias, float(p[2]) + bias);
+      w = isSigned ? Word3{roundToSignedWord(f.c0), roundToSignedWord(f.c1), roundToSignedWord(f.c2)}
+                   : Word3{roundToWord(f.c0), roundToWord(f.c1), roundToWord(f.c2)};
+    } else {
+      w = tail(p[0], p[1], p[2]);
+    }
+    return std::array<T, 3>{T(w.c0), T(w.c1), T(w.c2)};
+  };
+}
+
+std::vector<Member<uint16_t>> unsignedMembers() {
+  return {{"zeliRGBToYCC_16u_C3R", 3, zeliRGBToYCC_16u_C3R, wordZones<uint16_t>(rgbToYccBody16, rgbToYccTail16u)},
+          {"zeliRGBToYCC_16u_AC4R", 4, zeliRGBToYCC_16u_AC4R, wordZones<uint16_t>(rgbToYccBody16, rgbToYccTail16u)},
+          {"zeliYCCToRGB_16u_C3R", 3, zeliYCCToRGB_16u_C3R, wordZones<uint16_t>(yccToRgbBody16, yccToRgbTail16u)},
+          {"zeliYCCToRGB_16u_AC4R", 4, zeliYCCToRGB_16u_AC4R, wordZones<uint16_t>(yccToRgbBody16, yccToRgbTail16u)}};
+}
+
+std::vector<Member<int16_t>> signedMembers() {
+  return {{"zeliRGBToYCC_16s_C3R", 3, zeliRGBToYCC_16s_C3R, wordZones<int16_t>(rgbToYccBody16, rgbToYccTail16s)},
+          {"zeliRGBToYCC_16s_AC4R", 4, zeliRGBToYCC_16s_AC4R, wordZones<int16_t>(rgbToYccBody16, rgbToYccTail16s)},
+          {"zeliYCCToRGB_16s_C3R", 3, zeliYCCToRGB_16s_C3R, wordZones<int16_t>(yccToRgbBody16, yccToRgbTail16s)},
+          {"zeliYCCToRGB_16s_AC4R", 4, zeliYCCToRGB_16s_AC4R, wordZones<int16_t>(yccToRgbBody16, yccToRgbTail16s)}};
+}
+
+std::vector<Member<float>> floatMembers() {
+  auto all = [](Float3 (*form)(float, float, float)) {
+    return [=](const float* p, int, int) {
+      const Float3 f = form(p[0], p[1], p[2]);
+      return std::array<float, 3>{f.c0, f.c1, f.c2};
+    };
+  };
+  return {{"zeliRGBToYCC_32f_C3R", 3, zeliRGBToYCC_32f_C3R, all(rgbToYcc32f)},
+          {"zeliRGBToYCC_32f_AC4R", 4, zeliRGBToYCC_32f_AC4R, all(rgbToYcc32f)},
+          {"zeliYCCToRGB_32f_C3R", 3, zeliYCCToRGB_32f_C3R, all(yccToRgb32f)},
+          {"zeliYCCToRGB_32f_AC4R", 4, zeliYCCToRGB_32f_AC4R, all(yccToRgb32f)}};
+}
+
+template <typename T>
+bool sameBits(T a, T b) {
+  return std::memcmp(&a, &b, sizeof(T)) == 0;
+}
+
+// Random rows at byte offsets that keep the samples' own alignment and at
+// odd ones, padded; every sample by its zone's form, the fourth samples and
+// the bytes around the rows unchanged.
+template <typename T>
+void checkMembers(const std::vector<Member<T>>& members) {
+  for (const Member<T>& m : members)
+    for (int width = 1; width <= 70; ++width)
+      for (int offset : {0, int(sizeof(T)), 3}) {
+        const int height = 2, n = m.channels;
+        TestImage<T> src(width * n, height, offset, 2 * int(sizeof(T)));
+        TestImage<T> dst(width * n, height, offset + int(sizeof(T)) * (width & 1), 3 * int(sizeof(T)));
+        // Floats in a range past 0..1 on both sides, so the clamps work.
+        src.fillRandom(uint32_t(width * 7 + offset), -0.2, 1.2);
+        std::vector<T> fourth;
+        for (int y = 0; y < height && n == 4; ++y)
+          for (int x = 0; x < width; ++x) fourth.push_back(dst.get(4 * x + 3, y));
+        ASSERT_EQ(m.run(src.data(), src.step(), dst.data(), dst.step(), ImageSize{width, height}), StatusOk);
+        for (int y = 0; y < height; ++y)
+          for (int x = 0; x < width; ++x) {
+            T px[3] = {src.get(n * x, y), src.get(n * x + 1, y), src.get(n * x + 2, y)};
+            const std::array<T, 3> want = m.expected(px, x, width);
+            for (int c = 0; c < 3; ++c)
+              ASSERT_TRUE(sameBits(dst.get(n * x + c, y), want[c]))
+                  << m.name << " width " << width << " offset " << offset << " pixel " << x << " channel " << c
+                  << ": " << +dst.get(n * x + c, y) << " for " << +want[c];
+            if (n == 4) ASSERT_TRUE(sameBits(dst.get(4 * x + 3, y), fourth[size_t(y) * width + x])) << m.name;
+          }
+        ASSERT_TRUE(dst.guardsIntact()) << m.name << " width " << width << " offset " << offset;
+      }
+}
+
+TEST(PhotoYccMembers, EightBitEveryWidth) { checkMembers(eightBitMembers()); }
+TEST(PhotoYccMembers, UnsignedSixteenBitEveryWidth) { checkMembers(unsignedMembers()); }
+TEST(PhotoYccMembers, SignedSixteenBitEveryWidth) { checkMembers(signedMembers()); }
+TEST(PhotoYccMembers, FloatEveryWidth) { checkMembers(floatMembers()); }
+
+TEST(PhotoYccMembers, EightBitKernelsAgreeOnBothVectorPaths) {
+  std::vector<Path> paths{Path::Sse41};
+  if (hasAvx2()) paths.push_back(Path::Avx2);
+  using Row = void (*)(const uint8_t*, uint8_t*, int, Path);
+  // In the order of eightBitMembers().
+  const struct {
+    Row row;
+    int channels;
+  } kernels[] = {{rgbToYcc8uRow<3>, 3}, {rgbToYcc8uRow<4>, 4}, {yccToRgb8uRow<3>, 3}, {yccToRgb8uRow<4>, 4}};
+  const auto members = eightBitMembers();
+  for (size_t k = 0; k < 4; ++k)
+    for (Path path : paths)
+      for (int width : {3, 4, 5, 8, 12, 15, 16, 17, 20, 31, 32, 33, 36, 64, 67}) {
+        TestImage<uint8_t> src(width * kernels[k].channels, 1, 1), dst(width * kernels[k].channels, 1, 5);
+        src.fillRandom(uint32_t(width));
+        dst.fill(0x11);
+        kernels[k].row(src.data(), dst.data(), width, path);
+        const int n = kernels[k].channels;
+        for (int x = 0; x < width; ++x) {
+          const uint8_t* px = src.data() + n * x;
+          const auto want = members[k].expected(px, x, width);
+          for (int c = 0; c < 3; ++c) ASSERT_EQ(dst.get(n * x + c, 0), want[c]) << members[k].name << " " << x;
+          if (n == 4) ASSERT_EQ(dst.get(4 * x + 3, 0), 0x11);
+        }
+        ASSERT_TRUE(dst.guardsIntact());
+      }
+}
+
+TEST(PhotoYccMembers, UnevenStepsLoseTheirLowBits) {
+  // A step one byte past the rows' true distance walks the same rows as the
+  // true one for 16-bit and float samples.
+  const int width = 9, height = 4;
+  TestImage<uint16_t> src(width * 3, height), a(width * 3, height), b(width * 3, height);
+  src.fillRandom(77);
+  ASSERT_EQ(zeliRGBToYCC_16u_C3R(src.data(), src.step(), a.data(), a.step(), ImageSize{width, height}), StatusOk);
+  ASSERT_EQ(zeliRGBToYCC_16u_C3R(src.data(), src.step() + 1, b.data(), b.step() + 1, ImageSize{width, height}),
+            StatusOk);
+  for (int y = 0; y < height; ++y)
+    for (int x = 0; x < width * 3; ++x) ASSERT_EQ(a.get(x, y), b.get(x, y));
+  TestImage<float> fs(width * 4, height), fa(width * 4, height), fb(width * 4, height);
+  fs.fillRandom(78);
+  ASSERT_EQ(zeliYCCToRGB_32f_AC4R(fs.data(), fs.step(), fa.data(), fa.step(), ImageSize{width, height}), StatusOk);
+  ASSERT_EQ(zeliYCCToRGB_32f_AC4R(fs.data(), fs.step() + 3, fb.data(), fb.step() + 3, ImageSize{width, height}),
+            StatusOk);
+  for (int y = 0; y < height; ++y)
+    for (int x = 0; x < width * 4; ++x) ASSERT_TRUE(sameBits(fa.get(x, y), fb.get(x, y)));
+}
+
+TEST(PhotoYccMembers, WhiteSixteenBitAndUnitLumaFloat) {
+  const uint16_t white[12] = {65535, 65535, 65535, 65535, 65535, 65535, 65535, 65535, 65535, 65535, 65535, 65535};
+  uint16_t out[12];
+  ASSERT_EQ(zeliRGBToYCC_16u_C3R(white, 24, out, 24, ImageSize{4, 1}), StatusOk);
+  for (int x = 0; x < 4; ++x) EXPECT_EQ(out[3 * x], 46744) << x;
+  // Luma 1 with neutral chroma saturates all three to 1, tail included.
+  float ycc[15], rgb[15];
+  for (int x = 0; x < 5; ++x) {
+    ycc[3 * x] = 1.0f;
+    ycc[3 * x + 1] = 0.6117647f;
+    ycc[3 * x + 2] = 0.5372549f;
+  }
+  ASSERT_EQ(zeliYCCToRGB_32f_C3R(ycc, 60, rgb, 60, ImageSize{5, 1}), StatusOk);
+  for (float v : rgb) EXPECT_EQ(v, 1.0f);
+}
+
+}  // namespace
