@@ -210,8 +210,11 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
     } else if (word == "alphawritten") {
       d.writesAlpha = true;
     } else if (word.rfind("planestested=", 0) == 0) {
+      // Only the first N entries of a plane array are tested for null.
       d.testedPlanes = std::atoi(word.c_str() + 13);
     } else if (word == "elementsteps") {
+      // Steps become element counts (step >> 1, step >> 2): an uneven step
+      // walks rows at the step less its low bits.
       d.elementSteps = true;
     } else if (word.rfind("order=", 0) == 0) {
       std::string rest = word.substr(6);
@@ -235,6 +238,8 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
   for (const std::string& o : order) {
     if (o == "null") d.order.push_back({Check::NullTop});
     else if (o == "planes") d.order.push_back({Check::NullPlanes});
+    // The entries of one side's plane array, where the two sides are tested
+    // apart.
     else if (o == "srcplanes") d.order.push_back({Check::NullPlanes, -1, 0});
     else if (o == "dstplanes") d.order.push_back({Check::NullPlanes, -1, 1});
     else if (o == "size") d.order.push_back({Check::Size});

@@ -97,8 +97,8 @@ struct Descriptor {
   bool warnsOdd = false;        // may return StatusOddSizeWarning
   bool writesAlpha = false;     // an AC4 destination's fourth channel is written
   bool checksSteps = false;
-  int testedPlanes = 0;         // plane entries tested for null per array; 0: all
-  bool elementSteps = false;    // steps are used as step / sample size elements
+  int testedPlanes = 0;       // plane entries tested for null per array; 0: all
+  bool elementSteps = false;  // steps are used as step / sample size elements
   void (*impl)() = nullptr;
   Invoker invoke = nullptr;
   std::vector<ArgKind> prototype;  // kinds of the prototype's parameters

@@ -41,11 +41,14 @@ ZEL_AVX2 inline __m256i k16x(int v) { return _mm256_set1_epi16(static_cast<int16
 
 // Widening dot product of two 16-bit channels with two 16-bit constants:
 // a * ca + b * cb in 32-bit lanes, exact (pmaddwd).
+inline __m128i pairOf(int ca, int cb) {
+  return _mm_set1_epi32(int32_t(uint32_t(uint16_t(ca)) | (uint32_t(uint16_t(cb)) << 16)));
+}
 inline __m128i dotLo(__m128i a, __m128i b, int ca, int cb) {
-  return _mm_madd_epi16(_mm_unpacklo_epi16(a, b), _mm_set1_epi32(int32_t(uint32_t(uint16_t(ca)) | (uint32_t(uint16_t(cb)) << 16))));
+  return _mm_madd_epi16(_mm_unpacklo_epi16(a, b), pairOf(ca, cb));
 }
 inline __m128i dotHi(__m128i a, __m128i b, int ca, int cb) {
-  return _mm_madd_epi16(_mm_unpackhi_epi16(a, b), _mm_set1_epi32(int32_t(uint32_t(uint16_t(ca)) | (uint32_t(uint16_t(cb)) << 16))));
+  return _mm_madd_epi16(_mm_unpackhi_epi16(a, b), pairOf(ca, cb));
 }
 
 }  // namespace yuv_detail
@@ -241,10 +244,12 @@ inline Lanes3 rgbWide(const RgbWideSet& k, const RgbRounding& rnd, __m128i Y, __
   const __m128i u = _mm_sub_epi16(U, k16(128)), v = _mm_sub_epi16(V, k16(128));
   const __m128i zero = _mm_setzero_si128();
   auto whole = [](__m128i x, int32_t c) { return _mm_mullo_epi16(x, k16(wholePart(c))); };
-  const __m128i r = _mm_add_epi16(_mm_add_epi16(Y, whole(v, k.vToR)), wideHigh(v, zero, fractionPart(k.vToR), 0, rnd.r));
+  const __m128i r =
+      _mm_add_epi16(_mm_add_epi16(Y, whole(v, k.vToR)), wideHigh(v, zero, fractionPart(k.vToR), 0, rnd.r));
   const __m128i g = _mm_add_epi16(_mm_add_epi16(Y, _mm_add_epi16(whole(u, k.uToG), whole(v, k.vToG))),
                                   wideHigh(u, v, fractionPart(k.uToG), fractionPart(k.vToG), rnd.g));
-  const __m128i b = _mm_add_epi16(_mm_add_epi16(Y, whole(u, k.uToB)), wideHigh(u, zero, fractionPart(k.uToB), 0, rnd.b));
+  const __m128i b =
+      _mm_add_epi16(_mm_add_epi16(Y, whole(u, k.uToB)), wideHigh(u, zero, fractionPart(k.uToB), 0, rnd.b));
   return {r, g, b};
 }
 

@@ -260,7 +260,7 @@ struct WriteP3 {
 namespace rows_detail {
 
 template <typename Form, int Block, typename In, typename Out>
-inline int sseBody(const In& in, const Out& out, int from, int body) {
+inline int sseBody(const In in, const Out out, int from, int body) {
   int x = from;
   for (; x + 16 <= body; x += 16) {
     __m128i b0, b1, b2;
@@ -289,7 +289,7 @@ ZEL_AVX2 inline __m128i packBytes(__m256i lanes) {
 }
 
 template <typename Form, typename In, typename Out>
-ZEL_AVX2 int avx2Body(const In& in, const Out& out, int body) {
+ZEL_AVX2 int avx2Body(const In in, const Out out, int body) {
   int x = 0;
   for (; x + 16 <= body; x += 16) {
     __m128i b0, b1, b2;
@@ -309,8 +309,9 @@ inline Path bestPath() { return hasAvx2() ? Path::Avx2 : Path::Sse41; }
 // Pixels [0, body) by the vector form of Body, which gives its scalar bits;
 // [body, width) one by one by the scalar form of Tail. `body` is a multiple of
 // Block, 8 or 4 (readers and writers of four-byte pixels take blocks of 4).
+// Readers and writers travel by value: their pointers stay in registers.
 template <typename Body, typename Tail, int Block = 8, typename In, typename Out>
-inline void convertRow(const In& in, const Out& out, int body, int width, Path path) {
+inline void convertRow(const In in, const Out out, int body, int width, Path path) {
   static_assert(Block == 8 || Block == 4, "blocks of 8 or 4 pixels");
   int x = 0;
   if constexpr (Body::kAvx2)

@@ -138,7 +138,8 @@ void expectEightBitLanes(const char* name, Scalar scalar, Vec vec) {
         a[n] = int16_t(x), b[n] = int16_t(y), c[n] = int16_t(z);
         if (++n < 8) continue;
         n = 0;
-        const Lanes3 r = vec(_mm_load_si128(reinterpret_cast<__m128i*>(a)), _mm_load_si128(reinterpret_cast<__m128i*>(b)),
+        const Lanes3 r = vec(_mm_load_si128(reinterpret_cast<__m128i*>(a)),
+                             _mm_load_si128(reinterpret_cast<__m128i*>(b)),
                              _mm_load_si128(reinterpret_cast<__m128i*>(c)));
         _mm_store_si128(reinterpret_cast<__m128i*>(o[0]), r.c0);
         _mm_store_si128(reinterpret_cast<__m128i*>(o[1]), r.c1);
