@@ -9,6 +9,7 @@
 #include <benchmark/benchmark.h>
 
 #include <cstdio>
+#include <algorithm>
 #include <cstring>
 #include <map>
 #include <memory>
@@ -97,7 +98,14 @@ int main(int argc, char** argv) {
         if (s < 0) state.SkipWithError("the export returned an error");
       }
     })->Unit(benchmark::kMillisecond)->UseRealTime();
-    for (zel::bench::Peer& peer : zel::bench::peersOf(name)) {
+    std::vector<zel::bench::Peer> peers = zel::bench::peersOf(name);
+    // Every export is also set against a copy of the bytes it writes.
+    size_t outBytes = 0;
+    for (Workspace::Buffer& b : ws->buffers())
+      if (b.isDestination) outBytes += size_t(b.geometry.rowBytes) * b.geometry.rows;
+    if (std::none_of(peers.begin(), peers.end(), [](const zel::bench::Peer& p) { return p.label.rfind("memcpy", 0) == 0; }))
+      peers.push_back(zel::bench::memcpyPeer(outBytes));
+    for (zel::bench::Peer& peer : peers) {
       const std::string id = name + " | " + peer.label;
       row.peerLabels.push_back(peer.label);
       auto run = std::make_shared<std::function<void()>>(peer.run);

@@ -22,12 +22,6 @@ std::vector<uint8_t> frameBytes(size_t n) {
   return v;
 }
 
-// A copy of the destination's bytes: the floor any conversion pays.
-Peer memcpyPeer(size_t srcBytes, size_t dstBytes) {
-  auto src = std::make_shared<std::vector<uint8_t>>(frameBytes(std::max(srcBytes, dstBytes)));
-  auto dst = std::make_shared<std::vector<uint8_t>>(dstBytes);
-  return {"memcpy of the output bytes", [src, dst] { std::memcpy(dst->data(), src->data(), dst->size()); }};
-}
 
 #ifdef ZELCC_BENCH_OPENCV
 Peer cvtColorPeer(const char* label, int srcType, int dstType, int code) {
@@ -35,6 +29,32 @@ Peer cvtColorPeer(const char* label, int srcType, int dstType, int code) {
   cv::randu(*src, 0, 255);
   auto dst = std::make_shared<cv::Mat>(kHeight, kWidth, dstType);
   return {label, [src, dst, code] { cv::cvtColor(*src, *dst, code); }};
+}
+#endif
+
+#ifdef ZELCC_BENCH_LIBYUV
+// A frame's planes for libyuv: luma, two chroma planes (or one pair plane)
+// and a packed 4:2:2 stream, all of the frame size.
+struct YuvFrame {
+  std::vector<uint8_t> y = frameBytes(size_t(kWidth) * kHeight);
+  std::vector<uint8_t> u = frameBytes(size_t(kWidth / 2) * kHeight);
+  std::vector<uint8_t> v = frameBytes(size_t(kWidth / 2) * kHeight);
+  std::vector<uint8_t> uv = frameBytes(size_t(kWidth) * kHeight);
+  std::vector<uint8_t> packed = frameBytes(size_t(kWidth) * 2 * kHeight);
+  std::vector<uint8_t> y2 = std::vector<uint8_t>(size_t(kWidth) * kHeight);
+  std::vector<uint8_t> u2 = std::vector<uint8_t>(size_t(kWidth / 2) * kHeight);
+  std::vector<uint8_t> v2 = std::vector<uint8_t>(size_t(kWidth / 2) * kHeight);
+  std::vector<uint8_t> uv2 = std::vector<uint8_t>(size_t(kWidth) * kHeight);
+  std::vector<uint8_t> packed2 = std::vector<uint8_t>(size_t(kWidth) * 2 * kHeight);
+  std::vector<uint8_t> u444 = frameBytes(size_t(kWidth) * kHeight);
+  std::vector<uint8_t> v444 = frameBytes(size_t(kWidth) * kHeight);
+  std::vector<uint8_t> argb = frameBytes(size_t(kWidth) * 4 * kHeight);
+};
+
+template <typename Call>
+std::vector<Peer> yuvPeer(const char* label, Call call) {
+  auto f = std::make_shared<YuvFrame>();
+  return {Peer{label, [f, call] { call(*f); }}};
 }
 #endif
 
@@ -48,7 +68,6 @@ const std::map<std::string, PeerFactory>& table() {
 #ifdef ZELCC_BENCH_OPENCV
          p.push_back(cvtColorPeer("OpenCV cvtColor GRAY2RGB", CV_8UC1, CV_8UC3, cv::COLOR_GRAY2RGB));
 #endif
-         p.push_back(memcpyPeer(size_t(kWidth) * kHeight, size_t(kWidth) * kHeight * 3));
          return p;
        }},
       {"zeliGrayToRGB_8u_C1C4R",
@@ -82,11 +101,133 @@ const std::map<std::string, PeerFactory>& table() {
 #endif
          return p;
        }},
+#ifdef ZELCC_BENCH_OPENCV
+      {"zeliRGBToYCbCr_8u_C3R",
+       [] { return std::vector<Peer>{cvtColorPeer("OpenCV cvtColor RGB2YCrCb", CV_8UC3, CV_8UC3, cv::COLOR_RGB2YCrCb)}; }},
+      {"zeliRGBToYCbCr_8u_AC4R",
+       [] { return std::vector<Peer>{cvtColorPeer("OpenCV cvtColor RGBA2YCrCb", CV_8UC4, CV_8UC3, cv::COLOR_RGB2YCrCb)}; }},
+      {"zeliYCbCrToRGB_8u_C3R",
+       [] { return std::vector<Peer>{cvtColorPeer("OpenCV cvtColor YCrCb2RGB", CV_8UC3, CV_8UC3, cv::COLOR_YCrCb2RGB)}; }},
+      {"zeliYCbCrToRGB_8u_AC4R",
+       [] { return std::vector<Peer>{cvtColorPeer("OpenCV cvtColor YCrCb2RGB", CV_8UC3, CV_8UC3, cv::COLOR_YCrCb2RGB)}; }},
+#endif
+#ifdef ZELCC_BENCH_LIBYUV
+      {"zeliRGBToYCbCr_8u_AC4P3R",
+       [] {
+         return yuvPeer("libyuv ARGBToI444", [](YuvFrame& f) {
+           libyuv::ARGBToI444(f.argb.data(), kWidth * 4, f.y2.data(), kWidth, f.u444.data(), kWidth, f.v444.data(),
+                              kWidth, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCrToBGR_8u_P3C4R",
+       [] {
+         return yuvPeer("libyuv I444ToARGB", [](YuvFrame& f) {
+           libyuv::I444ToARGB(f.y.data(), kWidth, f.u444.data(), kWidth, f.v444.data(), kWidth, f.argb.data(),
+                              kWidth * 4, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCrToBGR_709CSC_8u_P3C4R",
+       [] {
+         return yuvPeer("libyuv H444ToARGB", [](YuvFrame& f) {
+           libyuv::H444ToARGB(f.y.data(), kWidth, f.u444.data(), kWidth, f.v444.data(), kWidth, f.argb.data(),
+                              kWidth * 4, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCrToBGR_8u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I444ToRGB24", [](YuvFrame& f) {
+           libyuv::I444ToRGB24(f.y.data(), kWidth, f.u444.data(), kWidth, f.v444.data(), kWidth, f.argb.data(),
+                               kWidth * 3, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCrToRGB_8u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I444ToRAW", [](YuvFrame& f) {
+           libyuv::I444ToRAW(f.y.data(), kWidth, f.u444.data(), kWidth, f.v444.data(), kWidth, f.argb.data(),
+                             kWidth * 3, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr422ToYCbCr420_8u_C2P3R",
+       [] {
+         return yuvPeer("libyuv YUY2ToI420", [](YuvFrame& f) {
+           libyuv::YUY2ToI420(f.packed.data(), kWidth * 2, f.y2.data(), kWidth, f.u2.data(), kWidth / 2, f.v2.data(),
+                              kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliCbYCr422ToYCbCr420_8u_C2P3R",
+       [] {
+         return yuvPeer("libyuv UYVYToI420", [](YuvFrame& f) {
+           libyuv::UYVYToI420(f.packed.data(), kWidth * 2, f.y2.data(), kWidth, f.u2.data(), kWidth / 2, f.v2.data(),
+                              kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr422_8u_C2P3R",
+       [] {
+         return yuvPeer("libyuv YUY2ToI422", [](YuvFrame& f) {
+           libyuv::YUY2ToI422(f.packed.data(), kWidth * 2, f.y2.data(), kWidth, f.u2.data(), kWidth / 2, f.v2.data(),
+                              kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr422_8u_P3C2R",
+       [] {
+         return yuvPeer("libyuv I422ToYUY2", [](YuvFrame& f) {
+           libyuv::I422ToYUY2(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.packed2.data(),
+                              kWidth * 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCrCb420ToYCbCr422_8u_P3C2R",
+       [] {
+         return yuvPeer("libyuv I420ToYUY2", [](YuvFrame& f) {
+           libyuv::I420ToYUY2(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.packed2.data(),
+                              kWidth * 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCrCb420ToCbYCr422_8u_P3C2R",
+       [] {
+         return yuvPeer("libyuv I420ToUYVY", [](YuvFrame& f) {
+           libyuv::I420ToUYVY(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.packed2.data(),
+                              kWidth * 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420ToYCbCr422_8u_P3R",
+       [] {
+         return yuvPeer("libyuv I420ToI422", [](YuvFrame& f) {
+           libyuv::I420ToI422(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.y2.data(), kWidth,
+                              f.u2.data(), kWidth / 2, f.v2.data(), kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420_8u_P2P3R",
+       [] {
+         return yuvPeer("libyuv NV12ToI420", [](YuvFrame& f) {
+           libyuv::NV12ToI420(f.y.data(), kWidth, f.uv.data(), kWidth, f.y2.data(), kWidth, f.u2.data(), kWidth / 2,
+                              f.v2.data(), kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420_8u_P3P2R",
+       [] {
+         return yuvPeer("libyuv I420ToNV12", [](YuvFrame& f) {
+           libyuv::I420ToNV12(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.y2.data(), kWidth,
+                              f.uv2.data(), kWidth, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr422ToGray_8u_C2C1R",
+       [] {
+         return yuvPeer("libyuv YUY2ToY", [](YuvFrame& f) {
+           libyuv::YUY2ToY(f.packed.data(), kWidth * 2, f.y2.data(), kWidth, kWidth, kHeight);
+         });
+       }},
+#endif
   };
   return t;
 }
 
 }  // namespace
+
+Peer memcpyPeer(size_t bytes) {
+  auto src = std::make_shared<std::vector<uint8_t>>(frameBytes(bytes));
+  auto dst = std::make_shared<std::vector<uint8_t>>(bytes);
+  return {"memcpy of the output bytes", [src, dst] { std::memcpy(dst->data(), src->data(), dst->size()); }};
+}
 
 std::vector<Peer> peersOf(const std::string& exportName) {
   auto it = table().find(exportName);

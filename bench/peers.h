@@ -18,6 +18,8 @@ struct Peer {
 
 // The peers of one export (none when no other library does the same).
 std::vector<Peer> peersOf(const std::string& exportName);
+// A copy of `bytes` bytes: the floor any conversion writing them pays.
+Peer memcpyPeer(size_t bytes);
 // Exports that have at least one peer.
 std::vector<std::string> exportsWithPeers();
 

@@ -203,6 +203,17 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
         error = "bad min= in extras of " + d.name;
         return false;
       }
+    } else if (word.rfind("mult=", 0) == 0) {
+      if (std::sscanf(word.c_str() + 5, "%dx%d", &d.multWidth, &d.multHeight) != 2 || d.multWidth < 1 ||
+          d.multHeight < 1) {
+        error = "bad mult= in extras of " + d.name;
+        return false;
+      }
+    } else if (word.rfind("room=", 0) == 0) {
+      if (std::sscanf(word.c_str() + 5, "%dx%d", &d.roomWidth, &d.roomHeight) != 2) {
+        error = "bad room= in extras of " + d.name;
+        return false;
+      }
     } else if (word == "warn") {
       d.warnsOdd = true;
     } else if (word == "steps") {
@@ -243,6 +254,7 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
     else if (o == "srcplanes") d.order.push_back({Check::NullPlanes, -1, 0});
     else if (o == "dstplanes") d.order.push_back({Check::NullPlanes, -1, 1});
     else if (o == "size") d.order.push_back({Check::Size});
+    else if (o == "positive") d.order.push_back({Check::SizePositive});
     else if (o == "step") d.order.push_back({Check::Step});
     else {
       auto it = std::find_if(d.extras.begin(), d.extras.end(), [&](const Extra& e) { return e.name == o; });
@@ -424,7 +436,7 @@ const Descriptor* findDescriptor(const std::string& name) {
 
 Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offset)
     : d_(d), size_(size), pad_(padBytes) {
-  const int w = std::max(size.width, 0), h = std::max(size.height, 0);
+  const int w = std::max(std::max(size.width, 0), d.roomWidth), h = std::max(std::max(size.height, 0), d.roomHeight);
   auto addSide = [&](const Side& side, int sideIndex) {
     for (int p = 0; p < side.planes(); ++p) {
       Buffer b;

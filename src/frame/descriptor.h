@@ -4,6 +4,7 @@
 // through these descriptors; nothing here is part of the library itself.
 #pragma once
 
+#include <algorithm>
 #include <cstdint>
 #include <string>
 #include <vector>
@@ -57,7 +58,9 @@ struct Extra {
 };
 
 // Steps of the argument checks, in the order a member runs them.
-enum class Check { NullTop, NullPlanes, Size, Step, Extra };
+// SizePositive: a test of width and height >= 1 standing before a later
+// test of the minima (Size then covers only what lies between).
+enum class Check { NullTop, NullPlanes, SizePositive, Size, Step, Extra };
 struct CheckStage {
   Check check;
   int extra = -1;  // for Check::Extra
@@ -93,7 +96,9 @@ struct Descriptor {
   std::vector<Extra> extras;
   std::vector<CheckStage> order;
   std::vector<ArgSlot> slots;
-  int minWidth = 1, minHeight = 1;
+  int minWidth = 1, minHeight = 1;  // a minimum of 0: that dimension is not checked
+  int multWidth = 1, multHeight = 1;  // required multiples
+  int roomWidth = 0, roomHeight = 0;  // buffers cover at least this size: members that write past a tiny region
   bool warnsOdd = false;        // may return StatusOddSizeWarning
   bool writesAlpha = false;     // an AC4 destination's fourth channel is written
   bool checksSteps = false;
@@ -103,6 +108,12 @@ struct Descriptor {
   Invoker invoke = nullptr;
   std::vector<ArgKind> prototype;  // kinds of the prototype's parameters
   bool isImageFunction() const { return invoke != nullptr; }
+  // The smallest valid size at least w x h.
+  ImageSize validSize(int w, int h) const {
+    w = std::max(w, std::max(minWidth, 1));
+    h = std::max(h, std::max(minHeight, 1));
+    return ImageSize{(w + multWidth - 1) / multWidth * multWidth, (h + multHeight - 1) / multHeight * multHeight};
+  }
   const Extra* extra(const std::string& name) const {
     for (const Extra& e : extras)
       if (e.name == name) return &e;

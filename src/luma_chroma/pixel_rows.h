@@ -1,0 +1,248 @@
+// Rows of three-channel 8-bit pixels in the full-resolution layouts, and
+// the row converter that runs a body form and a tail form over them.
+//
+// A source view gives three channels in memory order, a destination view
+// takes three channels in the order of its format (Reverse writes them
+// backwards, for BGR). Interleaved rows are split into channels and merged
+// again with byte shuffles, so the vector arithmetic is that of planes.
+// Vector blocks read and write exactly the bytes of their pixels.
+#pragma once
+
+#include <cstdint>
+#include <cstring>
+
+#include "luma_chroma/vector_units.h"
+
+namespace zel::lc {
+
+// ---- shuffle patterns for interleaved rows ----
+
+// gather[c][k]: channel c of the 16 pixels from the k-th 16 bytes of a
+// block of pixels `Stride` bytes apart.
+template <int Stride>
+struct GatherPatterns {
+  Shuffle16 gather[3][Stride];
+};
+template <int Stride>
+constexpr GatherPatterns<Stride> makeGather() {
+  GatherPatterns<Stride> p{};
+  for (int c = 0; c < 3; ++c)
+    for (int k = 0; k < Stride; ++k)
+      for (int i = 0; i < 16; ++i) {
+        const int at = Stride * i + c - 16 * k;
+        p.gather[c][k].b[i] = static_cast<int8_t>(at >= 0 && at < 16 ? at : -1);
+      }
+  return p;
+}
+
+// scatter[k][c]: the bytes of channel c that land in the k-th 16 bytes of
+// 16 three-byte pixels.
+struct ScatterPatterns {
+  Shuffle16 scatter[3][3];
+};
+constexpr ScatterPatterns makeScatter() {
+  ScatterPatterns p{};
+  for (int k = 0; k < 3; ++k)
+    for (int c = 0; c < 3; ++c)
+      for (int j = 0; j < 16; ++j) {
+        const int at = 16 * k + j;
+        p.scatter[k][c].b[j] = static_cast<int8_t>(at % 3 == c ? at / 3 : -1);
+      }
+  return p;
+}
+
+template <int Stride>
+inline constexpr GatherPatterns<Stride> kGather = makeGather<Stride>();
+inline constexpr ScatterPatterns kScatter3 = makeScatter();
+
+// ---- sources ----
+
+// Interleaved pixels of Stride bytes (C3: 3, AC4: 4; a fourth byte is
+// never read by the arithmetic).
+template <int Stride>
+struct PackedIn {
+  const uint8_t* p;
+  void pixel(int x, int& a, int& b, int& c) const {
+    const uint8_t* q = p + Stride * x;
+    a = q[0];
+    b = q[1];
+    c = q[2];
+  }
+  template <class U>
+  Trio<U> block(int x) const {
+    const GatherPatterns<Stride>& g = kGather<Stride>;
+    const uint8_t* q = p + Stride * x;
+    typename U::V chunk[Stride];
+    for (int k = 0; k < Stride; ++k) chunk[k] = U::loadUnits(q + 16 * k, 16 * Stride);
+    typename U::V out[3];
+    for (int c = 0; c < 3; ++c) {
+      out[c] = U::shuffle8(chunk[0], U::shuffleOf(g.gather[c][0]));
+      for (int k = 1; k < Stride; ++k) out[c] = U::or_(out[c], U::shuffle8(chunk[k], U::shuffleOf(g.gather[c][k])));
+    }
+    return {out[0], out[1], out[2]};
+  }
+};
+
+// Three planes at full resolution.
+struct PlanesIn {
+  const uint8_t* p0;
+  const uint8_t* p1;
+  const uint8_t* p2;
+  void pixel(int x, int& a, int& b, int& c) const {
+    a = p0[x];
+    b = p1[x];
+    c = p2[x];
+  }
+  template <class U>
+  Trio<U> block(int x) const {
+    return {U::loadUnits(p0 + x, 16), U::loadUnits(p1 + x, 16), U::loadUnits(p2 + x, 16)};
+  }
+};
+
+// ---- destinations ----
+
+// Interleaved three-byte pixels; Reverse stores the channels backwards.
+template <bool Reverse>
+struct PackedOut3 {
+  uint8_t* p;
+  void pixel(int x, int a, int b, int c) const {
+    uint8_t* q = p + 3 * x;
+    q[Reverse ? 2 : 0] = static_cast<uint8_t>(a);
+    q[1] = static_cast<uint8_t>(b);
+    q[Reverse ? 0 : 2] = static_cast<uint8_t>(c);
+  }
+  template <class U>
+  void block(int x, const Trio<U>& v) const {
+    const typename U::V ch[3] = {Reverse ? v.c2 : v.c0, v.c1, Reverse ? v.c0 : v.c2};
+    uint8_t* q = p + 3 * x;
+    for (int k = 0; k < 3; ++k) {
+      typename U::V o = U::shuffle8(ch[0], U::shuffleOf(kScatter3.scatter[k][0]));
+      o = U::or_(o, U::shuffle8(ch[1], U::shuffleOf(kScatter3.scatter[k][1])));
+      o = U::or_(o, U::shuffle8(ch[2], U::shuffleOf(kScatter3.scatter[k][2])));
+      U::storeUnits(q + 16 * k, 48, o);
+    }
+  }
+};
+
+// Four-byte pixels whose fourth byte is the caller's alpha (C4).
+template <bool Reverse>
+struct PackedOutAlpha {
+  uint8_t* p;
+  uint8_t alpha;
+  void pixel(int x, int a, int b, int c) const {
+    uint8_t* q = p + 4 * x;
+    q[Reverse ? 2 : 0] = static_cast<uint8_t>(a);
+    q[1] = static_cast<uint8_t>(b);
+    q[Reverse ? 0 : 2] = static_cast<uint8_t>(c);
+    q[3] = alpha;
+  }
+  template <class U>
+  void block(int x, const Trio<U>& v) const {
+    const typename U::V first = Reverse ? v.c2 : v.c0, third = Reverse ? v.c0 : v.c2;
+    const typename U::V a = U::set8(alpha);
+    const typename U::V lo01 = U::unpackLo8(first, v.c1), hi01 = U::unpackHi8(first, v.c1);
+    const typename U::V lo23 = U::unpackLo8(third, a), hi23 = U::unpackHi8(third, a);
+    uint8_t* q = p + 4 * x;
+    U::storeUnits(q, 64, U::unpackLo16(lo01, lo23));
+    U::storeUnits(q + 16, 64, U::unpackHi16(lo01, lo23));
+    U::storeUnits(q + 32, 64, U::unpackLo16(hi01, hi23));
+    U::storeUnits(q + 48, 64, U::unpackHi16(hi01, hi23));
+  }
+};
+
+// Four-byte pixels whose fourth byte is left as it is (AC4). Written one
+// pixel at a time: a vector store would rewrite the fourth byte.
+struct PackedOutKeep {
+  uint8_t* p;
+  void pixel(int x, int a, int b, int c) const {
+    uint8_t* q = p + 4 * x;
+    q[0] = static_cast<uint8_t>(a);
+    q[1] = static_cast<uint8_t>(b);
+    q[2] = static_cast<uint8_t>(c);
+  }
+};
+
+struct PlanesOut {
+  uint8_t* p0;
+  uint8_t* p1;
+  uint8_t* p2;
+  void pixel(int x, int a, int b, int c) const {
+    p0[x] = static_cast<uint8_t>(a);
+    p1[x] = static_cast<uint8_t>(b);
+    p2[x] = static_cast<uint8_t>(c);
+  }
+  template <class U>
+  void block(int x, const Trio<U>& v) const {
+    U::storeUnits(p0 + x, 16, v.c0);
+    U::storeUnits(p1 + x, 16, v.c1);
+    U::storeUnits(p2 + x, 16, v.c2);
+  }
+};
+
+// ---- the row converter ----
+
+// A form maps three samples to three samples: `pixel` (Samples3 to
+// Samples3) in scalar code and, when kVector, `lanes<U>` (Trio of 16-bit
+// lanes to Trio of 16-bit lanes before SaturateU8).
+
+template <class U, class In, class Out, class Form>
+inline int formBlocks(const In& in, const Out& out, int x, int end, const Form& form) {
+  for (; x + U::kPixels <= end; x += U::kPixels) {
+    const Trio<U> s = in.template block<U>(x);
+    const Wide16<U> a = widen<U>(s.c0), b = widen<U>(s.c1), c = widen<U>(s.c2);
+    const Trio<U> lo = form.template lanes<U>(Trio<U>{a.lo, b.lo, c.lo});
+    const Trio<U> hi = form.template lanes<U>(Trio<U>{a.hi, b.hi, c.hi});
+    out.template block<U>(x, Trio<U>{U::packU8(lo.c0, hi.c0), U::packU8(lo.c1, hi.c1), U::packU8(lo.c2, hi.c2)});
+  }
+  return x;
+}
+
+template <class In, class Out, class Form>
+ZEL_AVX2 __attribute__((flatten)) int formBlocksAvx(const In& in, const Out& out, int end, const Form& form) {
+  return formBlocks<Avx>(in, out, 0, end, form);
+}
+
+template <class In, class Out, class Form>
+inline void formPixels(const In& in, const Out& out, int x, int end, const Form& form) {
+  for (; x < end; ++x) {
+    int a, b, c;
+    in.pixel(x, a, b, c);
+    const Samples3 r = form.pixel(Samples3{a, b, c});
+    out.pixel(x, r.c0, r.c1, r.c2);
+  }
+}
+
+// Pixels [0, bodyEnd) take the body form, [bodyEnd, width) the tail form.
+// Whole vector blocks of the body run in AVX2 (when `avx2`) and SSE4.1;
+// the body's last pixels take the same form one at a time.
+template <class In, class Out, class Body, class Tail>
+inline void convertRow(const In& in, const Out& out, int width, int bodyEnd, const Body& body, const Tail& tail,
+                       bool avx2) {
+  int x = 0;
+  if constexpr (Body::kVector) {
+    if (avx2) x = formBlocksAvx(in, out, bodyEnd, body);
+    x = formBlocks<Sse>(in, out, x, bodyEnd, body);
+  }
+  formPixels(in, out, x, bodyEnd, body);
+  formPixels(in, out, bodyEnd, width, tail);
+}
+
+// Four-byte pixels in and out with the destination's fourth byte kept: a
+// wide form four pixels at a time in 32-bit lanes, every pixel stored as
+// its three bytes.
+template <class Form>
+inline void keepAlphaRow(const uint8_t* src, uint8_t* dst, int width, const Form& form) {
+  int x = 0;
+  for (; x + 4 <= width; x += 4) {
+    alignas(16) uint32_t px[4];
+    _mm_store_si128(reinterpret_cast<__m128i*>(px), form.pixels4(load128(src + 4 * x)));
+    for (int i = 0; i < 4; ++i) {
+      uint8_t* q = dst + 4 * (x + i);
+      std::memcpy(q, &px[i], 2);
+      q[2] = static_cast<uint8_t>(px[i] >> 16);
+    }
+  }
+  formPixels(PackedIn<4>{src}, PackedOutKeep{dst}, x, width, form);
+}
+
+}  // namespace zel::lc

@@ -1,0 +1,526 @@
+// Repacking of 8-bit YCbCr between 4:2:2, 4:2:0 and 4:1:1, pair streams,
+// two planes and three planes, and the YCbCr, YCrCb and CbYCr orders. One
+// driver reads each layout into planar rows, applies the chroma rule of the
+// two schemes, and writes the target layout; luma is always copied.
+#include <algorithm>
+#include <cstring>
+
+#include "frame/export.h"
+#include "frame/image_layout.h"
+#include "frame/row_driver.h"
+#include "frame/scalar_ops.h"
+#include "frame/simd.h"
+#include "luma_chroma/repack_rows.h"
+
+namespace zel::repack {
+
+namespace {
+
+enum class Scheme : uint8_t { S422, S420, S411 };
+enum class Kind : uint8_t { Pairs, TwoPlanes, Planes };
+
+struct Layout {
+  Kind kind;
+  PairOrder order;   // for Pairs
+  bool crFirst;      // for Planes: planes Y, Cr, Cb
+  Scheme scheme;
+};
+
+// How much of the region a member works on, and what size it rejects.
+enum class SizeRule : uint8_t {
+  Even2x2,       // width, height >= 2; width & ~1, height & ~1
+  Quad4x2,       // width >= 4, height >= 2; width & ~3, height & ~1
+  Quad4,         // width >= 4; width & ~3; height below 1 does no rows
+  Quad4x1,       // width >= 4, height >= 1; width & ~3
+  Even2x1,       // width >= 2, height >= 1; width & ~1
+  Even2,         // width >= 2; width & ~1; height below 1 does no rows
+};
+
+struct Member {
+  Layout src, dst;
+  SizeRule rule;
+  bool nonTemporalRoute;  // large aligned targets bypass the cache
+  bool streamedLuma;      // luma rows through the streaming row copy
+};
+
+// Image pointers and steps of one side: a pair stream uses [0]; two planes
+// [0] luma, [1] chroma pairs; three planes [0] Y, [1] Cb, [2] Cr (already
+// swapped for YCrCb names).
+struct Side {
+  uint8_t* p[3];
+  int step[3];
+  int count;
+};
+
+int chromaWidth(Scheme s, int width) { return s == Scheme::S411 ? width / 4 : width / 2; }
+
+// Columns of a chunk: a multiple of 4 pixels so every scheme splits evenly.
+constexpr int kChunk = 2048;
+
+struct Rows {
+  // Planar rows of one group: up to two luma rows and two chroma rows.
+  const uint8_t* y[2];
+  const uint8_t* cb[2];
+  const uint8_t* cr[2];
+};
+
+struct Staging {
+  alignas(16) uint8_t y[2][kChunk];
+  alignas(16) uint8_t cb[2][kChunk / 2];
+  alignas(16) uint8_t cr[2][kChunk / 2];
+};
+
+uint8_t* at(const Side& s, int plane, int row, int offset) { return rowAt(s.p[plane], s.step[plane], row) + offset; }
+
+// Reads luma row `lumaRow` (slot `ly`) and, when `chromaRow` >= 0, chroma
+// row `chromaRow` (slot `cy`) of the columns [x, x + n) into planar rows.
+void readRows(const Layout& l, const Side& s, int lumaRow, int chromaRow, int ly, int cy, int x, int n, Staging& st,
+              Rows& r) {
+  const int cx = l.scheme == Scheme::S411 ? x / 4 : x / 2;
+  const int cn = chromaWidth(l.scheme, n);
+  switch (l.kind) {
+    case Kind::Pairs: {
+      // Luma and chroma share the row of a pair stream.
+      const uint8_t* in = at(s, 0, lumaRow, 2 * x);
+      if (chromaRow >= 0) {
+        splitPairs(in, l.order, st.y[ly], st.cb[cy], st.cr[cy], n);
+        r.cb[cy] = st.cb[cy];
+        r.cr[cy] = st.cr[cy];
+      } else {
+        lumaOfPairs(in, l.order, st.y[ly], n);
+      }
+      r.y[ly] = st.y[ly];
+      return;
+    }
+    case Kind::TwoPlanes:
+      r.y[ly] = at(s, 0, lumaRow, x);
+      if (chromaRow >= 0) {
+        unzip(at(s, 1, chromaRow, 2 * cx), st.cb[cy], st.cr[cy], cn);
+        r.cb[cy] = st.cb[cy];
+        r.cr[cy] = st.cr[cy];
+      }
+      return;
+    case Kind::Planes:
+      r.y[ly] = at(s, 0, lumaRow, x);
+      if (chromaRow >= 0) {
+        r.cb[cy] = at(s, 1, chromaRow, cx);
+        r.cr[cy] = at(s, 2, chromaRow, cx);
+      }
+      return;
+  }
+}
+
+// Where the chroma of destination row slot `cy` goes: straight into the
+// planes, or into staging for a pair stream or two planes.
+void chromaTargets(const Layout& l, const Side& s, int chromaRow, int cy, int x, Staging& st, uint8_t*& cb,
+                   uint8_t*& cr) {
+  if (l.kind == Kind::Planes) {
+    const int cx = l.scheme == Scheme::S411 ? x / 4 : x / 2;
+    cb = at(s, 1, chromaRow, cx);
+    cr = at(s, 2, chromaRow, cx);
+  } else {
+    cb = st.cb[cy];
+    cr = st.cr[cy];
+  }
+}
+
+void writeRow(const Layout& l, const Side& s, int lumaRow, int chromaRow, const uint8_t* y, const uint8_t* cb,
+              const uint8_t* cr, int x, int n, bool nonTemporal, bool streamLuma) {
+  const int cx = l.scheme == Scheme::S411 ? x / 4 : x / 2;
+  const int cn = chromaWidth(l.scheme, n);
+  switch (l.kind) {
+    case Kind::Pairs:
+      mergePairs(y, cb, cr, l.order, at(s, 0, lumaRow, 2 * x), n, nonTemporal);
+      return;
+    case Kind::TwoPlanes:
+      copyBytes(y, at(s, 0, lumaRow, x), n, nonTemporal || streamLuma);
+      if (chromaRow >= 0) zip(cb, cr, at(s, 1, chromaRow, 2 * cx), cn, nonTemporal);
+      return;
+    case Kind::Planes:
+      copyBytes(y, at(s, 0, lumaRow, x), n, nonTemporal || streamLuma);
+      return;  // chroma was written in place
+  }
+}
+
+// One chroma plane's rule between two schemes, for a group of rows: the
+// source has one chroma row for 4:2:0 in a pair group, else one per luma row.
+void convertChroma(Scheme from, Scheme to, const uint8_t* const* in, uint8_t* const* out, int dstCount, int n,
+                   bool nonTemporal) {
+  const int cn = chromaWidth(to, n);
+  if (from == to) {
+    for (int r = 0; r < dstCount; ++r) copyBytes(in[r], out[r], cn, nonTemporal);
+  } else if (from == Scheme::S422 && to == Scheme::S420) {
+    copyBytes(in[0], out[0], cn, nonTemporal);  // even rows kept, odd dropped
+  } else if (from == Scheme::S420 && to == Scheme::S422) {
+    copyBytes(in[0], out[0], cn, nonTemporal);  // each row written twice
+    copyBytes(in[0], out[1], cn, nonTemporal);
+  } else if (from == Scheme::S422 && to == Scheme::S411) {
+    for (int r = 0; r < dstCount; ++r) keepEven(in[r], out[r], cn);
+  } else if (from == Scheme::S411 && to == Scheme::S422) {
+    for (int r = 0; r < dstCount; ++r) doubleSamples(in[r], out[r], cn / 2, nonTemporal);
+  } else if (from == Scheme::S411 && to == Scheme::S420) {
+    zip(in[0], in[1], out[0], cn / 2, nonTemporal);  // two rows interleave into one
+  } else {                                           // 4:2:0 to 4:1:1, the inverse
+    unzip(in[0], out[0], out[1], cn);
+  }
+}
+
+Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
+  int width = size.width, height = size.height;
+  switch (m.rule) {
+    case SizeRule::Even2x2:
+      if (width < 2 || height < 2) return StatusSizeError;
+      width &= ~1;
+      height &= ~1;
+      break;
+    case SizeRule::Quad4x2:
+      if (width < 4 || height < 2) return StatusSizeError;
+      width &= ~3;
+      height &= ~1;
+      break;
+    case SizeRule::Quad4:
+      if (width < 4) return StatusSizeError;
+      width &= ~3;
+      break;
+    case SizeRule::Quad4x1:
+      if (width < 4 || height < 1) return StatusSizeError;
+      width &= ~3;
+      break;
+    case SizeRule::Even2x1:
+      if (width < 2 || height < 1) return StatusSizeError;
+      width &= ~1;
+      break;
+    case SizeRule::Even2:
+      if (width < 2) return StatusSizeError;
+      width &= ~1;
+      break;
+  }
+  if (height < 1) return StatusOk;
+
+  // Non-temporal stores when the rows touched are large and the target
+  // is aligned; the bytes are the same either way.
+  bool nonTemporal = false;
+  if (m.nonTemporalRoute) {
+    int64_t steps = 0;
+    bool aligned = true;
+    for (int i = 0; i < src.count; ++i) steps += src.step[i];
+    for (int i = 0; i < dst.count; ++i) {
+      steps += dst.step[i];
+      aligned = aligned && isAligned16(dst.p[i]) && isAligned16(dst.step[i]);
+    }
+    nonTemporal = aligned && steps * height >= 524289;
+  }
+  const bool streamLuma = m.streamedLuma && int64_t(width) * height >= 348603;
+
+  const bool pairs = m.src.scheme == Scheme::S420 || m.dst.scheme == Scheme::S420;
+  const int groupRows = pairs ? 2 : 1;
+  const int srcChromaRows = (m.src.scheme == Scheme::S420) ? 1 : groupRows;
+  const int dstChromaRows = (m.dst.scheme == Scheme::S420) ? 1 : groupRows;
+  // Rules that move whole chroma rows and leave the samples of a row alone.
+  const bool moveOnly = m.src.scheme == m.dst.scheme ||
+                        (m.src.scheme == Scheme::S422 && m.dst.scheme == Scheme::S420) ||
+                        (m.src.scheme == Scheme::S420 && m.dst.scheme == Scheme::S422);
+
+  Staging st;
+  for (int g = 0; g + groupRows <= height; g += groupRows) {
+    for (int x = 0; x < width; x += kChunk) {
+      const int n = std::min(kChunk, width - x);
+      Rows r{};
+      for (int k = 0; k < groupRows; ++k) {
+        const int chromaRow = k < srcChromaRows ? (srcChromaRows == 1 ? g / groupRows : g + k) : -1;
+        readRows(m.src, src, g + k, chromaRow, k, k, x, n, st, r);
+      }
+      // Chroma rule, written straight into destination planes or staged
+      // for a pair stream or two planes.
+      Staging out;
+      const uint8_t* cb[2];
+      const uint8_t* cr[2];
+      if (m.dst.kind != Kind::Planes && moveOnly) {
+        // Rows are only kept, dropped or repeated: the writer reads the
+        // source chroma rows themselves.
+        for (int k = 0; k < dstChromaRows; ++k) {
+          const int from = m.src.scheme == m.dst.scheme ? k : 0;
+          cb[k] = r.cb[from];
+          cr[k] = r.cr[from];
+        }
+      } else {
+        uint8_t* tcb[2];
+        uint8_t* tcr[2];
+        for (int k = 0; k < dstChromaRows; ++k) {
+          const int chromaRow = dstChromaRows == 1 ? g / groupRows : g + k;
+          chromaTargets(m.dst, dst, chromaRow, k, x, out, tcb[k], tcr[k]);
+          cb[k] = tcb[k];
+          cr[k] = tcr[k];
+        }
+        // Staging stays in the cache: only stores into the planes stream.
+        const bool streamChroma = nonTemporal && m.dst.kind == Kind::Planes;
+        convertChroma(m.src.scheme, m.dst.scheme, r.cb, tcb, dstChromaRows, n, streamChroma);
+        convertChroma(m.src.scheme, m.dst.scheme, r.cr, tcr, dstChromaRows, n, streamChroma);
+      }
+      for (int k = 0; k < groupRows; ++k) {
+        const int chromaSlot = dstChromaRows == 1 ? 0 : k;
+        const int chromaRow = k < dstChromaRows ? (dstChromaRows == 1 ? g / groupRows : g + k) : -1;
+        writeRow(m.dst, dst, g + k, chromaRow, r.y[k], cb[chromaSlot], cr[chromaSlot], x, n, nonTemporal,
+                 streamLuma);
+      }
+    }
+  }
+  if (nonTemporal || streamLuma) _mm_sfence();
+  return StatusOk;
+}
+
+// ---- filtered members ----
+
+// 4:1:1 to 4:2:0 from the even source rows, the new odd columns the
+// average of their neighbours: rounded in blocks of 64 and 16 while more
+// than that many samples remain, truncated for single samples.
+void filter411To420Row(const uint8_t* c, uint8_t* o, int n) {
+  int k = 0;
+  auto block = [&](int size) {
+    for (int j = 0; j < size; j += 16) {
+      const __m128i a = load128(c + k + j), b = load128(c + k + j + 1);
+      const __m128i m = _mm_avg_epu8(a, b);
+      store128(o + 2 * (k + j), _mm_unpacklo_epi8(a, m));
+      store128(o + 2 * (k + j) + 16, _mm_unpackhi_epi8(a, m));
+    }
+    k += size;
+  };
+  while (n - k > 64) block(64);
+  while (n - k > 16) block(16);
+  for (; k < n; ++k) {
+    o[2 * k] = c[k];
+    o[2 * k + 1] = k + 1 < n ? uint8_t(TruncatedMean(c[k], c[k + 1])) : c[k];
+  }
+}
+
+// 4:2:0 to 4:1:1 from the even columns, the new odd rows the average of
+// the rows above and below: rounded in blocks of 32 while 32 remain,
+// truncated after that; the last source row is copied.
+void filter420To411Rows(const uint8_t* c, const uint8_t* below, uint8_t* even, uint8_t* odd, int n) {
+  const __m128i m = _mm_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, -1, -1, -1, -1, -1, -1, -1, -1);
+  auto evens = [&](const uint8_t* p) {
+    return _mm_unpacklo_epi64(_mm_shuffle_epi8(load128(p), m), _mm_shuffle_epi8(load128(p + 16), m));
+  };
+  int k = 0;
+  for (; n - k >= 32; k += 32)
+    for (int j = 0; j < 32; j += 16) {
+      const __m128i a = evens(c + 2 * (k + j));
+      store128(even + k + j, a);
+      store128(odd + k + j, below ? _mm_avg_epu8(a, evens(below + 2 * (k + j))) : a);
+    }
+  for (; k < n; ++k) {
+    even[k] = c[2 * k];
+    odd[k] = below ? uint8_t(TruncatedMean(c[2 * k], below[2 * k])) : c[2 * k];
+  }
+}
+
+Status filter411To420(const Side& src, const Side& dst, ImageSize size) {
+  if (size.width < 4 || size.height < 4 || (size.width & 3) || (size.height & 3)) return StatusSizeError;
+  const int n = size.width / 4;
+  for (int y = 0; y < size.height; ++y) copyBytes(at(src, 0, y, 0), at(dst, 0, y, 0), size.width, false);
+  for (int i = 0; i < size.height / 2; ++i)
+    for (int p = 1; p <= 2; ++p) filter411To420Row(at(src, p, 2 * i, 0), at(dst, p, i, 0), n);
+  return StatusOk;
+}
+
+Status filter420To411(const Side& src, const Side& dst, ImageSize size) {
+  if (size.width < 4 || size.height < 2 || (size.width & 3) || (size.height & 1)) return StatusSizeError;
+  const int n = size.width / 4;
+  const int rows = size.height / 2;
+  for (int y = 0; y < size.height; ++y) copyBytes(at(src, 0, y, 0), at(dst, 0, y, 0), size.width, false);
+  for (int i = 0; i < rows; ++i)
+    for (int p = 1; p <= 2; ++p)
+      filter420To411Rows(at(src, p, i, 0), i + 1 < rows ? at(src, p, i + 1, 0) : nullptr, at(dst, p, 2 * i, 0),
+                         at(dst, p, 2 * i + 1, 0), n);
+  return StatusOk;
+}
+
+// ---- sides from the public arguments ----
+
+Side pairSide(const uint8_t* p, int step) { return Side{{const_cast<uint8_t*>(p), nullptr, nullptr}, {step, 0, 0}, 1}; }
+Side twoPlaneSide(const uint8_t* y, int yStep, const uint8_t* c, int cStep) {
+  return Side{{const_cast<uint8_t*>(y), const_cast<uint8_t*>(c), nullptr}, {yStep, cStep, 0}, 2};
+}
+Side planeSide(const uint8_t* const* p, const int* steps, bool crFirst) {
+  const int b = crFirst ? 2 : 1, r = crFirst ? 1 : 2;
+  return Side{{const_cast<uint8_t*>(p[0]), const_cast<uint8_t*>(p[b]), const_cast<uint8_t*>(p[r])},
+              {steps[0], steps[b], steps[r]},
+              3};
+}
+
+bool anyNull(const uint8_t* const* planes) { return !planes[0] || !planes[1] || !planes[2]; }
+
+constexpr Layout pairsOf(PairOrder o) { return Layout{Kind::Pairs, o, false, Scheme::S422}; }
+constexpr Layout twoPlanes(Scheme s) { return Layout{Kind::TwoPlanes, PairOrder::YCbCr, false, s}; }
+constexpr Layout planes(Scheme s, bool crFirst = false) { return Layout{Kind::Planes, PairOrder::YCbCr, crFirst, s}; }
+
+// The size rule that follows from the two schemes.
+constexpr SizeRule ruleOf(Scheme a, Scheme b) {
+  const bool has411 = a == Scheme::S411 || b == Scheme::S411;
+  const bool has420 = a == Scheme::S420 || b == Scheme::S420;
+  return has411 && has420 ? SizeRule::Quad4x2 : has420 ? SizeRule::Even2x2 : has411 ? SizeRule::Quad4 : SizeRule::Even2x1;
+}
+
+constexpr Member member(Layout s, Layout d, bool nonTemporal = false) {
+  return Member{s, d, ruleOf(s.scheme, d.scheme), nonTemporal, false};
+}
+constexpr Member withRule(Member m, SizeRule r) {
+  m.rule = r;
+  return m;
+}
+constexpr Member withStreamedLuma(Member m) {
+  m.streamedLuma = true;
+  return m;
+}
+
+constexpr Scheme S422 = Scheme::S422, S420 = Scheme::S420, S411 = Scheme::S411;
+constexpr Layout kYCbCrPairs = pairsOf(PairOrder::YCbCr), kYCrCbPairs = pairsOf(PairOrder::YCrCb),
+                 kCbYCrPairs = pairsOf(PairOrder::CbYCr);
+
+}  // namespace
+
+}  // namespace zel::repack
+
+using namespace zel::repack;
+
+// Public frames by layout pair: pointers and plane entries, then the
+// member's size rule, then the work.
+#define REPACK_C2C2(name, m)                                                                      \
+  ZEL_PUBLIC Status name(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) { \
+    if (!src || !dst) return StatusNullPointerError;                                                \
+    return run(m, pairSide(src, srcStep), pairSide(dst, dstStep), size);                           \
+  }
+#define REPACK_C2P3(name, m)                                                                        \
+  ZEL_PUBLIC Status name(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],      \
+                         ImageSize size) {                                                                   \
+    if (!src || !dst || !dstStep || anyNull(dst)) return StatusNullPointerError;                             \
+    return run(m, pairSide(src, srcStep), planeSide(dst, dstStep, (m).dst.crFirst), size);                          \
+  }
+#define REPACK_C2P2(name, m)                                                                                 \
+  ZEL_PUBLIC Status name(const uint8_t* src, int srcStep, uint8_t* dstY, int dstYStep, uint8_t* dstCbCr,    \
+                         int dstCbCrStep, ImageSize size) {                                                  \
+    if (!src || !dstY || !dstCbCr) return StatusNullPointerError;                                           \
+    return run(m, pairSide(src, srcStep), twoPlaneSide(dstY, dstYStep, dstCbCr, dstCbCrStep), size);        \
+  }
+#define REPACK_P3C2(name, m)                                                                        \
+  ZEL_PUBLIC Status name(const uint8_t* const src[3], const int srcStep[3], uint8_t* dst, int dstStep,      \
+                         ImageSize size) {                                                                   \
+    if (!src || !srcStep || anyNull(src) || !dst) return StatusNullPointerError;                            \
+    return run(m, planeSide(src, srcStep, (m).src.crFirst), pairSide(dst, dstStep), size);                          \
+  }
+#define REPACK_P3P3(name, m)                                                         \
+  ZEL_PUBLIC Status name(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3],         \
+                         const int dstStep[3], ImageSize size) {                                             \
+    if (!src || !srcStep || anyNull(src) || !dst || !dstStep || anyNull(dst)) return StatusNullPointerError; \
+    return run(m, planeSide(src, srcStep, (m).src.crFirst), planeSide(dst, dstStep, (m).dst.crFirst), size);          \
+  }
+#define REPACK_P3P2(name, m)                                                                        \
+  ZEL_PUBLIC Status name(const uint8_t* const src[3], const int srcStep[3], uint8_t* dstY, int dstYStep,    \
+                         uint8_t* dstCbCr, int dstCbCrStep, ImageSize size) {                                \
+    if (!src || !srcStep || anyNull(src) || !dstY || !dstCbCr) return StatusNullPointerError;               \
+    return run(m, planeSide(src, srcStep, (m).src.crFirst), twoPlaneSide(dstY, dstYStep, dstCbCr, dstCbCrStep), size); \
+  }
+#define REPACK_P2C2(name, m)                                                                                 \
+  ZEL_PUBLIC Status name(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep,        \
+                         uint8_t* dst, int dstStep, ImageSize size) {                                        \
+    if (!srcY || !srcCbCr || !dst) return StatusNullPointerError;                                           \
+    return run(m, twoPlaneSide(srcY, srcYStep, srcCbCr, srcCbCrStep), pairSide(dst, dstStep), size);        \
+  }
+#define REPACK_P2P3(name, m)                                                                        \
+  ZEL_PUBLIC Status name(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep,        \
+                         uint8_t* const dst[3], const int dstStep[3], ImageSize size) {                      \
+    if (!srcY || !srcCbCr || !dst || !dstStep || anyNull(dst)) return StatusNullPointerError;               \
+    return run(m, twoPlaneSide(srcY, srcYStep, srcCbCr, srcCbCrStep), planeSide(dst, dstStep, (m).dst.crFirst), size); \
+  }
+
+// 4:2:2 to 4:2:2
+REPACK_C2P3(zeliCbYCr422ToYCbCr422_8u_C2P3R, member(kCbYCrPairs, planes(S422)))
+REPACK_C2C2(zeliCbYCr422ToYCbCr422_8u_C2R, member(kCbYCrPairs, kYCbCrPairs))
+REPACK_C2C2(zeliYCbCr422ToCbYCr422_8u_C2R, member(kYCbCrPairs, kCbYCrPairs, true))
+REPACK_P3C2(zeliYCbCr422ToCbYCr422_8u_P3C2R, member(planes(S422), kCbYCrPairs))
+REPACK_C2C2(zeliYCbCr422ToYCrCb422_8u_C2R, withRule(member(kYCbCrPairs, kYCrCbPairs, true), SizeRule::Even2))
+REPACK_P3C2(zeliYCbCr422ToYCrCb422_8u_P3C2R, withRule(member(planes(S422), kYCrCbPairs, true), SizeRule::Even2))
+REPACK_C2P3(zeliYCbCr422_8u_C2P3R, member(kYCbCrPairs, planes(S422)))
+REPACK_P3C2(zeliYCbCr422_8u_P3C2R, member(planes(S422), kYCbCrPairs))
+REPACK_C2P3(zeliYCrCb422ToYCbCr422_8u_C2P3R, member(kYCrCbPairs, planes(S422)))
+
+// 4:2:2 to 4:2:0
+REPACK_C2P2(zeliCbYCr422ToYCbCr420_8u_C2P2R, member(kCbYCrPairs, twoPlanes(S420)))
+REPACK_C2P3(zeliCbYCr422ToYCbCr420_8u_C2P3R, member(kCbYCrPairs, planes(S420)))
+REPACK_C2P3(zeliCbYCr422ToYCrCb420_8u_C2P3R, member(kCbYCrPairs, planes(S420, true)))
+REPACK_C2P2(zeliYCbCr422ToYCbCr420_8u_C2P2R, member(kYCbCrPairs, twoPlanes(S420)))
+REPACK_C2P3(zeliYCbCr422ToYCbCr420_8u_C2P3R, member(kYCbCrPairs, planes(S420)))
+REPACK_P3P2(zeliYCbCr422ToYCbCr420_8u_P3P2R, member(planes(S422), twoPlanes(S420)))
+REPACK_P3P3(zeliYCbCr422ToYCbCr420_8u_P3R, withStreamedLuma(member(planes(S422), planes(S420))))
+REPACK_C2P3(zeliYCbCr422ToYCrCb420_8u_C2P3R, member(kYCbCrPairs, planes(S420, true)))
+REPACK_C2P3(zeliYCrCb422ToYCbCr420_8u_C2P3R, member(kYCrCbPairs, planes(S420)))
+
+// 4:2:2 to 4:1:1
+REPACK_C2P3(zeliCbYCr422ToYCbCr411_8u_C2P3R, member(kCbYCrPairs, planes(S411)))
+REPACK_C2P2(zeliYCbCr422ToYCbCr411_8u_C2P2R, member(kYCbCrPairs, twoPlanes(S411), true))
+REPACK_C2P3(zeliYCbCr422ToYCbCr411_8u_C2P3R, withRule(member(kYCbCrPairs, planes(S411)), SizeRule::Quad4x1))
+REPACK_P3P2(zeliYCbCr422ToYCbCr411_8u_P3P2R, member(planes(S422), twoPlanes(S411)))
+REPACK_P3P3(zeliYCbCr422ToYCbCr411_8u_P3R, member(planes(S422), planes(S411)))
+REPACK_C2P3(zeliYCrCb422ToYCbCr411_8u_C2P3R, member(kYCrCbPairs, planes(S411)))
+
+// 4:2:0 to 4:2:2
+REPACK_P2C2(zeliYCbCr420ToCbYCr422_8u_P2C2R, member(twoPlanes(S420), kCbYCrPairs))
+REPACK_P2C2(zeliYCbCr420ToYCbCr422_8u_P2C2R, member(twoPlanes(S420), kYCbCrPairs))
+REPACK_P2P3(zeliYCbCr420ToYCbCr422_8u_P2P3R, member(twoPlanes(S420), planes(S422)))
+REPACK_P3P3(zeliYCbCr420ToYCbCr422_8u_P3R, member(planes(S420), planes(S422)))
+REPACK_P3C2(zeliYCrCb420ToCbYCr422_8u_P3C2R, member(planes(S420, true), kCbYCrPairs, true))
+REPACK_P3C2(zeliYCrCb420ToYCbCr422_8u_P3C2R, member(planes(S420, true), kYCbCrPairs))
+REPACK_P3P3(zeliYCrCb420ToYCbCr422_8u_P3R, member(planes(S420, true), planes(S422)))
+
+// 4:2:0 to 4:2:0
+REPACK_P2P3(zeliYCbCr420ToYCrCb420_8u_P2P3R, member(twoPlanes(S420), planes(S420, true)))
+REPACK_P2P3(zeliYCbCr420_8u_P2P3R, member(twoPlanes(S420), planes(S420)))
+REPACK_P3P2(zeliYCbCr420_8u_P3P2R, member(planes(S420), twoPlanes(S420)))
+REPACK_P3P2(zeliYCrCb420ToYCbCr420_8u_P3P2R, member(planes(S420, true), twoPlanes(S420)))
+
+// 4:2:0 to 4:1:1
+REPACK_P2P3(zeliYCbCr420ToYCbCr411_8u_P2P3R, member(twoPlanes(S420), planes(S411)))
+REPACK_P3P2(zeliYCbCr420ToYCbCr411_8u_P3P2R, member(planes(S420), twoPlanes(S411)))
+REPACK_P3P2(zeliYCrCb420ToYCbCr411_8u_P3P2R, member(planes(S420, true), twoPlanes(S411)))
+
+// 4:1:1 to 4:2:2
+REPACK_P2C2(zeliYCbCr411ToYCbCr422_8u_P2C2R, member(twoPlanes(S411), kYCbCrPairs, true))
+REPACK_P2P3(zeliYCbCr411ToYCbCr422_8u_P2P3R, member(twoPlanes(S411), planes(S422)))
+REPACK_P3C2(zeliYCbCr411ToYCbCr422_8u_P3C2R, member(planes(S411), kYCbCrPairs, true))
+REPACK_P3P3(zeliYCbCr411ToYCbCr422_8u_P3R, member(planes(S411), planes(S422)))
+REPACK_P3C2(zeliYCbCr411ToYCrCb422_8u_P3C2R, member(planes(S411), kYCrCbPairs, true))
+REPACK_P3P3(zeliYCbCr411ToYCrCb422_8u_P3R, member(planes(S411), planes(S422, true)))
+
+// 4:1:1 to 4:2:0
+REPACK_P2P3(zeliYCbCr411ToYCbCr420_8u_P2P3R, member(twoPlanes(S411), planes(S420)))
+REPACK_P3P2(zeliYCbCr411ToYCbCr420_8u_P3P2R, member(planes(S411), twoPlanes(S420)))
+REPACK_P3P3(zeliYCbCr411ToYCbCr420_8u_P3R, member(planes(S411), planes(S420)))
+REPACK_P2P3(zeliYCbCr411ToYCrCb420_8u_P2P3R, member(twoPlanes(S411), planes(S420, true)))
+
+// 4:1:1 to 4:1:1
+REPACK_P2P3(zeliYCbCr411_8u_P2P3R, member(twoPlanes(S411), planes(S411)))
+REPACK_P3P2(zeliYCbCr411_8u_P3P2R, member(planes(S411), twoPlanes(S411)))
+
+// Filtered resampling between 4:1:1 and 4:2:0.
+ZEL_PUBLIC Status zeliYCbCr411To420_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3],
+                                           const int dstStep[3], ImageSize size) {
+  if (!src || !srcStep || anyNull(src) || !dst || !dstStep || anyNull(dst)) return StatusNullPointerError;
+  return filter411To420(planeSide(src, srcStep, false), planeSide(dst, dstStep, false), size);
+}
+
+ZEL_PUBLIC Status zeliYCbCr420To411_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3],
+                                           const int dstStep[3], ImageSize size) {
+  if (!src || !srcStep || anyNull(src) || !dst || !dstStep || anyNull(dst)) return StatusNullPointerError;
+  return filter420To411(planeSide(src, srcStep, false), planeSide(dst, dstStep, false), size);
+}
+
+// Luma of a 4:2:2 stream as a gray plane, a last odd pixel included.
+ZEL_PUBLIC Status zeliYCbCr422ToGray_8u_C2C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                              ImageSize size) {
+  if (!src || !dst) return StatusNullPointerError;
+  if (size.width < 1 || size.height < 1) return StatusSizeError;
+  zel::plainWalk(size.height, [&](int y) {
+    lumaOfPairs(zel::rowAt(src, srcStep, y), PairOrder::YCbCr, zel::rowAt(dst, dstStep, y), size.width);
+  });
+  return StatusOk;
+}

@@ -1,0 +1,144 @@
+// The vector operations of the luma-chroma kernels, written once for two
+// widths. A kernel is a template over one of these:
+//   Sse  one 128-bit register, one unit of 16 pixels;
+//   Avx  one 256-bit register, two units (lane 0 pixels 0..15, lane 1
+//        pixels 16..31), chosen at run time.
+// Every operation works within a 128-bit lane, so the same kernel code
+// computes the same bits at both widths. Avx kernels are instantiated only
+// inside a ZEL_AVX2 function marked `flatten`, which pulls every operation
+// into the AVX2 code.
+#pragma once
+
+#include <immintrin.h>
+
+#include <cstdint>
+
+#include "frame/simd.h"
+
+// Avx values pass between helpers that the flattened AVX2 kernels inline;
+// no 256-bit value crosses a real call, so the ABI note does not apply.
+#pragma GCC diagnostic ignored "-Wpsabi"
+
+namespace zel::lc {
+
+// The scalar meaning of a 16-bit lane sum without saturation: it wraps.
+// With the luma-chroma constants no sum comes near the limit.
+inline int16_t wrapAdd16(int a, int b) { return static_cast<int16_t>(a + b); }
+
+// A 16-byte shuffle pattern (-1 clears the byte).
+struct Shuffle16 {
+  int8_t b[16];
+};
+
+struct Sse {
+  using V = __m128i;
+  static constexpr int kUnits = 1;
+  static constexpr int kPixels = 16;
+
+  // 16 bytes of each unit; units lie `unitStride` bytes apart.
+  static V loadUnits(const void* p, int) { return load128(p); }
+  static void storeUnits(void* p, int, V v) { store128(p, v); }
+  static V shuffleOf(const Shuffle16& s) { return load128(s.b); }
+
+  static V zero() { return _mm_setzero_si128(); }
+  static V set16(int v) { return _mm_set1_epi16(static_cast<int16_t>(v)); }
+  static V set8(int v) { return _mm_set1_epi8(static_cast<int8_t>(v)); }
+  static V add16(V a, V b) { return _mm_add_epi16(a, b); }
+  static V sub16(V a, V b) { return _mm_sub_epi16(a, b); }
+  static V addSatS16(V a, V b) { return _mm_adds_epi16(a, b); }
+  static V addSatU16(V a, V b) { return _mm_adds_epu16(a, b); }
+  static V mulHighS16(V a, V b) { return _mm_mulhi_epi16(a, b); }
+  static V mulHighU16(V a, V b) { return _mm_mulhi_epu16(a, b); }
+  static V mulHighRound(V a, V b) { return _mm_mulhrs_epi16(a, b); }
+  template <int N>
+  static V sra16(V a) { return _mm_srai_epi16(a, N); }
+  template <int N>
+  static V srl16(V a) { return _mm_srli_epi16(a, N); }
+  template <int N>
+  static V sll16(V a) { return _mm_slli_epi16(a, N); }
+  static V or_(V a, V b) { return _mm_or_si128(a, b); }
+  static V shuffle8(V a, V m) { return _mm_shuffle_epi8(a, m); }
+  static V unpackLo8(V a, V b) { return _mm_unpacklo_epi8(a, b); }
+  static V unpackHi8(V a, V b) { return _mm_unpackhi_epi8(a, b); }
+  static V unpackLo16(V a, V b) { return _mm_unpacklo_epi16(a, b); }
+  static V unpackHi16(V a, V b) { return _mm_unpackhi_epi16(a, b); }
+  // Signed 16-bit lanes to bytes clamped to 0..255: SaturateU8.
+  static V packU8(V lo, V hi) { return _mm_packus_epi16(lo, hi); }
+};
+
+struct Avx {
+  using V = __m256i;
+  static constexpr int kUnits = 2;
+  static constexpr int kPixels = 32;
+
+  ZEL_AVX2 static V loadUnits(const void* p, int unitStride) {
+    const auto* b = static_cast<const uint8_t*>(p);
+    return _mm256_inserti128_si256(_mm256_castsi128_si256(load128(b)), load128(b + unitStride), 1);
+  }
+  ZEL_AVX2 static void storeUnits(void* p, int unitStride, V v) {
+    auto* b = static_cast<uint8_t*>(p);
+    store128(b, _mm256_castsi256_si128(v));
+    store128(b + unitStride, _mm256_extracti128_si256(v, 1));
+  }
+  ZEL_AVX2 static V shuffleOf(const Shuffle16& s) { return _mm256_broadcastsi128_si256(load128(s.b)); }
+
+  ZEL_AVX2 static V zero() { return _mm256_setzero_si256(); }
+  ZEL_AVX2 static V set16(int v) { return _mm256_set1_epi16(static_cast<int16_t>(v)); }
+  ZEL_AVX2 static V set8(int v) { return _mm256_set1_epi8(static_cast<int8_t>(v)); }
+  ZEL_AVX2 static V add16(V a, V b) { return _mm256_add_epi16(a, b); }
+  ZEL_AVX2 static V sub16(V a, V b) { return _mm256_sub_epi16(a, b); }
+  ZEL_AVX2 static V addSatS16(V a, V b) { return _mm256_adds_epi16(a, b); }
+  ZEL_AVX2 static V addSatU16(V a, V b) { return _mm256_adds_epu16(a, b); }
+  ZEL_AVX2 static V mulHighS16(V a, V b) { return _mm256_mulhi_epi16(a, b); }
+  ZEL_AVX2 static V mulHighU16(V a, V b) { return _mm256_mulhi_epu16(a, b); }
+  ZEL_AVX2 static V mulHighRound(V a, V b) { return _mm256_mulhrs_epi16(a, b); }
+  template <int N>
+  ZEL_AVX2 static V sra16(V a) { return _mm256_srai_epi16(a, N); }
+  template <int N>
+  ZEL_AVX2 static V srl16(V a) { return _mm256_srli_epi16(a, N); }
+  template <int N>
+  ZEL_AVX2 static V sll16(V a) { return _mm256_slli_epi16(a, N); }
+  ZEL_AVX2 static V or_(V a, V b) { return _mm256_or_si256(a, b); }
+  ZEL_AVX2 static V shuffle8(V a, V m) { return _mm256_shuffle_epi8(a, m); }
+  ZEL_AVX2 static V unpackLo8(V a, V b) { return _mm256_unpacklo_epi8(a, b); }
+  ZEL_AVX2 static V unpackHi8(V a, V b) { return _mm256_unpackhi_epi8(a, b); }
+  ZEL_AVX2 static V unpackLo16(V a, V b) { return _mm256_unpacklo_epi16(a, b); }
+  ZEL_AVX2 static V unpackHi16(V a, V b) { return _mm256_unpackhi_epi16(a, b); }
+  ZEL_AVX2 static V packU8(V lo, V hi) { return _mm256_packus_epi16(lo, hi); }
+};
+
+// Three channels of a block: bytes (16 pixels a unit) or 16-bit lanes.
+template <class U>
+struct Trio {
+  typename U::V c0, c1, c2;
+};
+
+// Three samples of one pixel.
+struct Samples3 {
+  int c0, c1, c2;
+};
+
+// Three dwords of 16-bit-range results to the bytes of four pixels: byte
+// 4i + c is SaturateU8 of channel c of pixel i, byte 4i + 3 is zero.
+inline __m128i mergeDwords(__m128i c0, __m128i c1, __m128i c2) {
+  const __m128i bytes = _mm_packus_epi16(_mm_packs_epi32(c0, c1), _mm_packs_epi32(c2, _mm_setzero_si128()));
+  return _mm_shuffle_epi8(bytes, _mm_setr_epi8(0, 4, 8, 12, 1, 5, 9, 13, 2, 6, 10, 14, 3, 7, 11, 15));
+}
+
+// Bytes of a unit widened to two vectors of 16-bit lanes (pixels 0..7 and
+// 8..15 of each unit), and back with SaturateU8.
+template <class U>
+struct Wide16 {
+  typename U::V lo, hi;
+};
+template <class U>
+inline Wide16<U> widen(typename U::V bytes) {
+  const typename U::V z = U::zero();
+  return {U::unpackLo8(bytes, z), U::unpackHi8(bytes, z)};
+}
+template <class U>
+inline typename U::V narrow(const Wide16<U>& w) {
+  return U::packU8(w.lo, w.hi);
+}
+
+}  // namespace zel::lc
