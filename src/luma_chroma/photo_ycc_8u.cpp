@@ -4,57 +4,67 @@
 #include "frame/export.h"
 #include "luma_chroma/photo_ycc_forms.h"
 #include "luma_chroma/photo_ycc_kernels.h"
+#include "luma_chroma/pixel_rows.h"
 #include "luma_chroma/yuv_driver.h"
 
-namespace zel {
+namespace zel::lc {
 
 namespace {
 
 struct ForwardLanes {
-  static constexpr bool kAvx2 = true;
-  static Lanes3 vec(__m128i r, __m128i g, __m128i b) { return rgbToYccLanes(r, g, b); }
-  ZEL_AVX2 static Lanes3x16 vec(__m256i r, __m256i g, __m256i b) { return rgbToYccLanes(r, g, b); }
+  static constexpr bool kVector = true;
+  Samples3 pixel(const Samples3& s) const { return samplesOf(rgbToYccLanes(s.c0, s.c1, s.c2)); }
+  template <class U>
+  Trio<U> lanes(const Trio<U>& s) const {
+    return rgbToYccLanes<U>(s);
+  }
 };
 struct ForwardWide {
-  static Pixel8 scalar(int r, int g, int b) { return rgbToYccWide(r, g, b); }
+  static constexpr bool kVector = false;
+  Samples3 pixel(const Samples3& s) const { return samplesOf(rgbToYccWide(s.c0, s.c1, s.c2)); }
 };
 struct InverseLanes {
-  static constexpr bool kAvx2 = true;
-  static Lanes3 vec(__m128i y, __m128i c1, __m128i c2) { return yccToRgbLanes(y, c1, c2); }
-  ZEL_AVX2 static Lanes3x16 vec(__m256i y, __m256i c1, __m256i c2) { return yccToRgbLanes(y, c1, c2); }
+  static constexpr bool kVector = true;
+  Samples3 pixel(const Samples3& s) const { return samplesOf(yccToRgbLanes(s.c0, s.c1, s.c2)); }
+  template <class U>
+  Trio<U> lanes(const Trio<U>& s) const {
+    return yccToRgbLanes<U>(s);
+  }
 };
 struct InverseWide {
-  static Pixel8 scalar(int y, int c1, int c2) { return yccToRgbWide(y, c1, c2); }
+  static constexpr bool kVector = false;
+  Samples3 pixel(const Samples3& s) const { return samplesOf(yccToRgbWide(s.c0, s.c1, s.c2)); }
 };
 
-// Three-channel rows take blocks of 8, four-channel rows blocks of 4.
-template <typename Body, typename Tail, int Channels>
-void yccRow8u(const uint8_t* src, uint8_t* dst, int width, Path path) {
+// The body runs below width AND NOT 7 for three-byte pixels and below width
+// AND NOT 3 for four-byte ones, whose fourth byte is kept.
+template <int Channels, class Body, class Tail>
+void yccRow8u(const uint8_t* src, uint8_t* dst, int width, bool avx2) {
   if constexpr (Channels == 3)
-    convertRow<Body, Tail, 8>(ReadC3{src}, WriteC3{dst}, bodyEnd(width, 8), width, path);
+    convertRow(PackedIn<3>{src}, PackedOut3<false>{dst}, width, width & ~7, Body{}, Tail{}, avx2);
   else
-    convertRow<Body, Tail, 4>(ReadC4{src}, WriteAC4{dst}, bodyEnd(width, 4), width, path);
+    convertRow(PackedIn<4>{src}, PackedOutKeep{dst}, width, width & ~3, Body{}, Tail{}, avx2);
 }
 
 }  // namespace
 
 template <int Channels>
-void rgbToYcc8uRow(const uint8_t* src, uint8_t* dst, int width, Path path) {
-  yccRow8u<ForwardLanes, ForwardWide, Channels>(src, dst, width, path);
+void rgbToYcc8uRow(const uint8_t* src, uint8_t* dst, int width, bool avx2) {
+  yccRow8u<Channels, ForwardLanes, ForwardWide>(src, dst, width, avx2);
 }
 template <int Channels>
-void yccToRgb8uRow(const uint8_t* src, uint8_t* dst, int width, Path path) {
-  yccRow8u<InverseLanes, InverseWide, Channels>(src, dst, width, path);
+void yccToRgb8uRow(const uint8_t* src, uint8_t* dst, int width, bool avx2) {
+  yccRow8u<Channels, InverseLanes, InverseWide>(src, dst, width, avx2);
 }
 
-template void rgbToYcc8uRow<3>(const uint8_t*, uint8_t*, int, Path);
-template void rgbToYcc8uRow<4>(const uint8_t*, uint8_t*, int, Path);
-template void yccToRgb8uRow<3>(const uint8_t*, uint8_t*, int, Path);
-template void yccToRgb8uRow<4>(const uint8_t*, uint8_t*, int, Path);
+template void rgbToYcc8uRow<3>(const uint8_t*, uint8_t*, int, bool);
+template void rgbToYcc8uRow<4>(const uint8_t*, uint8_t*, int, bool);
+template void yccToRgb8uRow<3>(const uint8_t*, uint8_t*, int, bool);
+template void yccToRgb8uRow<4>(const uint8_t*, uint8_t*, int, bool);
 
-}  // namespace zel
+}  // namespace zel::lc
 
-using namespace zel;
+using namespace zel::lc;
 
 ZEL_PUBLIC Status zeliRGBToYCC_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
   return walkInterleaved(src, srcStep, dst, dstStep, size, rgbToYcc8uRow<3>);

@@ -7,19 +7,19 @@
 #include "frame/export.h"
 #include "luma_chroma/photo_ycc_forms.h"
 #include "luma_chroma/photo_ycc_kernels.h"
+#include "luma_chroma/vector_units.h"
 #include "luma_chroma/yuv_driver.h"
 
-namespace zel {
+namespace zel::lc {
 
 namespace {
 
-using rows_detail::Mask16;
-using rows_detail::mask;
+inline __m128i mask(const Shuffle16& m) { return load128(m.b); }
 
 // 16-bit element `channel` of four pixels of `stride` elements, zero-extended
 // into 32-bit lanes, from the 16-byte part `part` of the pixels' bytes.
-constexpr Mask16 gatherWords(int stride, int channel, int part) {
-  Mask16 m{};
+constexpr Shuffle16 gatherWords(int stride, int channel, int part) {
+  Shuffle16 m{};
   for (int i = 0; i < 16; ++i) m.b[i] = -128;
   for (int lane = 0; lane < 4; ++lane) {
     const int e = stride * lane + channel;
@@ -33,8 +33,8 @@ constexpr Mask16 gatherWords(int stride, int channel, int part) {
 // Words 8 * part .. 8 * part + 7 of four pixels of `stride` words, from
 // P = c0 c0 c0 c0 c1 c1 c1 c1 (source 0) or Q = c2 c2 c2 c2 ... (source 1);
 // a fourth channel is left zero.
-constexpr Mask16 scatterWords(int stride, int part, int source) {
-  Mask16 m{};
+constexpr Shuffle16 scatterWords(int stride, int part, int source) {
+  Shuffle16 m{};
   for (int w = 0; w < 8; ++w) {
     const int word = 8 * part + w, px = word / stride, ch = word % stride;
     int from = -1;
@@ -48,10 +48,10 @@ constexpr Mask16 scatterWords(int stride, int part, int source) {
 
 template <int Stride>
 struct WordMasks {
-  static constexpr Mask16 gather[3][2] = {{gatherWords(Stride, 0, 0), gatherWords(Stride, 0, 1)},
+  static constexpr Shuffle16 gather[3][2] = {{gatherWords(Stride, 0, 0), gatherWords(Stride, 0, 1)},
                                           {gatherWords(Stride, 1, 0), gatherWords(Stride, 1, 1)},
                                           {gatherWords(Stride, 2, 0), gatherWords(Stride, 2, 1)}};
-  static constexpr Mask16 scatter[2][2] = {{scatterWords(Stride, 0, 0), scatterWords(Stride, 0, 1)},
+  static constexpr Shuffle16 scatter[2][2] = {{scatterWords(Stride, 0, 0), scatterWords(Stride, 0, 1)},
                                            {scatterWords(Stride, 1, 0), scatterWords(Stride, 1, 1)}};
 };
 
@@ -85,7 +85,7 @@ struct Read16 {
     return {channel(0), channel(1), channel(2)};
   }
   // Samples as the tails take them: unsigned, or signed values.
-  Sample3 pixel(int x) const {
+  Samples3 pixel(int x) const {
     const uint16_t* s = p + Channels * x;
     auto value = [](uint16_t w) { return Signed ? int(int16_t(w)) : int(w); };
     return {value(loadSample(s)), value(loadSample(s + 1)), value(loadSample(s + 2))};
@@ -189,7 +189,7 @@ void yccRow16(const uint16_t* src, uint16_t* dst, int width, Body body, Tail tai
     out.put4(x, RoundEven(r.c0), RoundEven(r.c1), RoundEven(r.c2));
   }
   for (; x < width; ++x) {
-    const Sample3 s = in.pixel(x);
+    const Samples3 s = in.pixel(x);
     out.putWords(x, tail(s.c0, s.c1, s.c2));
   }
 }
@@ -246,9 +246,9 @@ template void rgbToYcc32fRow<4>(const float*, float*, int);
 template void yccToRgb32fRow<3>(const float*, float*, int);
 template void yccToRgb32fRow<4>(const float*, float*, int);
 
-}  // namespace zel
+}  // namespace zel::lc
 
-using namespace zel;
+using namespace zel::lc;
 
 namespace {
 

@@ -14,7 +14,7 @@
 #include "frame/simd.h"
 #include "luma_chroma/yuv_lanes.h"
 
-namespace zel {
+namespace zel::lc {
 
 // ============================ 8 bits ============================
 
@@ -28,28 +28,16 @@ inline Pixel8 rgbToYccLanes(int R, int G, int B) {
   return {SaturateU8(y >> 2), SaturateU8((c1 + 624) >> 2), SaturateU8((c2 + 548) >> 2)};
 }
 
-inline Lanes3 rgbToYccLanes(__m128i R, __m128i G, __m128i B) {
-  using yuv_detail::k16;
-  const __m128i r = _mm_slli_epi16(R, 8), g = _mm_slli_epi16(G, 8), b = _mm_slli_epi16(B, 8);
-  const __m128i l = _mm_add_epi16(_mm_add_epi16(_mm_mulhi_epu16(r, k16(4898)), _mm_mulhi_epu16(g, k16(9617))),
-                                  _mm_mulhi_epu16(b, k16(1867)));
-  const __m128i y = _mm_srai_epi16(_mm_mulhi_epi16(l, k16(2921)), 2);
-  const __m128i c1 = _mm_mulhi_epi16(_mm_sub_epi16(_mm_srli_epi16(b, 2), l), k16(1789));
-  const __m128i c2 = _mm_mulhi_epi16(_mm_sub_epi16(_mm_srli_epi16(r, 2), l), k16(2178));
-  return {y, _mm_srai_epi16(_mm_add_epi16(c1, k16(624)), 2), _mm_srai_epi16(_mm_add_epi16(c2, k16(548)), 2)};
-}
-
-ZEL_AVX2 inline Lanes3x16 rgbToYccLanes(__m256i R, __m256i G, __m256i B) {
-  using yuv_detail::k16x;
-  const __m256i r = _mm256_slli_epi16(R, 8), g = _mm256_slli_epi16(G, 8), b = _mm256_slli_epi16(B, 8);
-  const __m256i l = _mm256_add_epi16(
-      _mm256_add_epi16(_mm256_mulhi_epu16(r, k16x(4898)), _mm256_mulhi_epu16(g, k16x(9617))),
-      _mm256_mulhi_epu16(b, k16x(1867)));
-  const __m256i y = _mm256_srai_epi16(_mm256_mulhi_epi16(l, k16x(2921)), 2);
-  const __m256i c1 = _mm256_mulhi_epi16(_mm256_sub_epi16(_mm256_srli_epi16(b, 2), l), k16x(1789));
-  const __m256i c2 = _mm256_mulhi_epi16(_mm256_sub_epi16(_mm256_srli_epi16(r, 2), l), k16x(2178));
-  return {y, _mm256_srai_epi16(_mm256_add_epi16(c1, k16x(624)), 2),
-          _mm256_srai_epi16(_mm256_add_epi16(c2, k16x(548)), 2)};
+template <class U>
+inline Trio<U> rgbToYccLanes(const Trio<U>& rgb) {
+  using V = typename U::V;
+  const V r = U::template sll16<8>(rgb.c0), g = U::template sll16<8>(rgb.c1), b = U::template sll16<8>(rgb.c2);
+  const V l = U::add16(U::add16(U::mulHighU16(r, U::set16(4898)), U::mulHighU16(g, U::set16(9617))),
+                       U::mulHighU16(b, U::set16(1867)));
+  const V y = U::template sra16<2>(U::mulHighS16(l, U::set16(2921)));
+  const V c1 = U::mulHighS16(U::sub16(U::template srl16<2>(b), l), U::set16(1789));
+  const V c2 = U::mulHighS16(U::sub16(U::template srl16<2>(r), l), U::set16(2178));
+  return {y, U::template sra16<2>(U::add16(c1, U::set16(624))), U::template sra16<2>(U::add16(c2, U::set16(548)))};
 }
 
 // Tail: 32-bit integers; C1 and C2 always fit and are stored as low bytes.
@@ -70,26 +58,15 @@ inline Pixel8 yccToRgbLanes(int Y, int C1, int C2) {
   return {SaturateU8(int16_t(y + c2) >> 4), SaturateU8(g >> 3), SaturateU8(int16_t(y + c1) >> 4)};
 }
 
-inline Lanes3 yccToRgbLanes(__m128i Y, __m128i C1, __m128i C2) {
-  using yuv_detail::k16;
-  const __m128i y = _mm_mulhi_epu16(_mm_slli_epi16(Y, 8), k16(5563));
-  const __m128i c1 = _mm_mulhi_epi16(_mm_slli_epi16(_mm_sub_epi16(C1, k16(156)), 7), k16(18168));
-  const __m128i c2 = _mm_mulhi_epi16(_mm_slli_epi16(_mm_sub_epi16(C2, k16(137)), 7), k16(14921));
-  const __m128i g = _mm_add_epi16(_mm_add_epi16(_mm_srai_epi16(y, 1), _mm_mulhi_epi16(c1, k16(-6357))),
-                                  _mm_mulhi_epi16(c2, k16(-16679)));
-  return {_mm_srai_epi16(_mm_add_epi16(y, c2), 4), _mm_srai_epi16(g, 3), _mm_srai_epi16(_mm_add_epi16(y, c1), 4)};
-}
-
-ZEL_AVX2 inline Lanes3x16 yccToRgbLanes(__m256i Y, __m256i C1, __m256i C2) {
-  using yuv_detail::k16x;
-  const __m256i y = _mm256_mulhi_epu16(_mm256_slli_epi16(Y, 8), k16x(5563));
-  const __m256i c1 = _mm256_mulhi_epi16(_mm256_slli_epi16(_mm256_sub_epi16(C1, k16x(156)), 7), k16x(18168));
-  const __m256i c2 = _mm256_mulhi_epi16(_mm256_slli_epi16(_mm256_sub_epi16(C2, k16x(137)), 7), k16x(14921));
-  const __m256i g = _mm256_add_epi16(
-      _mm256_add_epi16(_mm256_srai_epi16(y, 1), _mm256_mulhi_epi16(c1, k16x(-6357))),
-      _mm256_mulhi_epi16(c2, k16x(-16679)));
-  return {_mm256_srai_epi16(_mm256_add_epi16(y, c2), 4), _mm256_srai_epi16(g, 3),
-          _mm256_srai_epi16(_mm256_add_epi16(y, c1), 4)};
+template <class U>
+inline Trio<U> yccToRgbLanes(const Trio<U>& ycc) {
+  using V = typename U::V;
+  const V y = U::mulHighU16(U::template sll16<8>(ycc.c0), U::set16(5563));
+  const V c1 = U::mulHighS16(U::template sll16<7>(U::sub16(ycc.c1, U::set16(156))), U::set16(18168));
+  const V c2 = U::mulHighS16(U::template sll16<7>(U::sub16(ycc.c2, U::set16(137))), U::set16(14921));
+  const V g = U::add16(U::add16(U::template sra16<1>(y), U::mulHighS16(c1, U::set16(-6357))),
+                       U::mulHighS16(c2, U::set16(-16679)));
+  return {U::template sra16<4>(U::add16(y, c2)), U::template sra16<3>(g), U::template sra16<4>(U::add16(y, c1))};
 }
 
 // Tail of the inverse: luma constant 5564.
@@ -215,4 +192,4 @@ inline Floats3 yccToRgb32f(__m128 Y, __m128 C1, __m128 C2) {
   return {clampUnit(_mm_add_ps(y, c2)), clampUnit(g), clampUnit(_mm_add_ps(y, c1))};
 }
 
-}  // namespace zel
+}  // namespace zel::lc

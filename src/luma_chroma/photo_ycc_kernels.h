@@ -5,16 +5,14 @@
 
 #include <cstdint>
 
-#include "luma_chroma/yuv_rows.h"
-
-namespace zel {
+namespace zel::lc {
 
 // 8 bits: a body of 16-bit lanes below width AND NOT 7 (three channels) or
 // width AND NOT 3 (four), then the 32-bit tail.
 template <int Channels>
-void rgbToYcc8uRow(const uint8_t* src, uint8_t* dst, int width, Path path);
+void rgbToYcc8uRow(const uint8_t* src, uint8_t* dst, int width, bool avx2);
 template <int Channels>
-void yccToRgb8uRow(const uint8_t* src, uint8_t* dst, int width, Path path);
+void yccToRgb8uRow(const uint8_t* src, uint8_t* dst, int width, bool avx2);
 
 // 16 bits, unsigned or signed: a float body below width AND NOT 3, then the
 // tail of the sample type.
@@ -29,4 +27,4 @@ void rgbToYcc32fRow(const float* src, float* dst, int width);
 template <int Channels>
 void yccToRgb32fRow(const float* src, float* dst, int width);
 
-}  // namespace zel
+}  // namespace zel::lc

@@ -1,15 +1,15 @@
-// Row walking of the full-resolution luma-chroma members: plain walks over
-// interleaved rows and over plane sets that share one step.
+// Row walking of the full-resolution YUV and Photo YCC members: plain walks
+// over interleaved rows and over plane sets that share one step.
 #pragma once
 
 #include <cstddef>
 
 #include "frame/image_layout.h"
 #include "frame/row_driver.h"
-#include "luma_chroma/yuv_rows.h"
+#include "frame/simd.h"
 #include "zelcc/zelcc.h"
 
-namespace zel {
+namespace zel::lc {
 
 inline bool sizeBelowOne(ImageSize size) { return size.width < 1 || size.height < 1; }
 
@@ -30,13 +30,13 @@ inline bool anyNull(T* const* planes, int count) {
 }
 
 // Interleaved source and destination: the pointers, the size, then a plain
-// walk; `row(src, dst, width, path)` converts one row.
+// walk; `row(src, dst, width, avx2)` converts one row.
 template <typename Row>
 inline Status walkInterleaved(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size, Row row) {
   if (!src || !dst) return StatusNullPointerError;
   if (sizeBelowOne(size)) return StatusSizeError;
-  const Path path = bestPath();
-  plainWalk(size.height, [&](int y) { row(rowAt(src, srcStep, y), rowAt(dst, dstStep, y), size.width, path); });
+  const bool avx2 = hasAvx2();
+  plainWalk(size.height, [&](int y) { row(rowAt(src, srcStep, y), rowAt(dst, dstStep, y), size.width, avx2); });
   return StatusOk;
 }
 
@@ -53,4 +53,4 @@ inline Status walkElements(const T* src, int srcStep, T* dst, int dstStep, Image
   return StatusOk;
 }
 
-}  // namespace zel
+}  // namespace zel::lc

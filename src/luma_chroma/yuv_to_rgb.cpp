@@ -2,68 +2,87 @@
 // 16.16 forms in the tail; which constant set and which rounding terms each
 // member takes is part of its result.
 #include "frame/export.h"
+#include "luma_chroma/pixel_rows.h"
 #include "luma_chroma/yuv_driver.h"
 #include "luma_chroma/yuv_kernels.h"
+#include "luma_chroma/yuv_lanes.h"
 
-namespace zel {
+namespace zel::lc {
 
 namespace {
 
-template <Pixel8 (*Scalar)(int, int, int), Lanes3 (*Vec)(__m128i, __m128i, __m128i),
-          Lanes3x16 (*VecAvx2)(__m256i, __m256i, __m256i)>
-struct LaneForm {
-  static constexpr bool kAvx2 = true;
-  static Pixel8 scalar(int y, int u, int v) { return Scalar(y, u, v); }
-  static Lanes3 vec(__m128i y, __m128i u, __m128i v) { return Vec(y, u, v); }
-  ZEL_AVX2 static Lanes3x16 vec(__m256i y, __m256i u, __m256i v) { return VecAvx2(y, u, v); }
+struct Lanes1 {
+  static constexpr bool kVector = true;
+  Samples3 pixel(const Samples3& s) const { return samplesOf(rgbLanes1(s.c0, s.c1, s.c2)); }
+  template <class U>
+  Trio<U> lanes(const Trio<U>& s) const {
+    return rgbLanes1<U>(s);
+  }
 };
 
-using Lanes1 = LaneForm<rgbLanes1, rgbLanes1, rgbLanes1>;
-using Lanes2 = LaneForm<rgbLanes2, rgbLanes2, rgbLanes2>;
-using Lanes3Form = LaneForm<rgbLanes3, rgbLanes3, rgbLanes3>;
+struct Lanes2 {
+  static constexpr bool kVector = true;
+  Samples3 pixel(const Samples3& s) const { return samplesOf(rgbLanes2(s.c0, s.c1, s.c2)); }
+  template <class U>
+  Trio<U> lanes(const Trio<U>& s) const {
+    return rgbLanes2<U>(s);
+  }
+};
 
-// A wide form with its set and its rounding terms (32768 or 0 per channel).
-template <const RgbWideSet& Set, int32_t RoundR, int32_t RoundG, int32_t RoundB>
-struct WideForm {
-  static constexpr bool kAvx2 = false;
-  static constexpr RgbRounding kRounding{RoundR, RoundG, RoundB};
-  static Pixel8 scalar(int y, int u, int v) { return rgbWide(Set, kRounding, y, u, v); }
-  static Lanes3 vec(__m128i y, __m128i u, __m128i v) { return rgbWide(Set, kRounding, y, u, v); }
+struct Lanes3 {
+  static constexpr bool kVector = true;
+  Samples3 pixel(const Samples3& s) const { return samplesOf(rgbLanes3(s.c0, s.c1, s.c2)); }
+  template <class U>
+  Trio<U> lanes(const Trio<U>& s) const {
+    return rgbLanes3<U>(s);
+  }
+};
+
+// A wide form with its set and its rounding terms (32768 or 0 a channel).
+struct Wide {
+  static constexpr bool kVector = true;
+  RgbWideSet set;
+  RgbRounding rounding;
+  Samples3 pixel(const Samples3& s) const { return samplesOf(rgbWide(set, rounding, s.c0, s.c1, s.c2)); }
+  template <class U>
+  Trio<U> lanes(const Trio<U>& s) const {
+    return rgbWide<U>(set, rounding, s);
+  }
 };
 
 // Green without rounding beside red and blue with it.
-using WideAGreenTruncated = WideForm<rgbWideA, 32768, 0, 32768>;
-using WideARounded = WideForm<rgbWideA, 32768, 32768, 32768>;
-using WideBTruncated = WideForm<rgbWideB, 0, 0, 0>;
+constexpr Wide kWideAGreenTruncated{rgbWideA, {32768, 0, 32768}};
+constexpr Wide kWideARounded{rgbWideA, {32768, 32768, 32768}};
+constexpr Wide kWideBTruncated{rgbWideB, {0, 0, 0}};
+
+PlanesIn planesIn(const uint8_t* const src[3]) { return {src[0], src[1], src[2]}; }
 
 }  // namespace
 
-void yuvToRgbC3Row(const uint8_t* src, uint8_t* dst, int width, Path path) {
-  convertRow<Lanes1, WideAGreenTruncated>(ReadC3{src}, WriteC3{dst}, bodyEnd(width, 8), width, path);
+void yuvToRgbC3Row(const uint8_t* src, uint8_t* dst, int width, bool avx2) {
+  convertRow(PackedIn<3>{src}, PackedOut3<false>{dst}, width, width & ~7, Lanes1{}, kWideAGreenTruncated, avx2);
 }
 
-// One formula for the whole row: its exact vector form over whole blocks of
-// eight, the same formula one by one after them.
-void yuvToRgbAC4Row(const uint8_t* src, uint8_t* dst, int width, Path path) {
-  convertRow<WideAGreenTruncated, WideAGreenTruncated>(ReadC4{src}, WriteAC4{dst}, bodyEnd(width, 8), width, path);
+// One exact formula for the whole row, in vector blocks and one by one.
+void yuvToRgbAC4Row(const uint8_t* src, uint8_t* dst, int width, bool avx2) {
+  convertRow(PackedIn<4>{src}, PackedOutKeep{dst}, width, width, kWideAGreenTruncated, kWideAGreenTruncated, avx2);
 }
 
-void yuvToRgbC3C4Row(const uint8_t* src, uint8_t* dst, int width, uint8_t alpha, Path path) {
-  convertRow<Lanes3Form, WideARounded>(ReadC3{src}, WriteC4{dst, alpha}, bodyEnd(width, 8), width, path);
+void yuvToRgbC3C4Row(const uint8_t* src, uint8_t* dst, int width, uint8_t alpha, bool avx2) {
+  convertRow(PackedIn<3>{src}, PackedOutAlpha<false>{dst, alpha}, width, width & ~7, Lanes3{}, kWideARounded, avx2);
 }
 
-void yuvToRgbP3C3Row(const uint8_t* const src[3], uint8_t* dst, int width, Path path) {
-  convertRow<Lanes2, WideBTruncated>(ReadP3{src[0], src[1], src[2]}, WriteC3{dst}, bodyEnd(width, 16), width, path);
+void yuvToRgbP3C3Row(const uint8_t* const src[3], uint8_t* dst, int width, bool avx2) {
+  convertRow(planesIn(src), PackedOut3<false>{dst}, width, width & ~15, Lanes2{}, kWideBTruncated, avx2);
 }
 
-void yuvToRgbP3Row(const uint8_t* const src[3], uint8_t* const dst[3], int width, Path path) {
-  convertRow<WideBTruncated, WideBTruncated>(ReadP3{src[0], src[1], src[2]}, WriteP3{dst[0], dst[1], dst[2]},
-                                             bodyEnd(width, 8), width, path);
+void yuvToRgbP3Row(const uint8_t* const src[3], uint8_t* const dst[3], int width, bool avx2) {
+  convertRow(planesIn(src), PlanesOut{dst[0], dst[1], dst[2]}, width, width, kWideBTruncated, kWideBTruncated, avx2);
 }
 
-}  // namespace zel
+}  // namespace zel::lc
 
-using namespace zel;
+using namespace zel::lc;
 
 ZEL_PUBLIC Status zeliYUVToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
   return walkInterleaved(src, srcStep, dst, dstStep, size, yuvToRgbC3Row);
@@ -75,10 +94,9 @@ ZEL_PUBLIC Status zeliYUVToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t*
 
 ZEL_PUBLIC Status zeliYUVToRGB_8u_C3C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
                                         uint8_t alpha) {
-  return walkInterleaved(src, srcStep, dst, dstStep, size,
-                         [alpha](const uint8_t* s, uint8_t* d, int width, Path path) {
-                           yuvToRgbC3C4Row(s, d, width, alpha, path);
-                         });
+  return walkInterleaved(src, srcStep, dst, dstStep, size, [alpha](const uint8_t* s, uint8_t* d, int width, bool avx2) {
+    yuvToRgbC3C4Row(s, d, width, alpha, avx2);
+  });
 }
 
 ZEL_PUBLIC Status zeliYUVToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
@@ -86,10 +104,10 @@ ZEL_PUBLIC Status zeliYUVToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], int s
   if (!srcPlanes || !dst) return StatusNullPointerError;
   if (sizeBelowOne(size)) return StatusSizeError;
   if (anyNull(srcPlanes, 3)) return StatusNullPointerError;
-  const Path path = bestPath();
-  plainWalk(size.height, [&](int y) {
+  const bool avx2 = zel::hasAvx2();
+  zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<const uint8_t, 3> s(srcPlanes, srcStep, y);
-    yuvToRgbP3C3Row(s.p, rowAt(dst, dstStep, y), size.width, path);
+    yuvToRgbP3C3Row(s.p, zel::rowAt(dst, dstStep, y), size.width, avx2);
   });
   return StatusOk;
 }
@@ -101,11 +119,11 @@ ZEL_PUBLIC Status zeliYUVToRGB_8u_P3R(const uint8_t* const srcPlanes[3], int src
   if (sizeBelowOne(size)) return StatusSizeError;
   if (anyNull(dstPlanes, 3)) return StatusNullPointerError;
   if (anyNull(srcPlanes, 3)) return StatusNullPointerError;
-  const Path path = bestPath();
-  plainWalk(size.height, [&](int y) {
+  const bool avx2 = zel::hasAvx2();
+  zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<const uint8_t, 3> s(srcPlanes, srcStep, y);
     const PlaneRows<uint8_t, 3> d(dstPlanes, dstStep, y);
-    yuvToRgbP3Row(s.p, d.p, size.width, path);
+    yuvToRgbP3Row(s.p, d.p, size.width, avx2);
   });
   return StatusOk;
 }

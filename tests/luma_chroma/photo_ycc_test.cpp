@@ -12,21 +12,21 @@
 
 #include "luma_chroma/photo_ycc_forms.h"
 #include "luma_chroma/photo_ycc_kernels.h"
+#include "luma_chroma/yuv_lane_check.h"
 #include "support/test_image.h"
 #include "zelcc/zelcc.h"
 
 namespace {
 
-using namespace zel;
+using namespace zel::lc;
+using namespace zel::lc::test;
+using zel::SaturateU8;
+using zel::lc::test::str;
 using zel::test::TestImage;
 
-std::string str(Pixel8 p) {
-  return std::to_string(p.c0) + "," + std::to_string(p.c1) + "," + std::to_string(p.c2);
-}
 std::string str(Word3 w) {
   return std::to_string(w.c0) + "," + std::to_string(w.c1) + "," + std::to_string(w.c2);
 }
-bool same(Pixel8 a, Pixel8 b) { return a.c0 == b.c0 && a.c1 == b.c1 && a.c2 == b.c2; }
 Word3 signedWords(int a, int b, int c) { return {uint16_t(a), uint16_t(b), uint16_t(c)}; }
 uint32_t bits(float f) {
   uint32_t u;
@@ -127,60 +127,18 @@ TEST(PhotoYccForms, FloatValuesBitForBit) {
 
 // ---------------------------------------------------------------- lanes
 
-template <typename Scalar, typename Vec>
-void expectEightBitLanes(const char* name, Scalar scalar, Vec vec) {
-  alignas(16) int16_t a[8], b[8], c[8];
-  alignas(16) int16_t o[3][8];
-  int n = 0;
-  for (int x = 0; x < 256; x += 2)
-    for (int y = 0; y < 256; y += 3)
-      for (int z = 0; z < 256; z += 5) {
-        a[n] = int16_t(x), b[n] = int16_t(y), c[n] = int16_t(z);
-        if (++n < 8) continue;
-        n = 0;
-        const Lanes3 r = vec(_mm_load_si128(reinterpret_cast<__m128i*>(a)),
-                             _mm_load_si128(reinterpret_cast<__m128i*>(b)),
-                             _mm_load_si128(reinterpret_cast<__m128i*>(c)));
-        _mm_store_si128(reinterpret_cast<__m128i*>(o[0]), r.c0);
-        _mm_store_si128(reinterpret_cast<__m128i*>(o[1]), r.c1);
-        _mm_store_si128(reinterpret_cast<__m128i*>(o[2]), r.c2);
-        for (int k = 0; k < 8; ++k) {
-          const Pixel8 got{SaturateU8(o[0][k]), SaturateU8(o[1][k]), SaturateU8(o[2][k])};
-          const Pixel8 want = scalar(a[k], b[k], c[k]);
-          if (!same(got, want)) FAIL() << name << " at " << a[k] << "," << b[k] << "," << c[k];
-        }
-      }
-}
-
-template <typename Scalar, typename Vec>
-ZEL_AVX2 void expectEightBitLanesAvx2(const char* name, Scalar scalar, Vec vec) {
-  alignas(32) int16_t in[3][16], o[3][16];
-  std::mt19937 rng(5);
-  for (int round = 0; round < 20000; ++round) {
-    for (auto& ch : in)
-      for (int16_t& v : ch) v = int16_t(rng() & 255);
-    const Lanes3x16 r = vec(_mm256_load_si256(reinterpret_cast<__m256i*>(in[0])),
-                            _mm256_load_si256(reinterpret_cast<__m256i*>(in[1])),
-                            _mm256_load_si256(reinterpret_cast<__m256i*>(in[2])));
-    _mm256_store_si256(reinterpret_cast<__m256i*>(o[0]), r.c0);
-    _mm256_store_si256(reinterpret_cast<__m256i*>(o[1]), r.c1);
-    _mm256_store_si256(reinterpret_cast<__m256i*>(o[2]), r.c2);
-    for (int k = 0; k < 16; ++k) {
-      const Pixel8 got{SaturateU8(o[0][k]), SaturateU8(o[1][k]), SaturateU8(o[2][k])};
-      if (!same(got, scalar(in[0][k], in[1][k], in[2][k]))) FAIL() << name << " lane " << k;
-    }
-  }
-}
+ZEL_LANE_FORM(ForwardLanes, rgbToYccLanes)
+ZEL_LANE_FORM(InverseLanes, yccToRgbLanes)
 
 TEST(PhotoYccForms, EightBitVectorFormsGiveTheScalarBits) {
-  using S = Pixel8 (*)(int, int, int);
-  using V = Lanes3 (*)(__m128i, __m128i, __m128i);
-  expectEightBitLanes("rgbToYccLanes", S(rgbToYccLanes), V(rgbToYccLanes));
-  expectEightBitLanes("yccToRgbLanes", S(yccToRgbLanes), V(yccToRgbLanes));
-  if (!hasAvx2()) return;
-  using X = Lanes3x16 (*)(__m256i, __m256i, __m256i);
-  expectEightBitLanesAvx2("rgbToYccLanes", S(rgbToYccLanes), X(rgbToYccLanes));
-  expectEightBitLanesAvx2("yccToRgbLanes", S(yccToRgbLanes), X(yccToRgbLanes));
+  std::vector<Triple> grid;
+  for (int x = 0; x < 256; x += 2)
+    for (int y = 0; y < 256; y += 3)
+      for (int z : {0, 1, 77, 128, 155, 156, 157, 200, 254, 255}) grid.push_back({x, y, z});
+  for (bool avx2 : vectorWidths()) {
+    expectLanesMatch("rgbToYccLanes", ForwardLanes{}, avx2, grid);
+    expectLanesMatch("yccToRgbLanes", InverseLanes{}, avx2, grid);
+  }
 }
 
 TEST(PhotoYccForms, FloatVectorFormsGiveTheScalarBits) {
@@ -345,9 +303,7 @@ TEST(PhotoYccMembers, SignedSixteenBitEveryWidth) { checkMembers(signedMembers()
 TEST(PhotoYccMembers, FloatEveryWidth) { checkMembers(floatMembers()); }
 
 TEST(PhotoYccMembers, EightBitKernelsAgreeOnBothVectorPaths) {
-  std::vector<Path> paths{Path::Sse41};
-  if (hasAvx2()) paths.push_back(Path::Avx2);
-  using Row = void (*)(const uint8_t*, uint8_t*, int, Path);
+  using Row = void (*)(const uint8_t*, uint8_t*, int, bool);
   // In the order of eightBitMembers().
   const struct {
     Row row;
@@ -355,7 +311,7 @@ TEST(PhotoYccMembers, EightBitKernelsAgreeOnBothVectorPaths) {
   } kernels[] = {{rgbToYcc8uRow<3>, 3}, {rgbToYcc8uRow<4>, 4}, {yccToRgb8uRow<3>, 3}, {yccToRgb8uRow<4>, 4}};
   const auto members = eightBitMembers();
   for (size_t k = 0; k < 4; ++k)
-    for (Path path : paths)
+    for (bool path : vectorWidths())
       for (int width : {3, 4, 5, 8, 12, 15, 16, 17, 20, 31, 32, 33, 36, 64, 67}) {
         TestImage<uint8_t> src(width * kernels[k].channels, 1, 1), dst(width * kernels[k].channels, 1, 5);
         src.fillRandom(uint32_t(width));

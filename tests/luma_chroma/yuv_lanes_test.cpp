@@ -6,20 +6,12 @@
 #include <vector>
 
 #include "luma_chroma/yuv_lanes.h"
+#include "luma_chroma/yuv_lane_check.h"
 
 namespace {
 
-using namespace zel;
-
-struct Triple {
-  int a, b, c;
-};
-
-std::string str(Pixel8 p) {
-  return std::to_string(p.c0) + "," + std::to_string(p.c1) + "," + std::to_string(p.c2);
-}
-std::string str(Triple t) { return std::to_string(t.a) + "," + std::to_string(t.b) + "," + std::to_string(t.c); }
-int packed(Pixel8 p) { return p.c0 << 16 | p.c1 << 8 | p.c2; }
+using namespace zel::lc;
+using namespace zel::lc::test;
 
 void expectPixel(Pixel8 got, Triple want, const std::string& what) {
   EXPECT_EQ(str(got), str(want)) << what;
@@ -95,87 +87,40 @@ const std::vector<Triple>& sampleTriples() {
   return all;
 }
 
-// Runs `vec` over eight (SSE) or sixteen (AVX2) triples at a time and checks
-// each lane, after the byte pack, against `scalar`.
-template <typename Scalar, typename Vec>
-void expectLanesMatch(const char* name, Scalar scalar, Vec vec) {
-  const std::vector<Triple>& triples = sampleTriples();
-  for (size_t i = 0; i < triples.size(); i += 8) {
-    alignas(16) int16_t a[8], b[8], c[8];
-    for (int k = 0; k < 8; ++k) {
-      a[k] = int16_t(triples[i + k].a);
-      b[k] = int16_t(triples[i + k].b);
-      c[k] = int16_t(triples[i + k].c);
-    }
-    const Lanes3 r = vec(_mm_load_si128(reinterpret_cast<const __m128i*>(a)),
-                         _mm_load_si128(reinterpret_cast<const __m128i*>(b)),
-                         _mm_load_si128(reinterpret_cast<const __m128i*>(c)));
-    alignas(16) uint8_t o0[16], o1[16], o2[16];
-    _mm_store_si128(reinterpret_cast<__m128i*>(o0), _mm_packus_epi16(r.c0, r.c0));
-    _mm_store_si128(reinterpret_cast<__m128i*>(o1), _mm_packus_epi16(r.c1, r.c1));
-    _mm_store_si128(reinterpret_cast<__m128i*>(o2), _mm_packus_epi16(r.c2, r.c2));
-    for (int k = 0; k < 8; ++k) {
-      const Triple& t = triples[i + k];
-      const Pixel8 want = scalar(t.a, t.b, t.c), got{o0[k], o1[k], o2[k]};
-      if (packed(got) != packed(want)) FAIL() << name << " at " << str(t) << ": " << str(got) << " for " << str(want);
-    }
-  }
-}
+ZEL_LANE_FORM(DifferenceRounded, yuvDifferenceRounded)
+ZEL_LANE_FORM(DifferenceTruncated, yuvDifferenceTruncated)
+ZEL_LANE_FORM(DifferenceLanes, yuvDifferenceLanes)
+ZEL_LANE_FORM(MatrixLanes, yuvMatrixLanes)
+ZEL_LANE_FORM(MatrixWide, yuvMatrixWide)
+ZEL_LANE_FORM(Lanes1, rgbLanes1)
+ZEL_LANE_FORM(Lanes2, rgbLanes2)
+ZEL_LANE_FORM(Lanes3, rgbLanes3)
 
-template <typename Scalar, typename Vec>
-ZEL_AVX2 void expectLanesMatchAvx2(const char* name, Scalar scalar, Vec vec) {
-  const std::vector<Triple>& triples = sampleTriples();
-  for (size_t i = 0; i < triples.size(); i += 16) {
-    alignas(32) int16_t a[16], b[16], c[16];
-    for (int k = 0; k < 16; ++k) {
-      a[k] = int16_t(triples[i + k].a);
-      b[k] = int16_t(triples[i + k].b);
-      c[k] = int16_t(triples[i + k].c);
-    }
-    const Lanes3x16 r = vec(_mm256_load_si256(reinterpret_cast<const __m256i*>(a)),
-                            _mm256_load_si256(reinterpret_cast<const __m256i*>(b)),
-                            _mm256_load_si256(reinterpret_cast<const __m256i*>(c)));
-    alignas(32) int16_t o[3][16];
-    _mm256_store_si256(reinterpret_cast<__m256i*>(o[0]), r.c0);
-    _mm256_store_si256(reinterpret_cast<__m256i*>(o[1]), r.c1);
-    _mm256_store_si256(reinterpret_cast<__m256i*>(o[2]), r.c2);
-    for (int k = 0; k < 16; ++k) {
-      const Triple& t = triples[i + k];
-      const Pixel8 got{SaturateU8(o[0][k]), SaturateU8(o[1][k]), SaturateU8(o[2][k])};
-      const Pixel8 want = scalar(t.a, t.b, t.c);
-      if (packed(got) != packed(want)) FAIL() << name << " at " << str(t) << ": " << str(got) << " for " << str(want);
-    }
+struct WideForm {
+  const RgbWideSet* set;
+  RgbRounding rounding;
+  Pixel8 scalar(int y, int u, int v) const { return rgbWide(*set, rounding, y, u, v); }
+  template <class U>
+  Trio<U> vec(const Trio<U>& t) const {
+    return rgbWide<U>(*set, rounding, t);
   }
-}
-
-using S = Pixel8 (*)(int, int, int);
-using V = Lanes3 (*)(__m128i, __m128i, __m128i);
-using X = Lanes3x16 (*)(__m256i, __m256i, __m256i);
+};
 
 TEST(YuvForms, VectorFormsGiveTheScalarBitsLaneByLane) {
-  expectLanesMatch("yuvDifferenceRounded", S(yuvDifferenceRounded), V(yuvDifferenceRounded));
-  expectLanesMatch("yuvDifferenceTruncated", S(yuvDifferenceTruncated), V(yuvDifferenceTruncated));
-  expectLanesMatch("yuvDifferenceLanes", S(yuvDifferenceLanes), V(yuvDifferenceLanes));
-  expectLanesMatch("yuvMatrixLanes", S(yuvMatrixLanes), V(yuvMatrixLanes));
-  expectLanesMatch("yuvMatrixWide", S(yuvMatrixWide), V(yuvMatrixWide));
-  expectLanesMatch("rgbLanes1", S(rgbLanes1), V(rgbLanes1));
-  expectLanesMatch("rgbLanes2", S(rgbLanes2), V(rgbLanes2));
-  expectLanesMatch("rgbLanes3", S(rgbLanes3), V(rgbLanes3));
-  const RgbRounding roundings[] = {{32768, 0, 32768}, {32768, 32768, 32768}, {0, 0, 0}};
-  for (const RgbWideSet* set : {&rgbWideA, &rgbWideB})
-    for (const RgbRounding& r : roundings)
-      expectLanesMatch(
-          "rgbWide", [&](int y, int u, int v) { return rgbWide(*set, r, y, u, v); },
-          [&](__m128i y, __m128i u, __m128i v) { return rgbWide(*set, r, y, u, v); });
-}
-
-TEST(YuvForms, Avx2FormsGiveTheScalarBitsLaneByLane) {
-  if (!hasAvx2()) GTEST_SKIP() << "no AVX2 on this processor";
-  expectLanesMatchAvx2("yuvDifferenceLanes", S(yuvDifferenceLanes), X(yuvDifferenceLanes));
-  expectLanesMatchAvx2("yuvMatrixLanes", S(yuvMatrixLanes), X(yuvMatrixLanes));
-  expectLanesMatchAvx2("rgbLanes1", S(rgbLanes1), X(rgbLanes1));
-  expectLanesMatchAvx2("rgbLanes2", S(rgbLanes2), X(rgbLanes2));
-  expectLanesMatchAvx2("rgbLanes3", S(rgbLanes3), X(rgbLanes3));
+  const std::vector<Triple>& t = sampleTriples();
+  for (bool avx2 : vectorWidths()) {
+    expectLanesMatch("yuvDifferenceRounded", DifferenceRounded{}, avx2, t);
+    expectLanesMatch("yuvDifferenceTruncated", DifferenceTruncated{}, avx2, t);
+    expectLanesMatch("yuvDifferenceLanes", DifferenceLanes{}, avx2, t);
+    expectLanesMatch("yuvMatrixLanes", MatrixLanes{}, avx2, t);
+    expectLanesMatch("yuvMatrixWide", MatrixWide{}, avx2, t);
+    expectLanesMatch("rgbLanes1", Lanes1{}, avx2, t);
+    expectLanesMatch("rgbLanes2", Lanes2{}, avx2, t);
+    expectLanesMatch("rgbLanes3", Lanes3{}, avx2, t);
+    const RgbRounding roundings[] = {{32768, 0, 32768}, {32768, 32768, 32768}, {0, 0, 0}};
+    for (const RgbWideSet* set : {&rgbWideA, &rgbWideB})
+      for (const RgbRounding& r : roundings) expectLanesMatch("rgbWide", WideForm{set, r}, avx2, t);
+  }
 }
 
 TEST(YuvForms, SubtractedGreenFloorsDifferentlyFromAddedNegatives) {

@@ -8,12 +8,15 @@
 
 #include "frame/image_layout.h"
 #include "luma_chroma/yuv_kernels.h"
+#include "luma_chroma/yuv_lane_check.h"
 #include "support/test_image.h"
 #include "zelcc/zelcc.h"
 
 namespace {
 
-using namespace zel;
+using namespace zel::lc;
+using zel::lc::test::vectorWidths;
+using zel::rowAt;
 using zel::test::TestImage;
 
 using Form = Pixel8 (*)(int, int, int);
@@ -47,7 +50,7 @@ struct Member {
   Form body, tail;
   Runner run;
   // The same conversion row by row through the row kernel on a given path.
-  std::function<void(const Call&, int y, Path)> row;
+  std::function<void(const Call&, int y, bool)> row;
   int alpha = -1;  // value of a C4 destination's fourth byte
 };
 
@@ -72,36 +75,36 @@ std::vector<Member> members() {
   return {
       {"zeliRGBToYUV_8u_C3R", C3, C3, 16, yuvMatrixLanes, yuvDifferenceTruncated,
        [](const Call& c) { return zeliRGBToYUV_8u_C3R(c.src[0], c.srcStep, c.dst[0], c.dstStep, c.size); },
-       [=](const Call& c, int y, Path p) { rgbToYuvC3Row(s0(c, y), d0(c, y), c.size.width, p); }},
+       [=](const Call& c, int y, bool p) { rgbToYuvC3Row(s0(c, y), d0(c, y), c.size.width, p); }},
       {"zeliRGBToYUV_8u_C3P3R", C3, P3, 8, yuvMatrixLanes, yuvDifferenceTruncated,
        [](const Call& c) { return zeliRGBToYUV_8u_C3P3R(c.src[0], c.srcStep, c.dst.data(), c.dstStep, c.size); },
-       [=](const Call& c, int y, Path p) { rgbToYuvC3P3Row(s0(c, y), dPlanes(c, y).data(), c.size.width, p); }},
+       [=](const Call& c, int y, bool p) { rgbToYuvC3P3Row(s0(c, y), dPlanes(c, y).data(), c.size.width, p); }},
       {"zeliRGBToYUV_8u_P3R", P3, P3, 16, yuvMatrixLanes, yuvMatrixWide,
        [](const Call& c) { return zeliRGBToYUV_8u_P3R(c.src.data(), c.srcStep, c.dst.data(), c.dstStep, c.size); },
-       [=](const Call& c, int y, Path p) {
+       [=](const Call& c, int y, bool p) {
          rgbToYuvP3Row(sPlanes(c, y).data(), dPlanes(c, y).data(), c.size.width, p);
        }},
       {"zeliRGBToYUV_8u_AC4R", C4, C4, 0, nullptr, yuvDifferenceRounded,
        [](const Call& c) { return zeliRGBToYUV_8u_AC4R(c.src[0], c.srcStep, c.dst[0], c.dstStep, c.size); },
-       [=](const Call& c, int y, Path p) { rgbToYuvAC4Row(s0(c, y), d0(c, y), c.size.width, p); }},
+       [=](const Call& c, int y, bool p) { rgbToYuvAC4Row(s0(c, y), d0(c, y), c.size.width, p); }},
       {"zeliRGBToYUV_8u_AC4P4R", C4, P4, 8, yuvDifferenceLanes, yuvDifferenceRounded,
        [](const Call& c) { return zeliRGBToYUV_8u_AC4P4R(c.src[0], c.srcStep, c.dst.data(), c.dstStep, c.size); },
-       [=](const Call& c, int y, Path p) { rgbToYuvAC4P4Row(s0(c, y), dPlanes(c, y).data(), c.size.width, p); }},
+       [=](const Call& c, int y, bool p) { rgbToYuvAC4P4Row(s0(c, y), dPlanes(c, y).data(), c.size.width, p); }},
       {"zeliYUVToRGB_8u_C3R", C3, C3, 8, rgbLanes1, wideAGreenTruncated,
        [](const Call& c) { return zeliYUVToRGB_8u_C3R(c.src[0], c.srcStep, c.dst[0], c.dstStep, c.size); },
-       [=](const Call& c, int y, Path p) { yuvToRgbC3Row(s0(c, y), d0(c, y), c.size.width, p); }},
+       [=](const Call& c, int y, bool p) { yuvToRgbC3Row(s0(c, y), d0(c, y), c.size.width, p); }},
       {"zeliYUVToRGB_8u_AC4R", C4, C4, 0, nullptr, wideAGreenTruncated,
        [](const Call& c) { return zeliYUVToRGB_8u_AC4R(c.src[0], c.srcStep, c.dst[0], c.dstStep, c.size); },
-       [=](const Call& c, int y, Path p) { yuvToRgbAC4Row(s0(c, y), d0(c, y), c.size.width, p); }},
+       [=](const Call& c, int y, bool p) { yuvToRgbAC4Row(s0(c, y), d0(c, y), c.size.width, p); }},
       {"zeliYUVToRGB_8u_C3C4R", C3, C4, 8, rgbLanes3, wideARounded,
        [](const Call& c) { return zeliYUVToRGB_8u_C3C4R(c.src[0], c.srcStep, c.dst[0], c.dstStep, c.size, 201); },
-       [=](const Call& c, int y, Path p) { yuvToRgbC3C4Row(s0(c, y), d0(c, y), c.size.width, 201, p); }, 201},
+       [=](const Call& c, int y, bool p) { yuvToRgbC3C4Row(s0(c, y), d0(c, y), c.size.width, 201, p); }, 201},
       {"zeliYUVToRGB_8u_P3C3R", P3, C3, 16, rgbLanes2, wideBTruncated,
        [](const Call& c) { return zeliYUVToRGB_8u_P3C3R(c.src.data(), c.srcStep, c.dst[0], c.dstStep, c.size); },
-       [=](const Call& c, int y, Path p) { yuvToRgbP3C3Row(sPlanes(c, y).data(), d0(c, y), c.size.width, p); }},
+       [=](const Call& c, int y, bool p) { yuvToRgbP3C3Row(sPlanes(c, y).data(), d0(c, y), c.size.width, p); }},
       {"zeliYUVToRGB_8u_P3R", P3, P3, 0, nullptr, wideBTruncated,
        [](const Call& c) { return zeliYUVToRGB_8u_P3R(c.src.data(), c.srcStep, c.dst.data(), c.dstStep, c.size); },
-       [=](const Call& c, int y, Path p) {
+       [=](const Call& c, int y, bool p) {
          yuvToRgbP3Row(sPlanes(c, y).data(), dPlanes(c, y).data(), c.size.width, p);
        }},
   };
@@ -123,7 +126,7 @@ struct Images {
     for (auto& d : dst) c.dst.push_back(d.data());
     return c;
   }
-  Sample3 pixel(const Member& m, int x, int y) const {
+  Samples3 pixel(const Member& m, int x, int y) const {
     if (m.in.planar) return {src[0].get(x, y), src[1].get(x, y), src[2].get(x, y)};
     const int n = m.in.count;
     return {src[0].get(n * x, y), src[0].get(n * x + 1, y), src[0].get(n * x + 2, y)};
@@ -153,7 +156,7 @@ void checkMember(const Member& m, int width, int height, int offset, int pad,
   const int body = m.block ? width & ~(m.block - 1) : 0;
   for (int y = 0; y < height; ++y)
     for (int x = 0; x < width; ++x) {
-      const Sample3 s = img.pixel(m, x, y);
+      const Samples3 s = img.pixel(m, x, y);
       const Pixel8 want = (x < body ? m.body : m.tail)(s.c0, s.c1, s.c2);
       ASSERT_EQ(str(img.result(m, x, y)), str(want))
           << m.name << " width " << width << " pixel " << x << "," << y << (x < body ? " (body)" : " (tail)");
@@ -178,10 +181,8 @@ TEST(YuvMembers, EveryWidthTakesItsZonesForms) {
 }
 
 TEST(YuvMembers, RowKernelsAgreeOnBothVectorPaths) {
-  std::vector<Path> paths{Path::Sse41};
-  if (hasAvx2()) paths.push_back(Path::Avx2);
   for (const Member& m : members())
-    for (Path path : paths)
+    for (bool path : vectorWidths())
       for (int width : {1, 7, 8, 9, 15, 16, 17, 24, 31, 32, 33, 47, 48, 64, 70})
         for (int offset : {1, 6})
           checkMember(m, width, 3, offset, 2, [&](const Call& c) {
