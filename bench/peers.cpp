@@ -62,6 +62,39 @@ using PeerFactory = std::function<std::vector<Peer>()>;
 
 const std::map<std::string, PeerFactory>& table() {
   static const std::map<std::string, PeerFactory> t = {
+      {"zeliCFAToRGB_8u_C1C3R",
+       [] {
+         std::vector<Peer> p;
+#ifdef ZELCC_BENCH_OPENCV
+         p.push_back(cvtColorPeer("OpenCV cvtColor BayerBG2RGB", CV_8UC1, CV_8UC3, cv::COLOR_BayerBG2RGB));
+#endif
+         return p;
+       }},
+      {"zeliCFAToRGB_16u_C1C3R",
+       [] {
+         std::vector<Peer> p;
+#ifdef ZELCC_BENCH_OPENCV
+         p.push_back(cvtColorPeer("OpenCV cvtColor BayerBG2RGB", CV_16UC1, CV_16UC3, cv::COLOR_BayerBG2RGB));
+#endif
+         return p;
+       }},
+      {"zeliDemosaicAHD_8u_C1C3R",
+       [] {
+         std::vector<Peer> p;
+#ifdef ZELCC_BENCH_OPENCV
+         p.push_back(cvtColorPeer("OpenCV cvtColor BayerBG2RGB_EA", CV_8UC1, CV_8UC3, cv::COLOR_BayerBG2RGB_EA));
+         p.push_back(cvtColorPeer("OpenCV cvtColor BayerBG2RGB_VNG", CV_8UC1, CV_8UC3, cv::COLOR_BayerBG2RGB_VNG));
+#endif
+         return p;
+       }},
+      {"zeliDemosaicAHD_16u_C1C3R",
+       [] {
+         std::vector<Peer> p;
+#ifdef ZELCC_BENCH_OPENCV
+         p.push_back(cvtColorPeer("OpenCV cvtColor BayerBG2RGB_EA", CV_16UC1, CV_16UC3, cv::COLOR_BayerBG2RGB_EA));
+#endif
+         return p;
+       }},
       {"zeliGrayToRGB_8u_C1C3R",
        [] {
          std::vector<Peer> p;

@@ -20,7 +20,6 @@ namespace {
 
 using namespace zel::lc;
 using namespace zel::lc::test;
-using zel::SaturateU8;
 using zel::lc::test::str;
 using zel::test::TestImage;
 
