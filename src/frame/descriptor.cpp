@@ -233,6 +233,9 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       d.srcStepInBytes = word != "samplesteps";
     } else if (word == "alphawritten") {
       d.writesAlpha = true;
+    } else if (word.rfind("planestested=", 0) == 0) {
+      // Only the first N entries of a plane array are tested for null.
+      d.testedPlanes = std::atoi(word.c_str() + 13);
     } else if (word == "frame") {
       d.frameSource = true;
     } else if (word.rfind("scratch=", 0) == 0) {
@@ -271,6 +274,10 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
   for (const std::string& o : order) {
     if (o == "null") d.order.push_back({Check::NullTop});
     else if (o == "planes") d.order.push_back({Check::NullPlanes});
+    // The entries of one side's plane array, where the two sides are tested
+    // apart.
+    else if (o == "srcplanes") d.order.push_back({Check::NullPlanes, -1, 0});
+    else if (o == "dstplanes") d.order.push_back({Check::NullPlanes, -1, 1});
     else if (o == "size") d.order.push_back({Check::Size});
     else if (o == "positive") d.order.push_back({Check::SizePositive});
     else if (o == "step") d.order.push_back({Check::Step});

@@ -66,6 +66,7 @@ enum class Check { NullTop, NullPlanes, SizePositive, Size, Step, Extra };
 struct CheckStage {
   Check check;
   int extra = -1;  // for Check::Extra
+  int side = -1;   // for Check::NullPlanes: 0 source, 1 destination, -1 every plane array
 };
 
 // Argument roles in prototype order.
@@ -106,6 +107,7 @@ struct Descriptor {
   bool warnsOdd = false;        // may return StatusOddSizeWarning
   bool writesAlpha = false;     // an AC4 destination's fourth channel is written
   bool checksSteps = false;
+  int testedPlanes = 0;       // plane entries tested for null per array; 0: all
   bool stepsInSamples = false;  // byte steps are cut down to whole samples
   bool srcStepInBytes = false;  // ... except the source's
   // The source is a frame given with a region (the whole frame in a

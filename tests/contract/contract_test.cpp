@@ -68,9 +68,10 @@ std::vector<Failure> failuresOf(const Descriptor& d, const CheckStage& stage) {
     case Check::NullPlanes:
       for (const ArgSlot& s : d.slots) {
         const int side = s.role == Role::SrcPlanes ? 0 : s.role == Role::DstPlanes ? 1 : s.role == Role::SrcDstPlanes ? 2 : -1;
-        if (side < 0) continue;
+        if (side < 0 || (stage.side >= 0 && stage.side != side)) continue;
         const Side& sd = side == 1 ? d.dst : d.src;
-        for (int k = 0; k < sd.planes(); ++k)
+        const int tested = d.testedPlanes > 0 ? std::min(d.testedPlanes, sd.planes()) : sd.planes();
+        for (int k = 0; k < tested; ++k)
           out.push_back({"null plane " + std::to_string(k) + " of side " + std::to_string(side), StatusNullPointerError,
                          [side, k](Workspace& w, std::vector<Arg>&, ImageSize&) { w.planeArray(side)[k] = nullptr; }});
       }
