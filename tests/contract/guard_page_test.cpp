@@ -81,17 +81,14 @@ void sweep(const Descriptor& d, Fence fence, int stepSign) {
   }
 }
 
+// Where steps are taken unchecked, also with negative steps: the first row
+// lies highest, its end meets the page after and the last row's start the
+// page before.
 TEST_P(GuardPages, TouchesNothingPastEitherEnd) {
   const Descriptor& d = *GetParam();
   sweep(d, Fence::After, 1);
   sweep(d, Fence::Before, 1);
-}
-
-// With negative steps the first row lies highest: its end meets the page
-// after, the last row's start the page before.
-TEST_P(GuardPages, NegativeStepsTouchNothingPastEitherEnd) {
-  const Descriptor& d = *GetParam();
-  if (d.checksSteps || !d.region) GTEST_SKIP() << "checks its steps or has none";
+  if (d.checksSteps || !d.region) return;
   sweep(d, Fence::After, -1);
   sweep(d, Fence::Before, -1);
 }
