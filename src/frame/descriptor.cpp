@@ -1,6 +1,7 @@
 #include "frame/descriptor.h"
 
 #include <algorithm>
+#include <cmath>
 #include <cstring>
 #include <map>
 #include <random>
@@ -717,7 +718,7 @@ std::vector<Arg> Workspace::arguments(const std::vector<double>* extraValues) {
         }
         const double v = extraValues ? (*extraValues)[s.extra] : e.good;
         a.f = v;
-        a.i = int64_t(v);
+        a.i = std::isfinite(v) ? int64_t(v) : 0;  // a NaN only a float parameter takes
         args.push_back(a);
         break;
       }
