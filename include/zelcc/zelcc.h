@@ -237,6 +237,136 @@ ZELCC_API Status zeliYCrCb420ToBGR_Filter_8u_P3C4R(const uint8_t* const src[3], 
                                                    int dstStep, ImageSize size, uint8_t alpha);
 
 /* ---- 16-bit packed RGB ---- */
+/* Writers: each colour reduced to its field by truncation or, in the Dither
+ * names, by a 4 x 4 ordered dither counted from the region's corner. The
+ * destination step is taken as whole 16-bit words (an odd step loses its
+ * low bit). Plane sources take one step per plane. */
+ZELCC_API Status zeliBGRToBGR565_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToRGB565_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr411ToBGR555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr411ToBGR565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR444_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB444_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR444Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR555Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR565Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB444Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB555Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB565Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR444_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR555_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR565_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB444_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB555_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB565_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR444Dither_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR555Dither_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR565Dither_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB444Dither_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB555Dither_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB565Dither_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR444_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB444_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR444Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR555Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR565Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB444Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB555Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB565Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR444_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR555_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR565_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB444_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB555_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB565_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR444Dither_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR555Dither_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR565Dither_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB444Dither_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB555Dither_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB565Dither_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR444_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToRGB444_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToRGB555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToRGB565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR444Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR555Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR565Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToRGB444Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToRGB555Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToRGB565Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToBGR444_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToBGR555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToBGR565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB444_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToBGR444Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToBGR555Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToBGR565Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB444Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB555Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB565Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+    int dstStep, ImageSize size);
 
 /* ---- YCoCg ---- */
 /* Interleaved BGR (RGB for the byte-plane pair) to and from planes Y, Co, Cg

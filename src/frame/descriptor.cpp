@@ -231,6 +231,8 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       // with =dst the source's step stays a byte count.
       d.stepsInSamples = true;
       d.srcStepInBytes = word != "samplesteps";
+    } else if (word == "onecolumnbytes") {
+      d.oneColumnBytes = true;
     } else if (word == "alphawritten") {
       d.writesAlpha = true;
     } else if (word.rfind("planestested=", 0) == 0) {
@@ -384,6 +386,10 @@ bool describe(const std::string& name, const std::string& extras, Descriptor& d,
   }
   describeFormat(srcFormat, d.src);
   describeFormat(dstFormat, d.dst);
+  // Planes converted to or from packed words take a step per plane, at full
+  // resolution too.
+  if (d.dst.packedWord) d.src.planeSteps = true;
+  if (d.src.packedWord) d.dst.planeSteps = true;
 
   if (!parseExtras(extras, d, error)) return false;
 
@@ -481,6 +487,10 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
       b.step = b.geometry.rowBytes + padBytes;
       const bool inSamples = d.stepsInSamples && !(sideIndex == 0 && d.srcStepInBytes);
       b.pitch = inSamples ? b.step / b.geometry.sampleBytes * b.geometry.sampleBytes : b.step;
+      if (d.oneColumnBytes && sideIndex == 1 && size.width == 1) {
+        b.geometry.rowBytes = 3;
+        b.pitch = b.step >> 1;
+      }
       const int rows = std::max(b.geometry.rows, 1);
       const size_t total = size_t(kGuard) * 2 + size_t(offset) + size_t(b.step) * rows + 64;
       b.bytes.assign(total, kGuardByte);
