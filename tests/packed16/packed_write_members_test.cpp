@@ -108,25 +108,6 @@ TEST(PackedWriters, BothNamesOf565PackingAreOneFunction) {
   EXPECT_EQ(word, 0x083F);
 }
 
-TEST(PackedWriters, BgrAndRgbNamesTradeTheOuterFields) {
-  for (const char* pattern : {"zeliYCbCr422To%s_8u16u_P3C3R", "zeliYUV420To%sDither_8u16u_P3C3R"})
-    for (const char* fields : {"444", "555", "565"}) {
-      char bgr[64], rgb[64];
-      std::snprintf(bgr, sizeof bgr, pattern, (std::string("BGR") + fields).c_str());
-      std::snprintf(rgb, sizeof rgb, pattern, (std::string("RGB") + fields).c_str());
-      Call a(member(bgr), 13, 3, 3, 1, 5), b(member(rgb), 13, 3, 3, 1, 5);
-      a.callPublic();
-      b.callPublic();
-      const int low = fields[0] == '4' ? 4 : 5, high = fields[0] == '4' ? 8 : fields[1] == '6' ? 11 : 10;
-      const int mask = (1 << low) - 1;
-      for (int x = 0; x < 13; ++x) {
-        const int wa = a.dst.get(x, 2), wb = b.dst.get(x, 2);
-        EXPECT_EQ(wa & mask, (wb >> high) & mask) << bgr << " " << x;
-        EXPECT_EQ((wa >> high) & mask, wb & mask) << bgr << " " << x;
-      }
-    }
-}
-
 // A pixel whose lane form and last-pixel form differ in their words:
 // placed at column `x`, it takes the lane form at `bodyWidth` and the other
 // form at `tailWidth`.
