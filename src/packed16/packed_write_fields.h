@@ -1,55 +1,23 @@
-// Field layouts of the 16-bit packed words the writers produce, and the two
-// ways an 8-bit colour is reduced to its field: truncation of the low bits,
-// or the 4 x 4 ordered dither.
-//
-// A layout's name lists its channels from the least significant field up:
-// BGR565 has blue in bits 0-4, RGB565 red. One writer serves both names: with
-// `redHigh` (the BGR names) red goes into the top field and blue into the
-// low one, otherwise the other way round. Green always sits in the middle.
-// Unused top bits (bit 15 of 555, bits 12-15 of 444) are written zero.
+// The two ways the packed writers reduce an 8-bit colour to its field:
+// truncation of the low bits, or the 4 x 4 ordered dither. Field layouts,
+// their order and `redHigh` are those of packed_fields.h: with `redHigh`
+// (the BGR names) red goes into the top field, otherwise into the low one;
+// green always sits in the middle.
 #pragma once
 
 #include <cstdint>
 
 #include "packed16/packed_dither_matrix.h"
+#include "packed16/packed_fields.h"
 
 namespace zel::p16 {
 
 enum class Packing { P444, P555, P565 };
 
-// Field widths and positions: low field at bit 0, green at kGreenShift, the
-// top field at kHighShift.
-template <Packing P>
-struct Fields;
-template <>
-struct Fields<Packing::P565> {
-  static constexpr int kLowBits = 5, kGreenBits = 6, kHighBits = 5, kGreenShift = 5, kHighShift = 11;
-};
-template <>
-struct Fields<Packing::P555> {
-  static constexpr int kLowBits = 5, kGreenBits = 5, kHighBits = 5, kGreenShift = 5, kHighShift = 10;
-};
-template <>
-struct Fields<Packing::P444> {
-  static constexpr int kLowBits = 4, kGreenBits = 4, kHighBits = 4, kGreenShift = 4, kHighShift = 8;
-};
-
-// Three 8-bit colours of one pixel.
-struct Rgb {
-  int r, g, b;
-};
-
-template <Packing P>
-inline uint16_t assembleWord(int low, int green, int high) {
-  using F = Fields<P>;
-  return static_cast<uint16_t>(low | (green << F::kGreenShift) | (high << F::kHighShift));
-}
-
-// Truncation: the low 8 - bits bits of the colour are dropped.
-template <int Bits>
-inline int truncateToField(int c) {
-  return c >> (8 - Bits);
-}
+using packed::Layout444;
+using packed::Layout555;
+using packed::Layout565;
+using packed::Rgb;
 
 // ---- ordered dither ----
 
@@ -95,29 +63,23 @@ inline int ditherToField(int c, int threshold) {
 // ---- the two reductions as word writers ----
 
 // Each takes the colours of a pixel at (x, y) of the region and returns its
-// word; `lanes<U>(y)` gives the same for a vector block of row y.
-template <Packing P>
+// word in layout L (Layout444, Layout555, Layout565).
+template <class L>
 struct Truncating {
   static constexpr bool kDither = false;
   bool redHigh;
-  uint16_t word(const Rgb& c, int, int) const {
-    using F = Fields<P>;
-    const int low = redHigh ? c.b : c.r, high = redHigh ? c.r : c.b;
-    return assembleWord<P>(truncateToField<F::kLowBits>(low), truncateToField<F::kGreenBits>(c.g),
-                           truncateToField<F::kHighBits>(high));
-  }
+  uint16_t word(const Rgb& c, int, int) const { return packed::packRgb<L>(c.r, c.g, c.b, redHigh); }
 };
 
-template <Packing P>
+template <class L>
 struct Dithering {
   static constexpr bool kDither = true;
   bool redHigh;
   uint16_t word(const Rgb& c, int x, int y) const {
-    using F = Fields<P>;
-    const int low = redHigh ? c.b : c.r, high = redHigh ? c.r : c.b;
-    return assembleWord<P>(ditherToField<F::kLowBits>(low, ditherThreshold<F::kLowBits>(x, y)),
-                           ditherToField<F::kGreenBits>(c.g, ditherThreshold<F::kGreenBits>(x, y)),
-                           ditherToField<F::kHighBits>(high, ditherThreshold<F::kHighBits>(x, y)));
+    const int low = redHigh ? c.b : c.r, top = redHigh ? c.r : c.b;
+    return static_cast<uint16_t>(ditherToField<L::kLowBits>(low, ditherThreshold<L::kLowBits>(x, y)) |
+                                 (ditherToField<L::kMidBits>(c.g, ditherThreshold<L::kMidBits>(x, y)) << L::kMidShift) |
+                                 (ditherToField<L::kTopBits>(top, ditherThreshold<L::kTopBits>(x, y)) << L::kTopShift));
   }
 };
 

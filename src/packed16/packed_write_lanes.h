@@ -239,38 +239,35 @@ inline typename U::V ditherLanes(typename U::V c, typename U::V threshold) {
   return U::sub16(q, U::greater16(distance, threshold));
 }
 
-template <class U, Packing P>
-inline typename U::V assembleLanes(typename U::V low, typename U::V green, typename U::V high) {
-  using F = Fields<P>;
-  return U::or_(U::or_(low, U::template sll16<F::kGreenShift>(green)), U::template sll16<F::kHighShift>(high));
+template <class U, class L>
+inline typename U::V assembleLanes(typename U::V low, typename U::V mid, typename U::V top) {
+  return U::or_(U::or_(low, U::template sll16<L::kMidShift>(mid)), U::template sll16<L::kTopShift>(top));
 }
 
 // The word writer of one row: Truncating or Dithering, for unit U.
 template <class U, class Pack>
 struct RowWords;
 
-template <class U, Packing P>
-struct RowWords<U, Truncating<P>> {
-  using F = Fields<P>;
-  RowWords(const Truncating<P>&, int) {}
-  typename U::V operator()(typename U::V low, typename U::V green, typename U::V high) const {
-    return assembleLanes<U, P>(truncateLanes<U, F::kLowBits>(low), truncateLanes<U, F::kGreenBits>(green),
-                               truncateLanes<U, F::kHighBits>(high));
+template <class U, class L>
+struct RowWords<U, Truncating<L>> {
+  RowWords(const Truncating<L>&, int) {}
+  typename U::V operator()(typename U::V low, typename U::V mid, typename U::V top) const {
+    return assembleLanes<U, L>(truncateLanes<U, L::kLowBits>(low), truncateLanes<U, L::kMidBits>(mid),
+                               truncateLanes<U, L::kTopBits>(top));
   }
 };
 
-template <class U, Packing P>
-struct RowWords<U, Dithering<P>> {
-  using F = Fields<P>;
-  typename U::V outer, green;  // thresholds of the low and top fields, and of green
-  RowWords(const Dithering<P>&, int y) {
-    const int16_t* row = F::kLowBits == 4 ? kDitherMatrix4[y & 3] : kDitherMatrix5[y & 3];
+template <class U, class L>
+struct RowWords<U, Dithering<L>> {
+  typename U::V outer, mid;  // thresholds of the low and top fields, and of green
+  RowWords(const Dithering<L>&, int y) {
+    const int16_t* row = L::kLowBits == 4 ? kDitherMatrix4[y & 3] : kDitherMatrix5[y & 3];
     outer = U::repeated(repeat4(row, 0));
-    green = U::repeated(repeat4(row, F::kGreenBits == 6 ? 1 : 0));
+    mid = U::repeated(repeat4(row, L::kMidBits == 6 ? 1 : 0));
   }
-  typename U::V operator()(typename U::V low, typename U::V g, typename U::V high) const {
-    return assembleLanes<U, P>(ditherLanes<U, F::kLowBits>(low, outer), ditherLanes<U, F::kGreenBits>(g, green),
-                               ditherLanes<U, F::kHighBits>(high, outer));
+  typename U::V operator()(typename U::V low, typename U::V g, typename U::V top) const {
+    return assembleLanes<U, L>(ditherLanes<U, L::kLowBits>(low, outer), ditherLanes<U, L::kMidBits>(g, mid),
+                               ditherLanes<U, L::kTopBits>(top, outer));
   }
 };
 
@@ -283,8 +280,8 @@ inline int wordBlocks(const Src& src, const Form& form, const Pack& pack, int y,
   const RowWords<U, Pack> words(pack, y);
   for (; x + U::kWords <= end; x += U::kWords) {
     const Trio<U> c = form.template lanes<U>(src.template block<U>(x));
-    const typename U::V low = pack.redHigh ? c.c2 : c.c0, high = pack.redHigh ? c.c0 : c.c2;
-    U::storeWords(dst + x, words(low, c.c1, high));
+    const typename U::V low = pack.redHigh ? c.c2 : c.c0, top = pack.redHigh ? c.c0 : c.c2;
+    U::storeWords(dst + x, words(low, c.c1, top));
   }
   return x;
 }

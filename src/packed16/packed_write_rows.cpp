@@ -15,16 +15,16 @@ template <class Fn>
 void withWords(PackedTarget t, bool dither, Fn&& fn) {
   switch (t.packing) {
     case Packing::P444:
-      if (dither) fn(Dithering<Packing::P444>{t.redHigh});
-      else fn(Truncating<Packing::P444>{t.redHigh});
+      if (dither) fn(Dithering<Layout444>{t.redHigh});
+      else fn(Truncating<Layout444>{t.redHigh});
       break;
     case Packing::P555:
-      if (dither) fn(Dithering<Packing::P555>{t.redHigh});
-      else fn(Truncating<Packing::P555>{t.redHigh});
+      if (dither) fn(Dithering<Layout555>{t.redHigh});
+      else fn(Truncating<Layout555>{t.redHigh});
       break;
     case Packing::P565:
-      if (dither) fn(Dithering<Packing::P565>{t.redHigh});
-      else fn(Truncating<Packing::P565>{t.redHigh});
+      if (dither) fn(Dithering<Layout565>{t.redHigh});
+      else fn(Truncating<Layout565>{t.redHigh});
       break;
   }
 }
@@ -154,7 +154,7 @@ void yuv420ToWords(const uint8_t* const planes[3], const int steps[3], WordRows 
 }
 
 void bytesTo565Words(const uint8_t* src, int srcStep, WordRows dst, ImageSize size, bool avx2) {
-  const Truncating<Packing::P565> pack{false};
+  const Truncating<Layout565> pack{false};
   plainWalk(size.height, [&](int y) {
     formRun(Triples{rowAt(src, srcStep, y)}, SameBytes{}, pack, y, dst.row(y), size.width, avx2);
   });

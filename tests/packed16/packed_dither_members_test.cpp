@@ -91,8 +91,8 @@ TEST(PackedDither, LoneLastPairPixelTakesTheByteAfterItsLuma) {
   ASSERT_EQ(int(zeliYCbCr422ToRGB565Dither_8u16u_C2C3R(src, 6, dither, 6, {3, 1})), int(StatusOk));
   ASSERT_EQ(int(zeliYCbCr422ToRGB565_8u16u_C2C3R(src, 6, plain, 6, {3, 1})), int(StatusOk));
   const Rgb d = ycbcrLaneForm(150, 40, 40), p = ycbcrTruncatedForm(150, 40, 200);
-  EXPECT_EQ(dither[2], Dithering<Packing::P565>{false}.word(d, 2, 0));
-  EXPECT_EQ(plain[2], Truncating<Packing::P565>{false}.word(p, 2, 0));
+  EXPECT_EQ(dither[2], Dithering<Layout565>{false}.word(d, 2, 0));
+  EXPECT_EQ(plain[2], Truncating<Layout565>{false}.word(p, 2, 0));
   EXPECT_NE(dither[2] & 0x1F, plain[2] & 0x1F) << "red follows the Cr that was read";
 }
 

@@ -13,29 +13,29 @@ namespace {
 
 using namespace zel::p16;
 
-template <Packing P>
+template <class L>
 uint16_t truncated(bool redHigh, int r, int g, int b) {
-  return Truncating<P>{redHigh}.word({r, g, b}, 0, 0);
+  return Truncating<L>{redHigh}.word({r, g, b}, 0, 0);
 }
 
 TEST(PackedFields, NamesListTheFieldsFromTheLowBitsUp) {
   // Pure red, green and blue at full strength, BGR names then RGB names.
-  EXPECT_EQ(truncated<Packing::P565>(true, 255, 0, 0), 0xF800);
-  EXPECT_EQ(truncated<Packing::P565>(false, 255, 0, 0), 0x001F);
-  EXPECT_EQ(truncated<Packing::P565>(true, 0, 255, 0), 0x07E0);
-  EXPECT_EQ(truncated<Packing::P565>(false, 0, 0, 255), 0xF800);
-  EXPECT_EQ(truncated<Packing::P555>(true, 255, 0, 0), 0x7C00);
-  EXPECT_EQ(truncated<Packing::P555>(false, 255, 0, 0), 0x001F);
-  EXPECT_EQ(truncated<Packing::P555>(true, 0, 255, 0), 0x03E0);
-  EXPECT_EQ(truncated<Packing::P555>(true, 255, 255, 255), 0x7FFF);
-  EXPECT_EQ(truncated<Packing::P444>(true, 255, 0, 0), 0x0F00);
-  EXPECT_EQ(truncated<Packing::P444>(false, 255, 0, 0), 0x000F);
-  EXPECT_EQ(truncated<Packing::P444>(true, 0, 255, 0), 0x00F0);
-  EXPECT_EQ(truncated<Packing::P444>(false, 255, 255, 255), 0x0FFF);
+  EXPECT_EQ(truncated<Layout565>(true, 255, 0, 0), 0xF800);
+  EXPECT_EQ(truncated<Layout565>(false, 255, 0, 0), 0x001F);
+  EXPECT_EQ(truncated<Layout565>(true, 0, 255, 0), 0x07E0);
+  EXPECT_EQ(truncated<Layout565>(false, 0, 0, 255), 0xF800);
+  EXPECT_EQ(truncated<Layout555>(true, 255, 0, 0), 0x7C00);
+  EXPECT_EQ(truncated<Layout555>(false, 255, 0, 0), 0x001F);
+  EXPECT_EQ(truncated<Layout555>(true, 0, 255, 0), 0x03E0);
+  EXPECT_EQ(truncated<Layout555>(true, 255, 255, 255), 0x7FFF);
+  EXPECT_EQ(truncated<Layout444>(true, 255, 0, 0), 0x0F00);
+  EXPECT_EQ(truncated<Layout444>(false, 255, 0, 0), 0x000F);
+  EXPECT_EQ(truncated<Layout444>(true, 0, 255, 0), 0x00F0);
+  EXPECT_EQ(truncated<Layout444>(false, 255, 255, 255), 0x0FFF);
   // Truncation: the low bits go, nothing rounds.
-  EXPECT_EQ(truncated<Packing::P565>(false, 7, 3, 0), 0);
-  EXPECT_EQ(truncated<Packing::P565>(false, 8, 4, 0), 0x0021);
-  EXPECT_EQ(truncated<Packing::P444>(false, 15, 16, 0), 0x0010);
+  EXPECT_EQ(truncated<Layout565>(false, 7, 3, 0), 0);
+  EXPECT_EQ(truncated<Layout565>(false, 8, 4, 0), 0x0021);
+  EXPECT_EQ(truncated<Layout444>(false, 15, 16, 0), 0x0010);
 }
 
 TEST(PackedFields, OrderedDitherThresholds) {
@@ -56,7 +56,7 @@ TEST(PackedFields, OrderedDitherThresholds) {
     }
   // One threshold serves the three fields of a pixel: 254 lies 1874 above
   // level 30 of a 5-bit field and 792 above level 62 of the 6-bit green.
-  const Dithering<Packing::P565> bgr{true};
+  const Dithering<Layout565> bgr{true};
   EXPECT_EQ(bgr.word({254, 254, 254}, 2, 1), (30 << 11) | (62 << 5) | 30);  // T 1957, T / 2 978
   EXPECT_EQ(bgr.word({254, 254, 254}, 0, 1), (31 << 11) | (62 << 5) | 31);  // T 1678, T / 2 839
   EXPECT_EQ(bgr.word({254, 254, 254}, 0, 0), 0xFFFF);
@@ -121,14 +121,14 @@ void expectLanesMatch(const Form& form, const Pack& pack, const char* what) {
 
 TEST(PackedForms, VectorLanesMatchTheScalarForms) {
   for (bool high : {false, true}) {
-    expectLanesMatch(YCbCrLanes{}, Truncating<Packing::P565>{high}, "YCbCr 565");
-    expectLanesMatch(YCbCrLanes{}, Dithering<Packing::P565>{high}, "YCbCr dithered 565");
-    expectLanesMatch(YCbCrLanes{}, Dithering<Packing::P555>{high}, "YCbCr dithered 555");
-    expectLanesMatch(YCbCrLanes{}, Truncating<Packing::P444>{high}, "YCbCr 444");
-    expectLanesMatch(YuvLanes{}, Dithering<Packing::P444>{high}, "YUV dithered 444");
-    expectLanesMatch(YuvLanes{}, Truncating<Packing::P555>{high}, "YUV 555");
+    expectLanesMatch(YCbCrLanes{}, Truncating<Layout565>{high}, "YCbCr 565");
+    expectLanesMatch(YCbCrLanes{}, Dithering<Layout565>{high}, "YCbCr dithered 565");
+    expectLanesMatch(YCbCrLanes{}, Dithering<Layout555>{high}, "YCbCr dithered 555");
+    expectLanesMatch(YCbCrLanes{}, Truncating<Layout444>{high}, "YCbCr 444");
+    expectLanesMatch(YuvLanes{}, Dithering<Layout444>{high}, "YUV dithered 444");
+    expectLanesMatch(YuvLanes{}, Truncating<Layout555>{high}, "YUV 555");
   }
-  expectLanesMatch(SameBytes{}, Truncating<Packing::P565>{false}, "bytes 565");
+  expectLanesMatch(SameBytes{}, Truncating<Layout565>{false}, "bytes 565");
 }
 
 }  // namespace

@@ -56,9 +56,9 @@ inline std::vector<Member> writers() {
 inline uint16_t wordOf(const Member& m, const Rgb& c, int x, int y) {
   const bool h = m.target.redHigh;
   switch (m.target.packing) {
-    case Packing::P444: return m.dither ? Dithering<Packing::P444>{h}.word(c, x, y) : Truncating<Packing::P444>{h}.word(c, x, y);
-    case Packing::P555: return m.dither ? Dithering<Packing::P555>{h}.word(c, x, y) : Truncating<Packing::P555>{h}.word(c, x, y);
-    default: return m.dither ? Dithering<Packing::P565>{h}.word(c, x, y) : Truncating<Packing::P565>{h}.word(c, x, y);
+    case Packing::P444: return m.dither ? Dithering<Layout444>{h}.word(c, x, y) : Truncating<Layout444>{h}.word(c, x, y);
+    case Packing::P555: return m.dither ? Dithering<Layout555>{h}.word(c, x, y) : Truncating<Layout555>{h}.word(c, x, y);
+    default: return m.dither ? Dithering<Layout565>{h}.word(c, x, y) : Truncating<Layout565>{h}.word(c, x, y);
   }
 }
 
