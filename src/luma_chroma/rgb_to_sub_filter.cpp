@@ -20,9 +20,10 @@ namespace {
 std::array<uint8_t, 256> makeGammaTable() {
   std::array<uint8_t, 256> t{};
   for (int i = 0; i < 256; ++i) {
+    // On the linear segment 255 f(i / 255) is 4.5 i exactly, so that its
+    // halves (i = 1, 3) meet the tie rule.
     const double x = i / 255.0;
-    const double f = x < 0.018 ? 4.5 * x : 1.099 * std::pow(x, 0.45) - 0.099;
-    const double v = 255.0 * f;
+    const double v = x < 0.018 ? 4.5 * i : 255.0 * (1.099 * std::pow(x, 0.45) - 0.099);
     // Nearest, ties to even.
     double r = std::floor(v);
     const double frac = v - r;
