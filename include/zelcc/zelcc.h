@@ -146,6 +146,16 @@ ZELCC_API Status zeliRGBToYCbCr422_8u_P3C2R(const uint8_t* const srcPlanes[3], i
 ZELCC_API Status zeliRGBToYCrCb420_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
 ZELCC_API Status zeliRGBToYCrCb422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
 ZELCC_API Status zeliRGBToYCrCb422_8u_P3C2R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+/* RGB or BGR to subsampled full-range YUV; the names without steps take tightly packed images. */
+ZELCC_API Status zeliBGRToYUV420_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV420_8u_C3P3(const uint8_t* src, uint8_t* const dstPlanes[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV420_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV420_8u_P3(const uint8_t* const srcPlanes[3], uint8_t* const dstPlanes[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV420_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV422_8u_C3P3(const uint8_t* src, uint8_t* const dstPlanes[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV422_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV422_8u_P3(const uint8_t* const srcPlanes[3], uint8_t* const dstPlanes[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV422_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
 
 /* ---- Repacking between subsampled layouts ---- */
 ZELCC_API Status zeliCbYCr422ToYCbCr411_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);

@@ -146,6 +146,70 @@ TEST(SubsampledEdges, OddWidthOfAPairStreamKeepsTheLastCr) {
   }
 }
 
+// ---- YUV 4:2:2 in planes ----
+
+// Only the buffers' alignment differs: the second kernel changes last bits.
+TEST(SubsampledEdges, AlignmentChoosesTheKernelOfTheInterleavedYuvMember) {
+  const int w = 32, h = 4;
+  TestImage<uint8_t> src(3 * w, h);
+  src.fillRandom(9);
+  TestImage<uint8_t> moved(3 * w, h, 1);
+  for (int y = 0; y < h; ++y)
+    for (int x = 0; x < 3 * w; ++x) moved.set(x, y, src.get(x, y));
+  // Planes on 64-byte boundaries with steps of 32 bytes.
+  auto planes = [&] {
+    std::vector<TestImage<uint8_t>> p;
+    p.reserve(3);
+    p.emplace_back(w, h);
+    p.emplace_back(w / 2, h, 0, 16);
+    p.emplace_back(w / 2, h, 0, 16);
+    return p;
+  };
+  auto run = [&](const TestImage<uint8_t>& in, std::vector<TestImage<uint8_t>>& out) {
+    uint8_t* ptrs[3] = {out[0].data(), out[1].data(), out[2].data()};
+    const int steps[3] = {out[0].step(), out[1].step(), out[2].step()};
+    return zeliRGBToYUV422_8u_C3P3R(in.data(), in.step(), ptrs, steps, {w, h});
+  };
+  auto aligned = planes(), unaligned = planes();
+  ASSERT_EQ(run(src, aligned), StatusOk);
+  ASSERT_EQ(run(moved, unaligned), StatusOk);
+  int differ = 0;
+  for (int p = 0; p < 3; ++p)
+    for (int y = 0; y < h; ++y)
+      for (int x = 0; x < aligned[p].rowSamples(); ++x) differ += aligned[p].get(x, y) != unaligned[p].get(x, y);
+  EXPECT_GT(differ, 0);
+}
+
+// The name without steps treats 18 by 16 pixels as one row, all of it body;
+// row by row (the name with steps, given the same steps), columns 16 and 17
+// are tail. On 15 by 17 both walk rows and agree.
+TEST(SubsampledEdges, TheNameWithoutStepsTakesALargeEvenImageAsOneRow) {
+  for (ImageSize size : {ImageSize{18, 16}, ImageSize{15, 17}}) {
+    const int w = size.width, h = size.height, cw = w / 2 + (w & 1);
+    std::vector<uint8_t> src(size_t(3 * w) * h + 1);
+    for (size_t i = 0; i < src.size(); ++i) src[i] = uint8_t(i * 37 + (i >> 3));
+    // Tightly packed planes, one byte off a boundary.
+    std::vector<std::vector<uint8_t>> whole, rows;
+    for (int n : {w * h, cw * h, cw * h}) {
+      whole.emplace_back(size_t(n) + 1, 0);
+      rows.emplace_back(size_t(n) + 1, 0);
+    }
+    uint8_t* a[3] = {whole[0].data() + 1, whole[1].data() + 1, whole[2].data() + 1};
+    uint8_t* b[3] = {rows[0].data() + 1, rows[1].data() + 1, rows[2].data() + 1};
+    const int steps[3] = {w, cw, cw};
+    ASSERT_EQ(zeliRGBToYUV422_8u_C3P3(src.data() + 1, a, size), StatusOk);
+    ASSERT_EQ(zeliRGBToYUV422_8u_C3P3R(src.data() + 1, 3 * w, b, steps, size), StatusOk);
+    int tailColumns = 0, elsewhere = 0;
+    for (int r = 0; r < h; ++r)
+      for (int x = 0; x < w; ++x) (x >= 16 ? tailColumns : elsewhere) += a[0][r * w + x] != b[0][r * w + x];
+    EXPECT_EQ(elsewhere, 0);
+    if (w == 18)
+      EXPECT_GT(tailColumns, 0);
+    else
+      EXPECT_TRUE(whole == rows);
+  }
+}
+
 // ---- the filtered stream ----
 
 TEST(SubsampledEdges, FilteredChromaLacksTheLeftTapAtTheRowStart) {

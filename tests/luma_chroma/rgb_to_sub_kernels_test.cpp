@@ -10,6 +10,7 @@
 #include "frame/simd.h"
 #include "luma_chroma/rgb_to_sub_filter.h"
 #include "luma_chroma/rgb_to_sub_rows.h"
+#include "luma_chroma/rgb_to_sub_yuv_forms.h"
 
 namespace {
 
@@ -138,6 +139,16 @@ TEST(SubsampledKernels, RowBlocksMatchTheScalarForms) {
   rowBodyAgrees<2, false>(ExactPairBody{}, In::P3, Out::PairsCrFirst);
   rowBodyAgrees<2, true>(CbYCrBody<set601>{}, In::AC4, Out::PairsCbFirst);
   rowBodyAgrees<2, true>(CbYCrBody<set709Hdtv>{}, In::C3, Out::PairsCbFirst);
+}
+
+TEST(SubsampledKernels, YuvBlocksMatchTheScalarForms) {
+  pairBodyAgrees<true>(DifferenceBody<4>{}, In::AC4, Out::Planes);
+  pairBodyAgrees<false>(DifferenceBody<4>{}, In::P3, Out::Planes);
+  pairBodyAgrees<false>(RoundedDifferenceBody<4>{}, In::C3, Out::Planes);
+  rowBodyAgrees<2, false>(DifferenceBody<2>{}, In::C3, Out::Planes);
+  rowBodyAgrees<2, false>(DifferenceBody<2>{}, In::P3, Out::Planes);
+  rowBodyAgrees<2, false>(DifferenceBody<2>{}, In::C3, Out::Pairs);
+  rowBodyAgrees<2, false>(RoundedDifferenceBody<2>{}, In::C3, Out::Planes);
 }
 
 TEST(SubsampledKernels, FilteredBlocksMatchTheScalarPairs) {

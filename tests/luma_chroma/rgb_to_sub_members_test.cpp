@@ -95,6 +95,68 @@ CC signed422(Sums x) {
           sat8((l(x.r, 28770) + l(x.g, -24117) + l(x.b, -4653) + 16448) >> 7)};
 }
 
+// ---- YUV forms ----
+
+Sums sumOf(const std::vector<Px>& px);
+
+int yuvP(Px p) { return floorMul(p.r << 2, 9798) + floorMul(p.g << 2, 19235) + floorMul(p.b << 2, 3736); }
+int yuvQ(Px p) { return m8(p.r, 4899) + m8(p.g, 9617) + m8(p.b, 1868); }
+int yuvT(Px p) { return 19595 * p.r + 38470 * p.g + 7471 * p.b; }
+int yuvT14(Px p) { return 4899 * p.r + 9617 * p.g + 1868 * p.b; }
+int yuvT15(Px p) { return 9798 * p.r + 19235 * p.g + 3736 * p.b; }
+int roundMul(int v, int c) { return (v * c + 16384) >> 15; }  // MulHighRound
+template <class F>
+int sumOf(const std::vector<Px>& px, F f) {
+  int s = 0;
+  for (const Px& p : px) s += f(p);
+  return s;
+}
+
+// Y = p >> 1; U from (sum of B << 2) >> 3 and (sum of p) >> 2 over 2 by 2.
+CC difference420(const std::vector<Px>& v) {
+  const Sums x = sumOf(v);
+  const int p = sumOf(v, yuvP);
+  return {sat8(floorMul(((x.b << 2) >> 3) - (p >> 2), 16121) + 128),
+          sat8(floorMul(((x.r << 2) >> 3) - (p >> 2), 28737) + 128)};
+}
+CC difference422(const std::vector<Px>& v) {
+  const Sums x = sumOf(v);
+  const int p = sumOf(v, yuvP);
+  return {sat8((floorMul((x.b << 1) - p, 16121) >> 1) + 128), sat8((floorMul((x.r << 1) - p, 28737) >> 1) + 128)};
+}
+CC roundedDifference420(const std::vector<Px>& v) {
+  const Sums x = sumOf(v);
+  const int q = sumOf(v, yuvQ);
+  return {sat8((roundMul((x.b << 5) - (q >> 1), 8061) >> 6) + 128),
+          sat8((roundMul((x.r << 5) - (q >> 1), 14369) >> 6) + 128)};
+}
+CC roundedDifference422(const std::vector<Px>& v) {
+  const Sums x = sumOf(v);
+  const int q = sumOf(v, yuvQ);
+  return {sat8((roundMul((x.b << 6) - q, 8061) >> 6) + 128), sat8((roundMul((x.r << 6) - q, 14369) >> 6) + 128)};
+}
+CC wideDifference(const std::vector<Px>& v, int half, int shift) {
+  const Sums x = sumOf(v);
+  const int t = sumOf(v, yuvT);
+  return {((((x.b << 16) - t + half) >> 16) * 32244 >> shift) + 128 & 255,
+          sat8(((((x.r << 16) - t + half) >> 16) * 57475 >> shift) + 128)};
+}
+CC wide14Difference(const std::vector<Px>& v) {
+  const Sums x = sumOf(v);
+  const int t = sumOf(v, yuvT14);
+  return {((((x.b << 14) - t) >> 14) * 8061 >> 16) + 128 & 255, sat8(((((x.r << 14) - t) >> 14) * 14369 >> 16) + 128)};
+}
+int splitLuma(Px p) { return ((9798 * p.r + 19235 * p.g) >> 14) + ((3736 * p.b) >> 14); }
+CC splitPair(const std::vector<Px>& v) {
+  const int m = (splitLuma(v[0]) + splitLuma(v[1])) >> 1;
+  return {sat8(floorMul(v[0].b + v[1].b - m, 16121) + 128), sat8(floorMul(v[0].r + v[1].r - m, 28737) + 128)};
+}
+CC odd15(Px p, bool rounding) {
+  const int t = yuvT15(p);
+  return {((((p.b << 15) - t + (rounding ? 16383 : 0)) >> 15) * 16121 >> 15) + 128 & 255,
+          sat8(((((p.r << 15) - t + (rounding ? 32767 : 0)) >> 15) * 28737 >> 15) + 128)};
+}
+
 // ---- members ----
 
 enum class Geo { S420, S422, S411 };
@@ -111,6 +173,8 @@ struct Model {
   // The last pixel of an odd 4:2:2 width: Y and the chroma it writes.
   std::function<CC(Px)> oddChroma;
   bool oddWritesChroma = true;
+  std::function<int(Px)> oddLuma = nullptr;  // when it is not the tail's
+  bool oneRow = false;                       // the whole-image rule of the names without steps
 };
 
 Sums sumOf(const std::vector<Px>& px) {
@@ -173,9 +237,37 @@ Model model411(bool lanes) {
           [](const std::vector<Px>& v) { return wide420(k601, sumOf(v)); }, nullptr};
 }
 
+Model yuv420Model(bool bgr, std::function<int(int)> n) {
+  return {Geo::S420, Dst::P3, bgr, n, [](Px p, int) { return sat8(yuvP(p) >> 1); },
+          [](Px p, int) { return yuvT(p) >> 16; }, difference420,
+          [](const std::vector<Px>& v) { return wideDifference(v, 131071, 18); }, nullptr};
+}
+Model yuv420RoundedModel() {
+  return {Geo::S420, Dst::P3, false, byHalf, [](Px p, int) { return sat8(yuvQ(p) >> 6); },
+          [](Px p, int) { return yuvT14(p) >> 14; }, roundedDifference420, wide14Difference, nullptr};
+}
+Model yuv422Model(bool interleaved, bool oneRow) {
+  Model m{Geo::S422, Dst::P3, false, [](int w) { return w & ~15; }, [](Px p, int) { return sat8(yuvP(p) >> 1); },
+          [](Px p, int) { return yuvT(p) >> 16; }, difference422,
+          [](const std::vector<Px>& v) { return wideDifference(v, 65535, 17); },
+          [interleaved](Px p) { return odd15(p, interleaved); }};
+  m.oddLuma = [](Px p) { return yuvT15(p) >> 15; };
+  m.oneRow = oneRow;
+  return m;
+}
+// The second kernel of the interleaved member, for aligned buffers.
+Model yuv422AlignedModel() {
+  Model m{Geo::S422, Dst::P3, false, [](int w) { return w & ~15; }, [](Px p, int) { return sat8(yuvQ(p) >> 6); },
+          [](Px p, int) { return sat8(splitLuma(p) >> 1); }, roundedDifference422, splitPair,
+          [](Px p) { return odd15(p, true); }};
+  m.oddLuma = [](Px p) { return yuvT15(p) >> 15; };
+  return m;
+}
+
 struct Case {
   std::string name;
   Model model;
+  std::vector<Model> aligned = {};  // a kernel of its own for aligned buffers
 };
 
 const std::vector<Case>& cases() {
@@ -208,6 +300,15 @@ const std::vector<Case>& cases() {
       {"zeliBGRToCbYCr422_8u_AC4C2R", cbycrModel(k601, [](int w) { return w & ~7; })},
       {"zeliBGRToCbYCr422_709HDTV_8u_AC4C2R", cbycrModel(kHdtv, [](int w) { return w & ~7; })},
       {"zeliBGRToCbYCr422_709HDTV_8u_C3C2R", cbycrModel(kHdtv, by32Then8)},
+      {"zeliBGRToYUV420_8u_AC4P3R", yuv420Model(true, [](int w) { return w & ~15; })},
+      {"zeliRGBToYUV420_8u_P3R", yuv420Model(false, [](int) { return 0; })},
+      {"zeliRGBToYUV420_8u_P3", yuv420Model(false, [](int) { return 0; })},
+      {"zeliRGBToYUV420_8u_C3P3R", yuv420RoundedModel()},
+      {"zeliRGBToYUV420_8u_C3P3", yuv420RoundedModel()},
+      {"zeliRGBToYUV422_8u_C3P3R", yuv422Model(true, false), {yuv422AlignedModel()}},
+      {"zeliRGBToYUV422_8u_C3P3", yuv422Model(true, true), {yuv422AlignedModel()}},
+      {"zeliRGBToYUV422_8u_P3R", yuv422Model(false, false)},
+      {"zeliRGBToYUV422_8u_P3", yuv422Model(false, true)},
   };
   return all;
 }
@@ -276,47 +377,68 @@ std::vector<std::vector<uint8_t>> expected(Workspace& w, const Model& m) {
       }
     return out;
   }
+  // A row of `count` pixels, pixel i at (x, y) = at(i); chroma sample j of
+  // the row at chromaAt(j). Body up to the member's N of `count`.
   const int ratio = m.geo == Geo::S411 ? 4 : 2;
-  for (int y = 0; y < height; ++y) {
-    for (int x = 0; x + ratio <= width; x += ratio) {
-      const bool body = x < n;
+  struct At {
+    int x, y;
+  };
+  auto row = [&](int count, const std::function<At(int)>& at, const std::function<At(int)>& chromaAt) {
+    const int rowN = m.bodyEnd(count);
+    auto pixel = [&](int i) { return pixelAt(w, d, m.bgr, at(i).x, at(i).y); };
+    auto putByte = [&](int i, int slot, int v) { put(0, 2 * at(i).x + slot, at(i).y, v); };
+    for (int x = 0; x + ratio <= count; x += ratio) {
+      const bool body = x < rowN;
       std::vector<Px> px;
       int ys[4];
       for (int k = 0; k < ratio; ++k) {
-        px.push_back(pixelAt(w, d, m.bgr, x + k, y));
+        px.push_back(pixel(x + k));
         ys[k] = body ? m.bodyLuma(px[k], k & 1) : m.tailLuma(px[k], k & 1);
       }
       const CC c = body ? m.bodyChroma(px) : m.tailChroma(px);
       if (m.dst == Dst::P3) {
-        for (int k = 0; k < ratio; ++k) put(0, x + k, y, ys[k]);
-        putChroma(x / ratio, y, c);
+        for (int k = 0; k < ratio; ++k) put(0, at(x + k).x, at(x + k).y, ys[k]);
+        putChroma(chromaAt(x / ratio).x, chromaAt(x / ratio).y, c);
       } else {
         // Pair streams: byte positions of Y0, Cb, Y1, Cr.
         const int slots[3][4] = {{0, 1, 2, 3}, {0, 3, 2, 1}, {1, 0, 3, 2}};
-        const int* s = slots[m.dst == Dst::C2YCbCr ? 0 : m.dst == Dst::C2YCrCb ? 1 : 2];
-        put(0, 2 * x + s[0], y, ys[0]);
-        put(0, 2 * x + s[1], y, c.c1);
-        put(0, 2 * x + s[2], y, ys[1]);
-        put(0, 2 * x + s[3], y, c.c2);
+        const int* sl = slots[m.dst == Dst::C2YCbCr ? 0 : m.dst == Dst::C2YCrCb ? 1 : 2];
+        putByte(x, sl[0], ys[0]);
+        putByte(x, sl[1], c.c1);
+        putByte(x, sl[2], ys[1]);
+        putByte(x, sl[3], c.c2);
       }
     }
-    if (m.geo == Geo::S422 && (width & 1)) {
-      const int x = width - 1;
-      const Px p = pixelAt(w, d, m.bgr, x, y);
-      const int yv = m.tailLuma(p, 0);
+    if (m.geo == Geo::S422 && (count & 1)) {
+      const int i = count - 1;
+      const Px p = pixel(i);
+      const int yv = m.oddLuma ? m.oddLuma(p) : m.tailLuma(p, 0);
       const CC c = m.oddChroma(p);
       if (m.dst == Dst::P3) {
-        put(0, x, y, yv);
-        if (m.oddWritesChroma) putChroma(x / 2, y, c);
+        put(0, at(i).x, at(i).y, yv);
+        if (m.oddWritesChroma) putChroma(chromaAt(i / 2).x, chromaAt(i / 2).y, c);
       } else if (m.dst == Dst::C2CbYCr) {
-        put(0, 2 * x, y, c.c1);
-        put(0, 2 * x + 1, y, yv);
+        putByte(i, 0, c.c1);
+        putByte(i, 1, yv);
       } else {
-        put(0, 2 * x, y, yv);
-        put(0, 2 * x + 1, y, m.dst == Dst::C2YCbCr ? c.c1 : c.c2);
+        putByte(i, 0, yv);
+        putByte(i, 1, m.dst == Dst::C2YCbCr ? c.c1 : c.c2);
       }
     }
+  };
+  const int64_t total = int64_t(width) * height;
+  if (m.oneRow && !(width & 1) && total >= 256) {
+    // The whole image as one row, cut after total AND NOT 7 pixels.
+    const int first = int(total) & ~7, half = width / 2;
+    for (int start : {0, first}) {
+      const int count = start == 0 ? first : int(total) - first;
+      row(count, [&](int i) { return At{(start + i) % width, (start + i) / width}; },
+          [&](int j) { return At{(start / 2 + j) % half, (start / 2 + j) / half}; });
+    }
+    return out;
   }
+  for (int y = 0; y < height; ++y)
+    row(width, [y](int i) { return At{i, y}; }, [y](int j) { return At{j, y}; });
   return out;
 }
 
@@ -339,27 +461,92 @@ std::vector<ImageSize> sizes() {
   return out;
 }
 
-void runModel(const std::string& name, const Model& m) {
-  const Descriptor* d = findDescriptor(name);
-  ASSERT_NE(d, nullptr) << name;
-  int seed = 1;
-  for (ImageSize size : sizes()) {
-    const int pad = size.width % 3 == 0 ? 0 : 7, offset = size.width % 4;
-    Workspace w(*d, size, pad, offset);
-    w.fillRandom(uint32_t(++seed));
-    w.fillDestinations(0x5A);
-    const auto want = expected(w, m);
-    const Status s = w.call();
-    ASSERT_EQ(int(s), int(expectedStatus(*d, size))) << name << " " << size.width << "x" << size.height;
-    if (s == StatusSizeError) continue;
-    const auto got = w.snapshot();
-    for (size_t i = 0; i < got.size(); ++i)
-      ASSERT_TRUE(got[i] == want[i]) << name << " " << size.width << "x" << size.height << " buffer " << i;
-  }
+// Every buffer and step a multiple of 16.
+bool buffersAligned(Workspace& w) {
+  for (const Workspace::Buffer& b : w.buffers())
+    if ((reinterpret_cast<uintptr_t>(b.first) & 15) || (b.step & 15)) return false;
+  return true;
 }
 
-TEST(SubsampledYCbCr, EveryMemberFollowsItsFormsAndZones) {
-  for (const Case& c : cases()) runModel(c.name, c.model);
+void runOne(const Case& c, const Descriptor& d, ImageSize size, int pad, int offset, uint32_t seed) {
+  Workspace w(d, size, pad, offset);
+  w.fillRandom(seed);
+  w.fillDestinations(0x5A);
+  const bool oneRow = c.model.oneRow && !(size.width & 1) && int64_t(size.width) * size.height >= 256;
+  const Model& m = !c.aligned.empty() && !oneRow && buffersAligned(w) ? c.aligned[0] : c.model;
+  const auto want = expected(w, m);
+  const Status s = w.call();
+  ASSERT_EQ(int(s), int(expectedStatus(d, size))) << c.name << " " << size.width << "x" << size.height;
+  if (s == StatusSizeError) return;
+  const auto got = w.snapshot();
+  for (size_t i = 0; i < got.size(); ++i)
+    ASSERT_TRUE(got[i] == want[i]) << c.name << " " << size.width << "x" << size.height << " pad " << pad << " offset "
+                                   << offset << " buffer " << i << (&m == &c.model ? "" : " (aligned kernel)");
+}
+
+void runModel(const Case& c) {
+  const Descriptor* d = findDescriptor(c.name);
+  ASSERT_NE(d, nullptr) << c.name;
+  uint32_t seed = 1;
+  for (ImageSize size : sizes()) {
+    runOne(c, *d, size, size.width % 3 == 0 ? 0 : 7, size.width % 4, ++seed);
+    if (::testing::Test::HasFatalFailure()) return;
+  }
+  // Steps and rows that are all multiples of 16, then the same rows moved off
+  // the boundary; and images of at least 256 pixels.
+  for (ImageSize size : {ImageSize{32, 1}, ImageSize{64, 3}, ImageSize{96, 2}, ImageSize{16, 16}, ImageSize{15, 17},
+                         ImageSize{34, 8}, ImageSize{35, 8}, ImageSize{130, 2}})
+    for (int offset : {0, 3}) {
+      runOne(c, *d, size, 16, offset, ++seed);
+      if (::testing::Test::HasFatalFailure()) return;
+    }
+}
+
+TEST(SubsampledMembers, EveryMemberFollowsItsFormsAndZones) {
+  for (const Case& c : cases()) runModel(c);
+}
+
+}  // namespace
+
+namespace {
+
+// The aligned kernel past its blocks of 16: whole pairs in the split-luma
+// form, a last odd pixel in the 15-bit form. Buffers and steps multiples
+// of 16 with a width that is not.
+TEST(SubsampledMembers, TheAlignedYuvKernelEndsInSplitPairs) {
+  const Model m = yuv422AlignedModel();
+  for (int width : {20, 21, 30, 31, 47}) {
+    const int h = 3, srcStep = 160, yStep = 64, cStep = 32;
+    alignas(64) static uint8_t src[160 * 3], planes[3][64 * 3];
+    for (int i = 0; i < 160 * 3; ++i) src[i] = uint8_t(i * 73 + width);
+    std::memset(planes, 0xEE, sizeof(planes));
+    uint8_t* dst[3] = {planes[0], planes[1], planes[2]};
+    const int steps[3] = {yStep, cStep, cStep};
+    ASSERT_EQ(zeliRGBToYUV422_8u_C3P3R(src, srcStep, dst, steps, {width, h}), StatusOk);
+    for (int y = 0; y < h; ++y) {
+      auto px = [&](int x) {
+        const uint8_t* p = src + y * srcStep + 3 * x;
+        return Px{p[0], p[1], p[2]};
+      };
+      for (int x = 0; x + 1 < width; x += 2) {
+        const bool body = x < (width & ~15);
+        const std::vector<Px> pair = {px(x), px(x + 1)};
+        const CC c = body ? m.bodyChroma(pair) : m.tailChroma(pair);
+        for (int k = 0; k < 2; ++k)
+          EXPECT_EQ(planes[0][y * yStep + x + k], body ? m.bodyLuma(pair[k], k) : m.tailLuma(pair[k], k)) << x;
+        EXPECT_EQ(planes[1][y * cStep + x / 2], c.c1) << width << " " << x;
+        EXPECT_EQ(planes[2][y * cStep + x / 2], c.c2) << width << " " << x;
+      }
+      if (width & 1) {
+        const Px p = px(width - 1);
+        EXPECT_EQ(planes[0][y * yStep + width - 1], m.oddLuma(p));
+        EXPECT_EQ(planes[1][y * cStep + width / 2], m.oddChroma(p).c1);
+        EXPECT_EQ(planes[2][y * cStep + width / 2], m.oddChroma(p).c2);
+      }
+      EXPECT_EQ(planes[0][y * yStep + width], 0xEE);
+      EXPECT_EQ(planes[1][y * cStep + (width + 1) / 2], 0xEE);
+    }
+  }
 }
 
 }  // namespace
