@@ -46,6 +46,9 @@ struct YuvFrame {
   std::vector<uint8_t> v2 = std::vector<uint8_t>(size_t(kWidth / 2) * kHeight);
   std::vector<uint8_t> uv2 = std::vector<uint8_t>(size_t(kWidth) * kHeight);
   std::vector<uint8_t> packed2 = std::vector<uint8_t>(size_t(kWidth) * 2 * kHeight);
+  std::vector<uint8_t> u444 = frameBytes(size_t(kWidth) * kHeight);
+  std::vector<uint8_t> v444 = frameBytes(size_t(kWidth) * kHeight);
+  std::vector<uint8_t> argb = frameBytes(size_t(kWidth) * 4 * kHeight);
 };
 
 template <typename Call>
@@ -59,6 +62,39 @@ using PeerFactory = std::function<std::vector<Peer>()>;
 
 const std::map<std::string, PeerFactory>& table() {
   static const std::map<std::string, PeerFactory> t = {
+      {"zeliCFAToRGB_8u_C1C3R",
+       [] {
+         std::vector<Peer> p;
+#ifdef ZELCC_BENCH_OPENCV
+         p.push_back(cvtColorPeer("OpenCV cvtColor BayerBG2RGB", CV_8UC1, CV_8UC3, cv::COLOR_BayerBG2RGB));
+#endif
+         return p;
+       }},
+      {"zeliCFAToRGB_16u_C1C3R",
+       [] {
+         std::vector<Peer> p;
+#ifdef ZELCC_BENCH_OPENCV
+         p.push_back(cvtColorPeer("OpenCV cvtColor BayerBG2RGB", CV_16UC1, CV_16UC3, cv::COLOR_BayerBG2RGB));
+#endif
+         return p;
+       }},
+      {"zeliDemosaicAHD_8u_C1C3R",
+       [] {
+         std::vector<Peer> p;
+#ifdef ZELCC_BENCH_OPENCV
+         p.push_back(cvtColorPeer("OpenCV cvtColor BayerBG2RGB_EA", CV_8UC1, CV_8UC3, cv::COLOR_BayerBG2RGB_EA));
+         p.push_back(cvtColorPeer("OpenCV cvtColor BayerBG2RGB_VNG", CV_8UC1, CV_8UC3, cv::COLOR_BayerBG2RGB_VNG));
+#endif
+         return p;
+       }},
+      {"zeliDemosaicAHD_16u_C1C3R",
+       [] {
+         std::vector<Peer> p;
+#ifdef ZELCC_BENCH_OPENCV
+         p.push_back(cvtColorPeer("OpenCV cvtColor BayerBG2RGB_EA", CV_16UC1, CV_16UC3, cv::COLOR_BayerBG2RGB_EA));
+#endif
+         return p;
+       }},
       {"zeliGrayToRGB_8u_C1C3R",
        [] {
          std::vector<Peer> p;
@@ -98,7 +134,52 @@ const std::map<std::string, PeerFactory>& table() {
 #endif
          return p;
        }},
+#ifdef ZELCC_BENCH_OPENCV
+      {"zeliRGBToYCbCr_8u_C3R",
+       [] { return std::vector<Peer>{cvtColorPeer("OpenCV cvtColor RGB2YCrCb", CV_8UC3, CV_8UC3, cv::COLOR_RGB2YCrCb)}; }},
+      {"zeliRGBToYCbCr_8u_AC4R",
+       [] { return std::vector<Peer>{cvtColorPeer("OpenCV cvtColor RGBA2YCrCb", CV_8UC4, CV_8UC3, cv::COLOR_RGB2YCrCb)}; }},
+      {"zeliYCbCrToRGB_8u_C3R",
+       [] { return std::vector<Peer>{cvtColorPeer("OpenCV cvtColor YCrCb2RGB", CV_8UC3, CV_8UC3, cv::COLOR_YCrCb2RGB)}; }},
+      {"zeliYCbCrToRGB_8u_AC4R",
+       [] { return std::vector<Peer>{cvtColorPeer("OpenCV cvtColor YCrCb2RGB", CV_8UC3, CV_8UC3, cv::COLOR_YCrCb2RGB)}; }},
+#endif
 #ifdef ZELCC_BENCH_LIBYUV
+      {"zeliRGBToYCbCr_8u_AC4P3R",
+       [] {
+         return yuvPeer("libyuv ARGBToI444", [](YuvFrame& f) {
+           libyuv::ARGBToI444(f.argb.data(), kWidth * 4, f.y2.data(), kWidth, f.u444.data(), kWidth, f.v444.data(),
+                              kWidth, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCrToBGR_8u_P3C4R",
+       [] {
+         return yuvPeer("libyuv I444ToARGB", [](YuvFrame& f) {
+           libyuv::I444ToARGB(f.y.data(), kWidth, f.u444.data(), kWidth, f.v444.data(), kWidth, f.argb.data(),
+                              kWidth * 4, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCrToBGR_709CSC_8u_P3C4R",
+       [] {
+         return yuvPeer("libyuv H444ToARGB", [](YuvFrame& f) {
+           libyuv::H444ToARGB(f.y.data(), kWidth, f.u444.data(), kWidth, f.v444.data(), kWidth, f.argb.data(),
+                              kWidth * 4, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCrToBGR_8u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I444ToRGB24", [](YuvFrame& f) {
+           libyuv::I444ToRGB24(f.y.data(), kWidth, f.u444.data(), kWidth, f.v444.data(), kWidth, f.argb.data(),
+                               kWidth * 3, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCrToRGB_8u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I444ToRAW", [](YuvFrame& f) {
+           libyuv::I444ToRAW(f.y.data(), kWidth, f.u444.data(), kWidth, f.v444.data(), kWidth, f.argb.data(),
+                             kWidth * 3, kWidth, kHeight);
+         });
+       }},
       {"zeliYCbCr422ToYCbCr420_8u_C2P3R",
        [] {
          return yuvPeer("libyuv YUY2ToI420", [](YuvFrame& f) {

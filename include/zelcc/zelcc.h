@@ -111,8 +111,43 @@ ZELCC_API Status zeliYCbCrToBGR_709CSC_8u_P3C3R(const uint8_t* const srcPlanes[3
                                                 int dstStep, ImageSize size);
 ZELCC_API Status zeliYCbCrToBGR_709CSC_8u_P3C4R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst,
                                                 int dstStep, ImageSize size, uint8_t alpha);
+/* Full-range YUV: Y with no offset, U and V centred on 128. */
+ZELCC_API Status zeliRGBToYUV_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYUV_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYUV_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
+                                       ImageSize size);
+/* The fourth plane receives the source's fourth bytes; its pointer is not tested. */
+ZELCC_API Status zeliRGBToYUV_8u_AC4P4R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[4], int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliRGBToYUV_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                     int dstStep, ImageSize size);
+ZELCC_API Status zeliYUVToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYUVToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYUVToRGB_8u_C3C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                       uint8_t alpha);
+ZELCC_API Status zeliYUVToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliYUVToRGB_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                     int dstStep, ImageSize size);
 
 /* ---- Photo YCC ---- */
+/* Steps of 16-bit and float images are used as step / sample size elements. */
+ZELCC_API Status zeliRGBToYCC_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCC_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCC_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCC_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCC_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCC_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCC_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCC_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCCToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCCToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCCToRGB_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCCToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCCToRGB_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCCToRGB_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCCToRGB_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCCToRGB_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
 
 /* ---- RGB to and from chroma-subsampled YCbCr and YUV ---- */
 /* RGB or BGR to subsampled video-range YCbCr; 4:2:0 members leave a last odd row and column unwritten. */
@@ -152,6 +187,7 @@ ZELCC_API Status zeliRGBToYUV420_8u_C3P3(const uint8_t* src, uint8_t* const dstP
 ZELCC_API Status zeliRGBToYUV420_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
 ZELCC_API Status zeliRGBToYUV420_8u_P3(const uint8_t* const srcPlanes[3], uint8_t* const dstPlanes[3], ImageSize size);
 ZELCC_API Status zeliRGBToYUV420_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
 ZELCC_API Status zeliRGBToYUV422_8u_C3P3(const uint8_t* src, uint8_t* const dstPlanes[3], ImageSize size);
 ZELCC_API Status zeliRGBToYUV422_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
 ZELCC_API Status zeliRGBToYUV422_8u_P3(const uint8_t* const srcPlanes[3], uint8_t* const dstPlanes[3], ImageSize size);
@@ -245,22 +281,457 @@ ZELCC_API Status zeliYCrCb420ToBGR_Filter_8u_P3C4R(const uint8_t* const src[3], 
 /* ---- 16-bit packed RGB ---- */
 
 /* ---- YCoCg ---- */
+/* Interleaved BGR (RGB for the byte-plane pair) to and from planes Y, Co, Cg
+ * that share one step. `Rev` is the lifting transform that the inverse
+ * undoes exactly; `SBGR` samples are signed 16-bit. */
+ZELCC_API Status zeliBGRToYCoCg_8u16s_C3P3R(const uint8_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                            ImageSize size);
+ZELCC_API Status zeliBGRToYCoCg_8u16s_C4P3R(const uint8_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                            ImageSize size);
+ZELCC_API Status zeliBGRToYCoCg_Rev_8u16s_C3P3R(const uint8_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                                ImageSize size);
+ZELCC_API Status zeliBGRToYCoCg_Rev_8u16s_C4P3R(const uint8_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                                ImageSize size);
+ZELCC_API Status zeliRGBToYCoCg_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], int dstStep,
+                                         ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_16s32s_C3P3R(const int16_t* src, int srcStep, int32_t* const dst[3], int dstStep,
+                                              ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_16s32s_C4P3R(const int16_t* src, int srcStep, int32_t* const dst[3], int dstStep,
+                                              ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_16s_C3P3R(const int16_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                           ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_16s_C4P3R(const int16_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                           ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_Rev_16s32s_C3P3R(const int16_t* src, int srcStep, int32_t* const dst[3],
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_Rev_16s32s_C4P3R(const int16_t* src, int srcStep, int32_t* const dst[3],
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_Rev_16s_C3P3R(const int16_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                               ImageSize size);
+ZELCC_API Status zeliSBGRToYCoCg_Rev_16s_C4P3R(const int16_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                               ImageSize size);
+ZELCC_API Status zeliYCoCgToBGR_16s8u_P3C3R(const int16_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                            ImageSize size);
+ZELCC_API Status zeliYCoCgToBGR_16s8u_P3C4R(const int16_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                            ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCoCgToBGR_Rev_16s8u_P3C3R(const int16_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                                ImageSize size);
+ZELCC_API Status zeliYCoCgToBGR_Rev_16s8u_P3C4R(const int16_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                                ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCoCgToRGB_8u_P3C3R(const uint8_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                         ImageSize size);
+ZELCC_API Status zeliYCoCgToSBGR_16s_P3C3R(const int16_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                           ImageSize size);
+ZELCC_API Status zeliYCoCgToSBGR_16s_P3C4R(const int16_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                           ImageSize size, int16_t alpha);
+ZELCC_API Status zeliYCoCgToSBGR_32s16s_P3C3R(const int32_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                              ImageSize size);
+ZELCC_API Status zeliYCoCgToSBGR_32s16s_P3C4R(const int32_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                              ImageSize size, int16_t alpha);
+ZELCC_API Status zeliYCoCgToSBGR_Rev_16s_P3C3R(const int16_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                               ImageSize size);
+ZELCC_API Status zeliYCoCgToSBGR_Rev_16s_P3C4R(const int16_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                               ImageSize size, int16_t alpha);
+ZELCC_API Status zeliYCoCgToSBGR_Rev_32s16s_P3C3R(const int32_t* const src[3], int srcStep, int16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCoCgToSBGR_Rev_32s16s_P3C4R(const int32_t* const src[3], int srcStep, int16_t* dst,
+                                                  int dstStep, ImageSize size, int16_t alpha);
 
 /* ---- HLS and HSV ---- */
+/* RGB or BGR to and from hue, lightness, saturation, in 32-bit float
+ * arithmetic. The RGB members use steps unchecked (16-bit and float steps
+ * count whole samples); the BGR members reject steps below 1. */
+ZELCC_API Status zeliRGBToHLS_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToHLS_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToRGB_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_AC4P4R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[4], int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_AP4C4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* dst, int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_AP4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* const dstPlanes[4],
+                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliBGRToHLS_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                     int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_AC4P4R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[4], int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_AP4C4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* dst, int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_AP4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* const dstPlanes[4],
+                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliHLSToBGR_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                     int dstStep, ImageSize size);
+
+/* RGB to and from hue, saturation, value. */
+ZELCC_API Status zeliRGBToHSV_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliRGBToHSV_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToHSV_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToHSV_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliHSVToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliHSVToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliHSVToRGB_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliHSVToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
 
 /* ---- XYZ, LUV and Lab ---- */
+ZELCC_API Status zeliBGRToLUV_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToLUV_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliLUVToBGR_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliLUVToBGR_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliLUVToRGB_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliLUVToRGB_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliLUVToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliLUVToRGB_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliLUVToRGB_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliLUVToRGB_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliLUVToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliLUVToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliRGBToLUV_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliRGBToLUV_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToLUV_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliRGBToLUV_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToLUV_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliRGBToLUV_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToLUV_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToLUV_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliRGBToLab_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliBGRToLab_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliBGRToLab_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliRGBToLab_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToLab_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliLabToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliLabToBGR_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliLabToBGR_16u8u_C3R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                        ImageSize size);
+ZELCC_API Status zeliLabToRGB_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliLabToBGR_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToXYZ_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliXYZToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                     ImageSize size);
+ZELCC_API Status zeliXYZToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliXYZToRGB_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliXYZToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliXYZToRGB_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                      ImageSize size);
+ZELCC_API Status zeliXYZToRGB_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                       ImageSize size);
+ZELCC_API Status zeliXYZToRGB_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliXYZToRGB_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep,
+                                       ImageSize size);
 
 /* ---- Colour twist ---- */
+/* Row i of `twist`: weights of the three inputs and a constant in sample units for output i; */
+/* integer results are clamped, then rounded to nearest. Steps must be at least 1. */
+ZELCC_API Status zeliColorTwist32f_16s_AC4IR(int16_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size,
+                                            const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16s_C3IR(int16_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16s_IP3R(int16_t* const srcDstPlanes[3], int srcDstStep, ImageSize size,
+                                            const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16s_P3R(const int16_t* const srcPlanes[3], int srcStep, int16_t* const dstPlanes[3],
+                                           int dstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_AC4IR(uint16_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                            ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_C3IR(uint16_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_IP3R(uint16_t* const srcDstPlanes[3], int srcDstStep, ImageSize size,
+                                            const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_16u_P3R(const uint16_t* const srcPlanes[3], int srcStep,
+                                           uint16_t* const dstPlanes[3], int dstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_AC4IR(int8_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_AC4R(const int8_t* src, int srcStep, int8_t* dst, int dstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_C3IR(int8_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_C3R(const int8_t* src, int srcStep, int8_t* dst, int dstStep, ImageSize size,
+                                          const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_IP3R(int8_t* const srcDstPlanes[3], int srcDstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8s_P3R(const int8_t* const srcPlanes[3], int srcStep, int8_t* const dstPlanes[3],
+                                          int dstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_AC4IR(uint8_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_C3IR(uint8_t* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                          const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_IP3R(uint8_t* const srcDstPlanes[3], int srcDstStep, ImageSize size,
+                                           const float twist[3][4]);
+ZELCC_API Status zeliColorTwist32f_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                          int dstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_AC4IR(float* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                         const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_C3IR(float* srcDst, int srcDstStep, ImageSize size, const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                        const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_C4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                        const float twist[4][4]);
+ZELCC_API Status zeliColorTwist_32f_IP3R(float* const srcDstPlanes[3], int srcDstStep, ImageSize size,
+                                         const float twist[3][4]);
+ZELCC_API Status zeliColorTwist_32f_P3R(const float* const srcPlanes[3], int srcStep, float* const dstPlanes[3],
+                                        int dstStep, ImageSize size, const float twist[3][4]);
 
 /* ---- Gamma ---- */
+/* The video transfer function (Fwd) and its inverse (Inv) on R, G, B; 32f maps vMin..vMax onto 0..1 */
+/* and returns StatusEmptyRangeError unless vMax - vMin > 0. Steps must be at least 1. */
+ZELCC_API Status zeliGammaFwd_16u_AC4IR(uint16_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_16u_C3IR(uint16_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_16u_IP3R(uint16_t* const srcDstPlanes[3], int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_16u_P3R(const uint16_t* const srcPlanes[3], int srcStep, uint16_t* const dstPlanes[3],
+                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_32f_AC4IR(float* srcDst, int srcDstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaFwd_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                       float vMin, float vMax);
+ZELCC_API Status zeliGammaFwd_32f_C3IR(float* srcDst, int srcDstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaFwd_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                      float vMin, float vMax);
+ZELCC_API Status zeliGammaFwd_32f_IP3R(float* const srcDstPlanes[3], int srcDstStep, ImageSize size, float vMin,
+                                       float vMax);
+ZELCC_API Status zeliGammaFwd_32f_P3R(const float* const srcPlanes[3], int srcStep, float* const dstPlanes[3],
+                                      int dstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaFwd_8u_AC4IR(uint8_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_8u_C3IR(uint8_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_8u_IP3R(uint8_t* const srcDstPlanes[3], int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaFwd_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                     int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_AC4IR(uint16_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_C3IR(uint16_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_IP3R(uint16_t* const srcDstPlanes[3], int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_16u_P3R(const uint16_t* const srcPlanes[3], int srcStep, uint16_t* const dstPlanes[3],
+                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_32f_AC4IR(float* srcDst, int srcDstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaInv_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                       float vMin, float vMax);
+ZELCC_API Status zeliGammaInv_32f_C3IR(float* srcDst, int srcDstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaInv_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                      float vMin, float vMax);
+ZELCC_API Status zeliGammaInv_32f_IP3R(float* const srcDstPlanes[3], int srcDstStep, ImageSize size, float vMin,
+                                       float vMax);
+ZELCC_API Status zeliGammaInv_32f_P3R(const float* const srcPlanes[3], int srcStep, float* const dstPlanes[3],
+                                      int dstStep, ImageSize size, float vMin, float vMax);
+ZELCC_API Status zeliGammaInv_8u_AC4IR(uint8_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_8u_C3IR(uint8_t* srcDst, int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_8u_IP3R(uint8_t* const srcDstPlanes[3], int srcDstStep, ImageSize size);
+ZELCC_API Status zeliGammaInv_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                     int dstStep, ImageSize size);
 
 /* ---- Gray conversion ---- */
+/* Weighted sums of R, G, B; a null `coeffs` selects 0.299, 0.587, 0.114. */
+ZELCC_API Status zeliRGBToGray_16s_AC4C1R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_16s_C3C1R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_16u_AC4C1R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_16u_C3C1R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_32f_AC4C1R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_32f_C3C1R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_8u_AC4C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToGray_8u_C3C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliColorToGray_16s_AC4C1R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size,
+                                            const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_16s_C3C1R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size,
+                                           const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_16u_AC4C1R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                            ImageSize size, const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_16u_C3C1R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size,
+                                           const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_32f_AC4C1R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                            const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_32f_C3C1R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,
+                                           const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_64f_AC4C1R(const double* src, int srcStep, double* dst, int dstStep, ImageSize size,
+                                            const double coeffs[3]);
+ZELCC_API Status zeliColorToGray_64f_C3C1R(const double* src, int srcStep, double* dst, int dstStep, ImageSize size,
+                                           const double coeffs[3]);
+ZELCC_API Status zeliColorToGray_8u_AC4C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                           const float coeffs[3]);
+ZELCC_API Status zeliColorToGray_8u_C3C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                          const float coeffs[3]);
 
 /* ---- Bit-depth reduction ---- */
+/* Samples reduced to `levels` equally spaced values of the destination's
+ * range. `noise` is a percentage 0..100, `ditherKind` a ReduceDitherKind;
+ * an unknown kind does nothing and succeeds. */
+typedef enum ReduceDitherKind {
+  ReduceDitherOff = 0,
+  ReduceDitherFloydSteinberg = 1,
+  ReduceDitherJarvisJudiceNinke = 2,
+  ReduceDitherStucki = 3,
+  ReduceDitherOrdered4x4 = 4
+} ReduceDitherKind;
+ZELCC_API Status zeliReduceBits_8u_C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                       ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                       ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_8u_C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                       ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                        ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16u_C1R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                        ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                        ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16u_C4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                        ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                         ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16s_C1R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                        ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                        ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16s_C4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                        ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep,
+                                         ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16u8u_C1R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16u8u_C3R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16u8u_C4R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16u8u_AC4R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16s8u_C1R(const int16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16s8u_C3R(const int16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16s8u_C4R(const int16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_16s8u_AC4R(const int16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f8u_C1R(const float* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f8u_C3R(const float* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f8u_C4R(const float* src, int srcStep, uint8_t* dst, int dstStep,
+                                          ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f8u_AC4R(const float* src, int srcStep, uint8_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f16u_C1R(const float* src, int srcStep, uint16_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f16u_C3R(const float* src, int srcStep, uint16_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f16u_C4R(const float* src, int srcStep, uint16_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f16u_AC4R(const float* src, int srcStep, uint16_t* dst, int dstStep,
+                                            ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f16s_C1R(const float* src, int srcStep, int16_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f16s_C3R(const float* src, int srcStep, int16_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f16s_C4R(const float* src, int srcStep, int16_t* dst, int dstStep,
+                                           ImageSize size, int noise, int ditherKind, int levels);
+ZELCC_API Status zeliReduceBits_32f16s_AC4R(const float* src, int srcStep, int16_t* dst, int dstStep,
+                                            ImageSize size, int noise, int ditherKind, int levels);
+/* One bit a pixel, first pixel in the highest bit of its byte, from bit
+ * dstBitOffset & 7 of dst; ditherKind 0 (threshold) or 3 (Stucki). */
+ZELCC_API Status zeliReduceBits_8u1u_C1R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                         int dstBitOffset, ImageSize size, int reserved1, int reserved2,
+                                         int ditherKind, uint8_t threshold);
+
 
 /* ---- Bayer demosaicing ---- */
+/* A mosaic frame (src, the frame's size and step) is converted within
+ * srcRegion, given in frame coordinates and clipped to the frame; the
+ * frame's edges, not the region's, decide the border rules. grid is a
+ * CfaGrid value. dst receives R, G, B from the clipped region's top left
+ * pixel on. zeliCFAToRGB_16u_C1C3R takes both steps in whole samples (an
+ * odd step loses its last bit); interpolation is not read. */
+ZELCC_API Status zeliCFAToRGB_8u_C1C3R(const uint8_t* src, CfaRegion srcRegion, ImageSize srcSize, int srcStep,
+                                       uint8_t* dst, int dstStep, int grid, int interpolation);
+ZELCC_API Status zeliCFAToRGB_16u_C1C3R(const uint16_t* src, CfaRegion srcRegion, ImageSize srcSize, int srcStep,
+                                        uint16_t* dst, int dstStep, int grid, int interpolation);
+/* tmp: the caller's scratch, 30 rows of tmpStep bytes, each with room for
+ * the clipped region's width + 6 samples; it is neither checked nor kept.
+ * The frame must be at least 5 by 5. zeliDemosaicAHD_16u_C1C3R takes its
+ * dstStep in whole samples, its srcStep in bytes. */
+ZELCC_API Status zeliDemosaicAHD_8u_C1C3R(const uint8_t* src, CfaRegion srcRegion, ImageSize srcSize, int srcStep,
+                                          uint8_t* dst, int dstStep, int grid, uint8_t* tmp, int tmpStep);
+ZELCC_API Status zeliDemosaicAHD_16u_C1C3R(const uint16_t* src, CfaRegion srcRegion, ImageSize srcSize, int srcStep,
+                                           uint16_t* dst, int dstStep, int grid, uint8_t* tmp, int tmpStep);
 
 /* ---- Tone mapping ---- */
+/* Float samples to 8 bits by 255 / maximum (Linear, no saturation) or 255 / (2 * mean) (Mean, */
+/* saturated). StatusNothingDoneWarning leaves dst as it was when the maximum or mean is negative. */
+ZELCC_API Status zeliToneMapLinear_32f8u_C1R(const float* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliToneMapMean_32f8u_C1R(const float* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
 
 #ifdef __cplusplus
 }

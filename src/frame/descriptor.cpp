@@ -169,6 +169,7 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
   std::istringstream in(extras);
   std::string word;
   std::vector<std::string> order;  // custom order words, if given
+  std::vector<std::string> presize;  // family arguments that precede size
   while (in >> word) {
     if (word == "alpha") {
       // The destination's fourth channel value, in its sample type.
@@ -190,6 +191,10 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       }
       Extra e{f[0], kinds.at(f[1]), std::atof(f[2].c_str()), {}};
       for (size_t k = 3; k < f.size(); ++k) {
+        if (f[k] == "optional" && e.kind == ArgKind::Pointer) {
+          e.optional = true;
+          continue;
+        }
         const size_t eq = f[k].find('=');
         if (eq == std::string::npos) {
           error = "bad value list in extras of " + d.name;
@@ -198,6 +203,9 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
         e.bad.push_back({std::atof(f[k].substr(0, eq).c_str()), static_cast<Status>(std::atoi(f[k].c_str() + eq + 1))});
       }
       d.extras.push_back(e);
+    } else if (word.rfind("presize=", 0) == 0) {
+      // presize=NAME: the family argument NAME stands before size.
+      presize.push_back(word.substr(8));
     } else if (word.rfind("min=", 0) == 0) {
       if (std::sscanf(word.c_str() + 4, "%dx%d", &d.minWidth, &d.minHeight) != 2) {
         error = "bad min= in extras of " + d.name;
@@ -218,8 +226,24 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       d.warnsOdd = true;
     } else if (word == "steps") {
       d.checksSteps = true;
+    } else if (word == "samplesteps" || word == "samplesteps=dst") {
+      // 16-bit and 32-bit steps are shifted into samples, odd bytes dropped;
+      // with =dst the source's step stays a byte count.
+      d.stepsInSamples = true;
+      d.srcStepInBytes = word != "samplesteps";
     } else if (word == "alphawritten") {
       d.writesAlpha = true;
+    } else if (word.rfind("planestested=", 0) == 0) {
+      // Only the first N entries of a plane array are tested for null.
+      d.testedPlanes = std::atoi(word.c_str() + 13);
+    } else if (word == "frame") {
+      d.frameSource = true;
+    } else if (word.rfind("scratch=", 0) == 0) {
+      // scratch=ROWS:PAD, a pointer and a step after the family values.
+      if (std::sscanf(word.c_str() + 8, "%d:%d", &d.scratchRows, &d.scratchPad) != 2 || d.scratchRows < 1) {
+        error = "bad scratch= in extras of " + d.name;
+        return false;
+      }
     } else if (word.rfind("order=", 0) == 0) {
       std::string rest = word.substr(6);
       std::replace(rest.begin(), rest.end(), ',', ' ');
@@ -230,6 +254,14 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       error = "unknown extra '" + word + "' of " + d.name;
       return false;
     }
+  }
+  for (const std::string& name : presize) {
+    auto it = std::find_if(d.extras.begin(), d.extras.end(), [&](const Extra& e) { return e.name == name; });
+    if (it == d.extras.end()) {
+      error = "presize names unknown argument '" + name + "' in " + d.name;
+      return false;
+    }
+    it->beforeSize = true;
   }
   // Check order: pointers (top level, then plane entries), size, steps,
   // family values, unless the family names its own.
@@ -242,6 +274,10 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
   for (const std::string& o : order) {
     if (o == "null") d.order.push_back({Check::NullTop});
     else if (o == "planes") d.order.push_back({Check::NullPlanes});
+    // The entries of one side's plane array, where the two sides are tested
+    // apart.
+    else if (o == "srcplanes") d.order.push_back({Check::NullPlanes, -1, 0});
+    else if (o == "dstplanes") d.order.push_back({Check::NullPlanes, -1, 1});
     else if (o == "size") d.order.push_back({Check::Size});
     else if (o == "positive") d.order.push_back({Check::SizePositive});
     else if (o == "step") d.order.push_back({Check::Step});
@@ -351,15 +387,27 @@ bool describe(const std::string& name, const std::string& extras, Descriptor& d,
 
   if (!parseExtras(extras, d, error)) return false;
 
-  // Arguments: source, destination, size, family values.
+  // Arguments: source, destination, size, family values; a frame source
+  // is pointer, region, frame size, step.
+  if (d.frameSource) {
+    d.slots = {{Role::SrcPtr}, {Role::SrcRegion}, {Role::Size}, {Role::SrcStep}};
+    addSideSlots(d, d.dst, Role::DstPtr, Role::DstPlanes, Role::DstStep, Role::DstSteps);
+    for (int i = 0; i < int(d.extras.size()); ++i) d.slots.push_back({Role::Extra, 0, i});
+    if (d.scratchRows > 0) d.slots.insert(d.slots.end(), {{Role::Scratch}, {Role::ScratchStep}});
+    return true;
+  }
   if (d.inPlace) {
     addSideSlots(d, d.src, Role::SrcDstPtr, Role::SrcDstPlanes, Role::SrcDstStep, Role::SrcDstStep);
   } else {
     addSideSlots(d, d.src, Role::SrcPtr, Role::SrcPlanes, Role::SrcStep, Role::SrcSteps);
     addSideSlots(d, d.dst, Role::DstPtr, Role::DstPlanes, Role::DstStep, Role::DstSteps);
   }
+  for (int i = 0; i < int(d.extras.size()); ++i)
+    if (d.extras[i].beforeSize) d.slots.push_back({Role::Extra, 0, i});
   d.slots.push_back({Role::Size});
-  for (int i = 0; i < int(d.extras.size()); ++i) d.slots.push_back({Role::Extra, 0, i});
+  for (int i = 0; i < int(d.extras.size()); ++i)
+    if (!d.extras[i].beforeSize) d.slots.push_back({Role::Extra, 0, i});
+  if (d.scratchRows > 0) d.slots.insert(d.slots.end(), {{Role::Scratch}, {Role::ScratchStep}});
   return true;
 }
 
@@ -435,6 +483,8 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
       // Their 4:2:0 chroma rows are width >> 1 samples long.
       if (!d.region && side.chroma == Chroma::S420 && side.isPlanar() && p > 0) b.geometry.rowBytes = w >> 1;
       b.step = b.geometry.rowBytes + padBytes;
+      const bool inSamples = d.stepsInSamples && !(sideIndex == 0 && d.srcStepInBytes);
+      b.pitch = inSamples ? b.step / b.geometry.sampleBytes * b.geometry.sampleBytes : b.step;
       const int rows = std::max(b.geometry.rows, 1);
       const size_t total = size_t(kGuard) * 2 + size_t(offset) + size_t(b.step) * rows + 64;
       b.bytes.assign(total, kGuardByte);
@@ -451,6 +501,16 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
     addSide(d.src, 0);
     addSide(d.dst, 1);
   }
+  if (d.scratchRows > 0) {
+    // Every byte of the rows belongs to the call; guards lie outside them.
+    Buffer b;
+    b.step = (w + d.scratchPad) * sampleBytes(d.src.sample) + padBytes;
+    b.pitch = b.step;
+    b.geometry = PlaneGeometry{b.step, d.scratchRows, 1};
+    b.bytes.assign(size_t(kGuard) * 2 + size_t(offset) + size_t(b.step) * d.scratchRows + 64, kGuardByte);
+    b.side = 3;
+    buffers_.push_back(std::move(b));
+  }
   for (const Extra& e : d.extras) {
     std::vector<float> values;
     if (e.kind == ArgKind::Pointer) values.assign(size_t(std::max(e.good, 4.0)) / 4 + 1, 0.25f);
@@ -462,6 +522,7 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
     const uintptr_t mis = reinterpret_cast<uintptr_t>(base) & 63u;
     base += (64 - mis) & 63u;
     b.first = base + offset;
+    if (b.side == 3) continue;
     if (b.side == 0) {
       srcPlanes_.push_back(b.first);
       srcSteps_.push_back(b.step);
@@ -490,7 +551,7 @@ void Workspace::fillRandom(uint32_t seed) {
   for (Buffer& b : buffers_) {
     if (!b.isSource) continue;
     for (int y = 0; y < b.geometry.rows; ++y) {
-      uint8_t* row = b.first + size_t(y) * b.step;
+      uint8_t* row = b.first + size_t(y) * b.pitch;
       if (d_.src.sample == Sample::F32) {
         // Floats in 0..1, the range colour functions take.
         std::uniform_real_distribution<float> dist(0.0f, 1.0f);
@@ -508,7 +569,7 @@ void Workspace::fillRandom(uint32_t seed) {
 void Workspace::fillDestinations(uint8_t value) {
   for (Buffer& b : buffers_) {
     if (!b.isDestination || b.isSource) continue;
-    for (int y = 0; y < b.geometry.rows; ++y) std::memset(b.first + size_t(y) * b.step, value, b.geometry.rowBytes);
+    for (int y = 0; y < b.geometry.rows; ++y) std::memset(b.first + size_t(y) * b.pitch, value, b.geometry.rowBytes);
   }
 }
 
@@ -551,6 +612,15 @@ std::vector<Arg> Workspace::arguments(const std::vector<double>* extraValues) {
       case Role::DstStep:
       case Role::SrcDstStep: args.push_back(intArg(bufferOf(sideOf(s.role), s.plane)->step)); break;
       case Role::SrcSteps: args.push_back(pointerArg(srcSteps_.data())); break;
+      case Role::SrcRegion: {
+        Arg a;
+        a.kind = ArgKind::Region;
+        a.region = CfaRegion{0, 0, size_.width, size_.height};
+        args.push_back(a);
+        break;
+      }
+      case Role::Scratch: args.push_back(pointerArg(bufferOf(3, 0)->first)); break;
+      case Role::ScratchStep: args.push_back(intArg(bufferOf(3, 0)->step)); break;
       case Role::DstSteps: args.push_back(pointerArg(dstSteps_.data())); break;
       case Role::Size: {
         Arg a;
@@ -589,17 +659,18 @@ std::string Workspace::checkGuards() const {
     const uint8_t* hi = lo + b.bytes.size();
     auto describeAt = [&](const uint8_t* p) {
       std::ostringstream m;
-      m << (b.side == 0 ? "source" : b.side == 1 ? "destination" : "in-place image") << " plane " << b.plane
+      m << (b.side == 0 ? "source" : b.side == 1 ? "destination" : b.side == 2 ? "in-place image" : "scratch")
+        << " plane " << b.plane
         << ": byte at offset " << (p - b.first) << " from the region's start changed";
       return m.str();
     };
     const int rows = b.geometry.rows;
-    const uint8_t* regionEnd = b.first + (rows > 0 ? size_t(rows - 1) * b.step + b.geometry.rowBytes : 0);
+    const uint8_t* regionEnd = b.first + (rows > 0 ? size_t(rows - 1) * b.pitch + b.geometry.rowBytes : 0);
     for (const uint8_t* p = lo; p < b.first; ++p)
       if (*p != kGuardByte) return describeAt(p);
     for (int y = 0; y + 1 < rows; ++y) {
-      const uint8_t* padStart = b.first + size_t(y) * b.step + b.geometry.rowBytes;
-      for (const uint8_t* p = padStart; p < b.first + size_t(y + 1) * b.step; ++p)
+      const uint8_t* padStart = b.first + size_t(y) * b.pitch + b.geometry.rowBytes;
+      for (const uint8_t* p = padStart; p < b.first + size_t(y + 1) * b.pitch; ++p)
         if (*p != kGuardByte) return describeAt(p);
     }
     for (const uint8_t* p = regionEnd; p < hi; ++p)

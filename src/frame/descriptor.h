@@ -55,6 +55,8 @@ struct Extra {
   double good;
   std::vector<BadValue> bad;
   int stage = -1;  // where its check stands in the order (index into Descriptor::order)
+  bool optional = false;  // a pointer whose null is valid (it selects a default)
+  bool beforeSize = false;  // stands before `size` in the prototype
 };
 
 // Steps of the argument checks, in the order a member runs them.
@@ -64,11 +66,15 @@ enum class Check { NullTop, NullPlanes, SizePositive, Size, Step, Extra };
 struct CheckStage {
   Check check;
   int extra = -1;  // for Check::Extra
+  int side = -1;   // for Check::NullPlanes: 0 source, 1 destination, -1 every plane array
 };
 
 // Argument roles in prototype order.
+// A colour filter array source is a frame: its pointer, the region to
+// convert (SrcRegion), the frame's size and its step. Scratch and
+// ScratchStep are a caller-owned work area that nobody checks.
 enum class Role { SrcPtr, SrcPlanes, SrcStep, SrcSteps, DstPtr, DstPlanes, DstStep, DstSteps, SrcDstPtr,
-                  SrcDstPlanes, SrcDstStep, Size, Extra };
+                  SrcDstPlanes, SrcDstStep, Size, Extra, SrcRegion, Scratch, ScratchStep };
 struct ArgSlot {
   Role role;
   int plane = 0;   // for P2: 0 luma, 1 chroma
@@ -101,6 +107,15 @@ struct Descriptor {
   bool warnsOdd = false;        // may return StatusOddSizeWarning
   bool writesAlpha = false;     // an AC4 destination's fourth channel is written
   bool checksSteps = false;
+  int testedPlanes = 0;       // plane entries tested for null per array; 0: all
+  bool stepsInSamples = false;  // byte steps are cut down to whole samples
+  bool srcStepInBytes = false;  // ... except the source's
+  // The source is a frame given with a region (the whole frame in a
+  // workspace); the size argument is the frame's.
+  bool frameSource = false;
+  // Caller scratch after the family values: scratchRows rows, each of
+  // (width + scratchPad) source samples.
+  int scratchRows = 0, scratchPad = 0;
   void (*impl)() = nullptr;
   Invoker invoke = nullptr;
   std::vector<ArgKind> prototype;  // kinds of the prototype's parameters
@@ -139,11 +154,12 @@ class Workspace {
   struct Buffer {
     std::vector<uint8_t> bytes;  // guard + rows + guard
     uint8_t* first = nullptr;    // first byte of the region
-    int step = 0;
+    int step = 0;   // the step argument
+    int pitch = 0;  // where the rows lie: the step, or its whole samples
     PlaneGeometry geometry{};
     bool isSource = false;
     bool isDestination = false;
-    int side = 0;    // 0 source, 1 destination, 2 in place
+    int side = 0;    // 0 source, 1 destination, 2 in place, 3 scratch
     int plane = 0;
   };
 
@@ -153,6 +169,7 @@ class Workspace {
   void fillRandom(uint32_t seed);
   void fillDestinations(uint8_t value);
   // Arguments in prototype order; `extraValues` replaces the good values.
+  // A frame source passes the whole frame as its region.
   std::vector<Arg> arguments(const std::vector<double>* extraValues = nullptr);
   // The plane-pointer array of a side (0 source, 1 destination, 2 in place),
   // which `arguments` passes by address.

@@ -151,7 +151,8 @@ struct PackedOutAlpha {
 };
 
 // Four-byte pixels whose fourth byte is left as it is (AC4). Written one
-// pixel at a time: a vector store would rewrite the fourth byte.
+// pixel at a time: a vector store would rewrite the fourth byte. A vector
+// block is merged into pixels on the stack and stored three bytes a pixel.
 struct PackedOutKeep {
   uint8_t* p;
   void pixel(int x, int a, int b, int c) const {
@@ -159,6 +160,19 @@ struct PackedOutKeep {
     q[0] = static_cast<uint8_t>(a);
     q[1] = static_cast<uint8_t>(b);
     q[2] = static_cast<uint8_t>(c);
+  }
+  template <class U>
+  void block(int x, const Trio<U>& v) const {
+    const typename U::V z = U::zero();
+    const typename U::V lo01 = U::unpackLo8(v.c0, v.c1), hi01 = U::unpackHi8(v.c0, v.c1);
+    const typename U::V lo23 = U::unpackLo8(v.c2, z), hi23 = U::unpackHi8(v.c2, z);
+    alignas(32) uint8_t px[64 * U::kUnits];
+    U::storeUnits(px, 64, U::unpackLo16(lo01, lo23));
+    U::storeUnits(px + 16, 64, U::unpackHi16(lo01, lo23));
+    U::storeUnits(px + 32, 64, U::unpackLo16(hi01, hi23));
+    U::storeUnits(px + 48, 64, U::unpackHi16(hi01, hi23));
+    uint8_t* q = p + 4 * x;
+    for (int i = 0; i < U::kPixels; ++i) std::memcpy(q + 4 * i, px + 4 * i, 3);
   }
 };
 

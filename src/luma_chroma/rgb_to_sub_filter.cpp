@@ -70,17 +70,18 @@ constexpr Taps kCbTaps{-2426, -4769, 7193, -1213, -2385, 3596};
 constexpr Taps kCrTaps{7193, -6030, -1164, 3596, -3015, -582};
 
 using M = More<Sse>;
+using S = Sse;
 
 // Chroma of four pairs: centre(2i) + side(2i + 1) + side(2i - 1) + addend,
 // >> 15; `carry` holds side(2i + 1) of the previous four pairs.
 inline __m128i filteredChroma(__m128i r, __m128i g, __m128i b, const Taps& t, __m128i& carry) {
-  const __m128i own = M::add32(M::add32(M::madd(r, M::pair16(t.r, t.sr)), M::madd(g, M::pair16(t.g, t.sg))),
-                               M::madd(b, M::pair16(t.b, t.sb)));
-  const __m128i side = M::add32(M::add32(M::madd(r, M::pair16(0, t.sr)), M::madd(g, M::pair16(0, t.sg))),
-                                M::madd(b, M::pair16(0, t.sb)));
+  const __m128i own = S::add32(S::add32(S::madd16(r, M::pair16(t.r, t.sr)), S::madd16(g, M::pair16(t.g, t.sg))),
+                               S::madd16(b, M::pair16(t.b, t.sb)));
+  const __m128i side = S::add32(S::add32(S::madd16(r, M::pair16(0, t.sr)), S::madd16(g, M::pair16(0, t.sg))),
+                                S::madd16(b, M::pair16(0, t.sb)));
   const __m128i before = _mm_alignr_epi8(side, carry, 12);
   carry = side;
-  return M::sra32<15>(M::add32(M::add32(own, before), M::set32(kFilterAddend)));
+  return S::sra32<15>(S::add32(S::add32(own, before), S::set32(kFilterAddend)));
 }
 
 // Blocks of 16 pixels; returns the first pixel not converted.
@@ -103,7 +104,7 @@ int vectorPairs(const FilterSource& in, uint8_t* dst, int end) {
     const __m128i cbHi = filteredChroma(r.hi, g.hi, b.hi, kCbTaps, cbCarry);
     const __m128i crLo = filteredChroma(r.lo, g.lo, b.lo, kCrTaps, crCarry);
     const __m128i crHi = filteredChroma(r.hi, g.hi, b.hi, kCrTaps, crCarry);
-    const __m128i cc = _mm_packus_epi16(M::packs32(cbLo, cbHi), M::packs32(crLo, crHi));
+    const __m128i cc = _mm_packus_epi16(S::packS32(cbLo, cbHi), S::packS32(crLo, crHi));
     out.block<Sse>(x, _mm_packus_epi16(yLo, yHi), cc);
   }
   return x;

@@ -168,7 +168,21 @@ ZEL_PUBLIC Status zeliRGBToYUV420_8u_C3P3(const uint8_t* src, uint8_t* const dst
   return oddWarning420(size);
 }
 
-// ---- 4:2:2 in planes ----
+// ---- 4:2:2 ----
+
+ZEL_PUBLIC Status zeliRGBToYUV422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                           ImageSize size) {
+  if (!src || !dst) return StatusNullPointerError;
+  if (size.width < 1 || size.height < 1) return StatusSizeError;
+  const bool avx2 = zel::hasAvx2();
+  using Tail = WideDifference422Tail<32768, 32768, OddDifferenceRounded>;
+  zel::plainWalk(size.height, [&](int y) {
+    convertRow<2>(PackedSource<3, false>{PackedIn<3>{zel::rowAt(src, srcStep, y)}},
+                  PairsOut<PairOrder::YCbCr>{zel::rowAt(dst, dstStep, y)}, size.width, size.width & ~15,
+                  DifferenceBody<2>{}, Tail{}, avx2);
+  });
+  return StatusOk;
+}
 
 ZEL_PUBLIC Status zeliRGBToYUV422_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3],
                                            const int dstSteps[3], ImageSize size) {

@@ -16,6 +16,7 @@
 #include "frame/scalar_ops.h"
 #include "luma_chroma/rgb_to_sub_forms.h"
 #include "luma_chroma/vector_units.h"
+#include "luma_chroma/yuv_lanes.h"
 
 namespace zel::lc::sub {
 
@@ -189,6 +190,15 @@ struct WideDifference422Tail {
 template <bool Rounding>
 struct Odd15 {
   OddPixel operator()(const Rgb& p) const { return yuvOdd15<Rounding>(p); }
+};
+
+// The rounded difference form of the full-resolution family, for a last odd
+// pixel of the interleaved stream.
+struct OddDifferenceRounded {
+  OddPixel operator()(const Rgb& p) const {
+    const lc::Pixel8 d = lc::yuvDifferenceRounded(p.r, p.g, p.b);
+    return {d.c0, d.c1, d.c2};
+  }
 };
 
 // The pairs after the aligned kernel's blocks: per pixel

@@ -64,6 +64,16 @@ struct Sse {
   static V unpackHi16(V a, V b) { return _mm_unpackhi_epi16(a, b); }
   // Signed 16-bit lanes to bytes clamped to 0..255: SaturateU8.
   static V packU8(V lo, V hi) { return _mm_packus_epi16(lo, hi); }
+  // 32-bit lanes, for exact wide forms: pairs of 16-bit lanes times a pair
+  // of constants summed (pmaddwd), and back to 16 bits with saturation.
+  static V set32(int32_t v) { return _mm_set1_epi32(v); }
+  static V mulLo16(V a, V b) { return _mm_mullo_epi16(a, b); }
+  static V madd16(V a, V b) { return _mm_madd_epi16(a, b); }
+  static V add32(V a, V b) { return _mm_add_epi32(a, b); }
+  static V sub32(V a, V b) { return _mm_sub_epi32(a, b); }
+  template <int N>
+  static V sra32(V a) { return _mm_srai_epi32(a, N); }
+  static V packS32(V lo, V hi) { return _mm_packs_epi32(lo, hi); }
 };
 
 struct Avx {
@@ -105,6 +115,14 @@ struct Avx {
   ZEL_AVX2 static V unpackLo16(V a, V b) { return _mm256_unpacklo_epi16(a, b); }
   ZEL_AVX2 static V unpackHi16(V a, V b) { return _mm256_unpackhi_epi16(a, b); }
   ZEL_AVX2 static V packU8(V lo, V hi) { return _mm256_packus_epi16(lo, hi); }
+  ZEL_AVX2 static V set32(int32_t v) { return _mm256_set1_epi32(v); }
+  ZEL_AVX2 static V mulLo16(V a, V b) { return _mm256_mullo_epi16(a, b); }
+  ZEL_AVX2 static V madd16(V a, V b) { return _mm256_madd_epi16(a, b); }
+  ZEL_AVX2 static V add32(V a, V b) { return _mm256_add_epi32(a, b); }
+  ZEL_AVX2 static V sub32(V a, V b) { return _mm256_sub_epi32(a, b); }
+  template <int N>
+  ZEL_AVX2 static V sra32(V a) { return _mm256_srai_epi32(a, N); }
+  ZEL_AVX2 static V packS32(V lo, V hi) { return _mm256_packs_epi32(lo, hi); }
 };
 
 // Three channels of a block: bytes (16 pixels a unit) or 16-bit lanes.

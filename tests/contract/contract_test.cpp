@@ -28,7 +28,9 @@ ArgKind slotKind(const Descriptor& d, const ArgSlot& s) {
   switch (s.role) {
     case Role::SrcStep:
     case Role::DstStep:
-    case Role::SrcDstStep: return ArgKind::Int32;
+    case Role::SrcDstStep:
+    case Role::ScratchStep: return ArgKind::Int32;
+    case Role::SrcRegion: return ArgKind::Region;
     case Role::Size: return ArgKind::Size;
     case Role::Extra: return d.extras[s.extra].kind;
     default: return ArgKind::Pointer;
@@ -55,7 +57,8 @@ std::vector<Failure> failuresOf(const Descriptor& d, const CheckStage& stage) {
     case Check::NullTop:
       for (size_t i = 0; i < d.slots.size(); ++i) {
         const Role r = d.slots[i].role;
-        const bool recordPointer = r == Role::Extra && d.extras[d.slots[i].extra].kind == ArgKind::Pointer;
+        const bool recordPointer = r == Role::Extra && d.extras[d.slots[i].extra].kind == ArgKind::Pointer &&
+                                   !d.extras[d.slots[i].extra].optional;
         if (r == Role::SrcPtr || r == Role::DstPtr || r == Role::SrcDstPtr || r == Role::SrcPlanes ||
             r == Role::DstPlanes || r == Role::SrcDstPlanes || recordPointer)
           out.push_back({"null argument " + std::to_string(i), StatusNullPointerError,
@@ -65,9 +68,10 @@ std::vector<Failure> failuresOf(const Descriptor& d, const CheckStage& stage) {
     case Check::NullPlanes:
       for (const ArgSlot& s : d.slots) {
         const int side = s.role == Role::SrcPlanes ? 0 : s.role == Role::DstPlanes ? 1 : s.role == Role::SrcDstPlanes ? 2 : -1;
-        if (side < 0) continue;
+        if (side < 0 || (stage.side >= 0 && stage.side != side)) continue;
         const Side& sd = side == 1 ? d.dst : d.src;
-        for (int k = 0; k < sd.planes(); ++k)
+        const int tested = d.testedPlanes > 0 ? std::min(d.testedPlanes, sd.planes()) : sd.planes();
+        for (int k = 0; k < tested; ++k)
           out.push_back({"null plane " + std::to_string(k) + " of side " + std::to_string(side), StatusNullPointerError,
                          [side, k](Workspace& w, std::vector<Arg>&, ImageSize&) { w.planeArray(side)[k] = nullptr; }});
       }
@@ -210,7 +214,7 @@ void expectGuardsKept(const Descriptor& d, ImageSize size, int pad, int offset) 
       for (int y = 0; y < b.geometry.rows; ++y)
         for (int x = 0; x < size.width; ++x)
           for (int k = 0; k < px; ++k) {
-            const size_t at = start + size_t(y) * b.step + size_t(x) * 4 * px + 3 * px + k;
+            const size_t at = start + size_t(y) * b.pitch + size_t(x) * 4 * px + 3 * px + k;
             ASSERT_EQ(before[i][at], after[i][at]) << "alpha of pixel " << x << "," << y << " was written";
           }
     }
@@ -249,6 +253,21 @@ TEST_P(Contract, ZeroStepsPassWhereStepsAreNotChecked) {
   }
   const Status s = w.call(args);
   EXPECT_TRUE(s == StatusOk || (d.warnsOdd && s == StatusOddSizeWarning)) << s;
+  EXPECT_EQ(w.checkGuards(), "");
+}
+
+TEST_P(Contract, OptionalPointersMayBeNull) {
+  const Descriptor& d = *GetParam();
+  std::vector<size_t> optional;
+  for (size_t i = 0; i < d.slots.size(); ++i)
+    if (d.slots[i].role == Role::Extra && d.extras[d.slots[i].extra].optional) optional.push_back(i);
+  if (optional.empty()) GTEST_SKIP() << "no optional pointer";
+  Workspace w(d, ImageSize{std::max(d.minWidth, 11), std::max(d.minHeight, 3)}, 13, 3);
+  w.fillRandom(5);
+  w.fillDestinations(0x5A);
+  std::vector<Arg> args = w.arguments();
+  for (size_t i : optional) args[i].p = nullptr;
+  EXPECT_EQ(int(w.call(args)), int(StatusOk));
   EXPECT_EQ(w.checkGuards(), "");
 }
 

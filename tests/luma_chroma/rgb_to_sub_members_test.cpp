@@ -255,6 +255,15 @@ Model yuv422Model(bool interleaved, bool oneRow) {
   m.oneRow = oneRow;
   return m;
 }
+// The pair stream: rounded luma, and the rounded difference form of the
+// full-resolution family (Y and U) for a last odd pixel.
+Model yuv422PairsModel() {
+  return {Geo::S422, Dst::C2YCbCr, false, [](int w) { return w & ~15; }, [](Px p, int) { return sat8(yuvP(p) >> 1); },
+          [](Px p, int) { return (yuvT(p) + 32768) >> 16; }, difference422,
+          [](const std::vector<Px>& v) { return wideDifference(v, 32768, 17); },
+          [](Px p) { return CC{((((p.b << 16) - yuvT(p) + 32768) >> 16) * 32244 >> 16) + 128 & 255, 0}; }};
+}
+
 // The second kernel of the interleaved member, for aligned buffers.
 Model yuv422AlignedModel() {
   Model m{Geo::S422, Dst::P3, false, [](int w) { return w & ~15; }, [](Px p, int) { return sat8(yuvQ(p) >> 6); },
@@ -309,6 +318,7 @@ const std::vector<Case>& cases() {
       {"zeliRGBToYUV422_8u_C3P3", yuv422Model(true, true), {yuv422AlignedModel()}},
       {"zeliRGBToYUV422_8u_P3R", yuv422Model(false, false)},
       {"zeliRGBToYUV422_8u_P3", yuv422Model(false, true)},
+      {"zeliRGBToYUV422_8u_C3C2R", yuv422PairsModel()},
   };
   return all;
 }

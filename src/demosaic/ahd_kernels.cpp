@@ -1,0 +1,230 @@
+#include "demosaic/ahd_kernels.h"
+
+#include <initializer_list>
+
+#include "demosaic/rgb_store.h"
+#include "frame/simd.h"
+
+namespace zel {
+
+VectorLevel bestVectorLevel() { return hasAvx2() ? VectorLevel::Avx2 : VectorLevel::Sse41; }
+
+namespace {
+
+// Two 16-bit weights side by side in a 32-bit lane, for multiply-adds.
+constexpr int32_t wordWeights(int first, int second) {
+  return int32_t(uint32_t(uint16_t(first)) | (uint32_t(uint16_t(second)) << 16));
+}
+
+}  // namespace
+
+// ---- SSE4.1: 4 lanes ----
+namespace sse {
+
+using Vec = __m128i;
+constexpr int kLanes = 4;
+
+inline Vec loadLanes(const uint8_t* p) { return _mm_cvtepu8_epi32(load32(p)); }
+inline Vec loadLanes(const uint16_t* p) { return _mm_cvtepu16_epi32(load64(p)); }
+inline Vec loadLanes(const int32_t* p) { return load128(p); }
+inline Vec loadSignedLanes(const uint8_t* p) { return _mm_cvtepi8_epi32(load32(p)); }
+inline Vec loadSignedLanes(const uint16_t* p) { return _mm_cvtepi16_epi32(load64(p)); }
+// Samples keep the low bits of each lane, as a cast to the sample type.
+inline void storeLanes(uint8_t* p, Vec v) {
+  const int32_t w = _mm_cvtsi128_si32(
+      _mm_shuffle_epi8(v, _mm_setr_epi8(0, 4, 8, 12, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1)));
+  __builtin_memcpy(p, &w, 4);
+}
+inline void storeLanes(uint16_t* p, Vec v) {
+  store64(p, _mm_shuffle_epi8(v, _mm_setr_epi8(0, 1, 4, 5, 8, 9, 12, 13, -1, -1, -1, -1, -1, -1, -1, -1)));
+}
+inline void storeLanes(int32_t* p, Vec v) { store128(p, v); }
+
+inline Vec broadcast(int32_t v) { return _mm_set1_epi32(v); }
+inline Vec add(Vec a, Vec b) { return _mm_add_epi32(a, b); }
+inline Vec sub(Vec a, Vec b) { return _mm_sub_epi32(a, b); }
+template <int N>
+inline Vec shiftRight(Vec a) {
+  return _mm_srai_epi32(a, N);
+}
+inline Vec smaller(Vec a, Vec b) { return _mm_min_epi32(a, b); }
+inline Vec larger(Vec a, Vec b) { return _mm_max_epi32(a, b); }
+inline Vec magnitude(Vec a) { return _mm_abs_epi32(a); }
+inline Vec multiplyLow(Vec a, Vec b) { return _mm_mullo_epi32(a, b); }
+inline Vec multiplyAdd(Vec a, Vec b) { return _mm_madd_epi16(a, b); }
+inline Vec greater(Vec a, Vec b) { return _mm_cmpgt_epi32(a, b); }
+inline Vec either(Vec a, Vec b) { return _mm_or_si128(a, b); }
+inline Vec select(Vec mask, Vec a, Vec b) { return _mm_blendv_epi8(b, a, mask); }
+// The low word of `low` and the low word of `high` side by side in a lane.
+inline Vec wordPairs(Vec low, Vec high) { return _mm_blend_epi16(low, _mm_slli_epi32(high, 16), 0xAA); }
+inline Vec greenLanes(bool firstGreen) {
+  return firstGreen ? _mm_setr_epi32(-1, 0, -1, 0) : _mm_setr_epi32(0, -1, 0, -1);
+}
+
+#define ZEL_LANES
+#include "demosaic/ahd_lanes.inc"
+#undef ZEL_LANES
+
+}  // namespace sse
+
+// ---- AVX2: 8 lanes, the same bits ----
+namespace avx2 {
+
+using Vec = __m256i;
+constexpr int kLanes = 8;
+
+ZEL_AVX2 inline Vec loadLanes(const uint8_t* p) { return _mm256_cvtepu8_epi32(load64(p)); }
+ZEL_AVX2 inline Vec loadLanes(const uint16_t* p) { return _mm256_cvtepu16_epi32(load128(p)); }
+ZEL_AVX2 inline Vec loadLanes(const int32_t* p) { return load256(p); }
+ZEL_AVX2 inline Vec loadSignedLanes(const uint8_t* p) { return _mm256_cvtepi8_epi32(load64(p)); }
+ZEL_AVX2 inline Vec loadSignedLanes(const uint16_t* p) { return _mm256_cvtepi16_epi32(load128(p)); }
+ZEL_AVX2 inline void storeLanes(uint8_t* p, Vec v) {
+  const __m256i bytes =
+      _mm256_shuffle_epi8(v, _mm256_setr_epi8(0, 4, 8, 12, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, 0, 4, 8, 12,
+                                              -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1));
+  store64(p, _mm_unpacklo_epi32(_mm256_castsi256_si128(bytes), _mm256_extracti128_si256(bytes, 1)));
+}
+ZEL_AVX2 inline void storeLanes(uint16_t* p, Vec v) {
+  const __m256i words =
+      _mm256_shuffle_epi8(v, _mm256_setr_epi8(0, 1, 4, 5, 8, 9, 12, 13, -1, -1, -1, -1, -1, -1, -1, -1, 0, 1, 4, 5, 8,
+                                              9, 12, 13, -1, -1, -1, -1, -1, -1, -1, -1));
+  store128(p, _mm256_castsi256_si128(_mm256_permute4x64_epi64(words, 0x08)));
+}
+ZEL_AVX2 inline void storeLanes(int32_t* p, Vec v) { store256(p, v); }
+
+ZEL_AVX2 inline Vec broadcast(int32_t v) { return _mm256_set1_epi32(v); }
+ZEL_AVX2 inline Vec add(Vec a, Vec b) { return _mm256_add_epi32(a, b); }
+ZEL_AVX2 inline Vec sub(Vec a, Vec b) { return _mm256_sub_epi32(a, b); }
+template <int N>
+ZEL_AVX2 inline Vec shiftRight(Vec a) {
+  return _mm256_srai_epi32(a, N);
+}
+ZEL_AVX2 inline Vec smaller(Vec a, Vec b) { return _mm256_min_epi32(a, b); }
+ZEL_AVX2 inline Vec larger(Vec a, Vec b) { return _mm256_max_epi32(a, b); }
+ZEL_AVX2 inline Vec magnitude(Vec a) { return _mm256_abs_epi32(a); }
+ZEL_AVX2 inline Vec multiplyLow(Vec a, Vec b) { return _mm256_mullo_epi32(a, b); }
+ZEL_AVX2 inline Vec multiplyAdd(Vec a, Vec b) { return _mm256_madd_epi16(a, b); }
+ZEL_AVX2 inline Vec greater(Vec a, Vec b) { return _mm256_cmpgt_epi32(a, b); }
+ZEL_AVX2 inline Vec either(Vec a, Vec b) { return _mm256_or_si256(a, b); }
+ZEL_AVX2 inline Vec select(Vec mask, Vec a, Vec b) { return _mm256_blendv_epi8(b, a, mask); }
+ZEL_AVX2 inline Vec wordPairs(Vec low, Vec high) { return _mm256_blend_epi16(low, _mm256_slli_epi32(high, 16), 0xAA); }
+ZEL_AVX2 inline Vec greenLanes(bool firstGreen) {
+  return firstGreen ? _mm256_setr_epi32(-1, 0, -1, 0, -1, 0, -1, 0) : _mm256_setr_epi32(0, -1, 0, -1, 0, -1, 0, -1);
+}
+
+#define ZEL_LANES ZEL_AVX2
+#include "demosaic/ahd_lanes.inc"
+#undef ZEL_LANES
+
+}  // namespace avx2
+
+namespace {
+
+// Pointers moved on by `i` pixels.
+template <typename T>
+GreenTaps<T> advanced(const GreenTaps<T>& t, int i) {
+  return GreenTaps<T>{t.c + i, t.a + i, t.b + i, t.l + i, t.r + i};
+}
+template <typename T>
+ColourTaps<T> advanced(const ColourTaps<T>& t, int i) {
+  return ColourTaps<T>{t.gUp + i, t.g + i, t.gDown + i, t.sUp + i, t.s + i, t.sDown + i};
+}
+inline LumaChromaRow advanced(const LumaChromaRow& r, int i) { return LumaChromaRow{r.y + i, r.cb + i, r.cr + i}; }
+inline LumaChromaView advanced(const LumaChromaView& r, int i) { return LumaChromaView{r.y + i, r.cb + i, r.cr + i}; }
+
+// Runs `blocks` of each level down from `level` on what the wider ones
+// left, and returns the pixels done; an even count keeps the site phase.
+template <typename Avx, typename Sse>
+int vectorBlocks(VectorLevel level, int count, Avx avx, Sse sse) {
+  int done = 0;
+  if (level == VectorLevel::Avx2) done = avx(0, count);
+  if (level != VectorLevel::Scalar) done += sse(done, count - done);
+  return done;
+}
+
+}  // namespace
+
+template <typename T>
+void greenRow(const GreenTaps<T>& t, int count, bool firstGreen, T* out, VectorLevel level) {
+  const int done = vectorBlocks(
+      level, count, [&](int i, int n) { return avx2::greenBlocks(advanced(t, i), n, firstGreen, out + i); },
+      [&](int i, int n) { return sse::greenBlocks(advanced(t, i), n, firstGreen, out + i); });
+  greenRowScalar(advanced(t, done), count - done, firstGreen, out + done);
+}
+
+template <typename T>
+void colourRow(const ColourTaps<T>& t, int count, bool firstGreen, bool redRow, T* outR, T* outB, VectorLevel level) {
+  const int done = vectorBlocks(
+      level, count,
+      [&](int i, int n) { return avx2::colourBlocks(advanced(t, i), n, firstGreen, redRow, outR + i, outB + i); },
+      [&](int i, int n) { return sse::colourBlocks(advanced(t, i), n, firstGreen, redRow, outR + i, outB + i); });
+  colourRowScalar(advanced(t, done), count - done, firstGreen, redRow, outR + done, outB + done);
+}
+
+template <typename T>
+void lumaChromaRow(const T* r, const T* g, const T* b, int count, const LumaChromaRow& out, VectorLevel level) {
+  const int done = vectorBlocks(
+      level, count, [&](int i, int n) { return avx2::lumaChromaBlocks(r + i, g + i, b + i, n, advanced(out, i)); },
+      [&](int i, int n) { return sse::lumaChromaBlocks(r + i, g + i, b + i, n, advanced(out, i)); });
+  lumaChromaRowScalar(r + done, g + done, b + done, count - done, advanced(out, done));
+}
+
+template <typename T>
+void homogeneityRow(const LumaChromaView h[3], const LumaChromaView v[3], int count, T* out, VectorLevel level) {
+  auto shifted = [&](int i, LumaChromaView(&hs)[3], LumaChromaView(&vs)[3]) {
+    for (int k = 0; k < 3; ++k) hs[k] = advanced(h[k], i), vs[k] = advanced(v[k], i);
+  };
+  const int done = vectorBlocks(
+      level, count,
+      [&](int i, int n) {
+        LumaChromaView hs[3], vs[3];
+        shifted(i, hs, vs);
+        return avx2::homogeneityBlocks(hs, vs, n, out + i);
+      },
+      [&](int i, int n) {
+        LumaChromaView hs[3], vs[3];
+        shifted(i, hs, vs);
+        return sse::homogeneityBlocks(hs, vs, n, out + i);
+      });
+  LumaChromaView hs[3], vs[3];
+  shifted(done, hs, vs);
+  homogeneityRowScalar(hs, vs, count - done, out + done);
+}
+
+template <typename T>
+void windowSumRow(const T* up, const T* mid, const T* down, int count, int32_t* sums, VectorLevel level) {
+  const int done = vectorBlocks(
+      level, count, [&](int i, int n) { return avx2::windowSumBlocks(up + i, mid + i, down + i, n, sums + i); },
+      [&](int i, int n) { return sse::windowSumBlocks(up + i, mid + i, down + i, n, sums + i); });
+  windowSumRowScalar(up + done, mid + done, down + done, count - done, sums + done);
+}
+
+template <typename T>
+void chooseRow(const T* const h[3], const T* const v[3], const uint8_t* takeV, int count, T* dst, VectorLevel level) {
+  constexpr int block = 16 / int(sizeof(T));
+  int i = 0;
+  if (level != VectorLevel::Scalar) {
+    for (; i + block <= count; i += block) {
+      const __m128i mask = sizeof(T) == 1 ? load128(takeV + i) : _mm_cvtepi8_epi16(load64(takeV + i));
+      __m128i c[3];
+      for (int k = 0; k < 3; ++k) c[k] = _mm_blendv_epi8(load128(h[k] + i), load128(v[k] + i), mask);
+      storeRgb(dst + 3 * i, c[0], c[1], c[2]);
+    }
+  }
+  const T* hr[3] = {h[0] + i, h[1] + i, h[2] + i};
+  const T* vr[3] = {v[0] + i, v[1] + i, v[2] + i};
+  chooseRowScalar(hr, vr, takeV + i, count - i, dst + 3 * i);
+}
+
+#define ZEL_AHD_KERNELS(T)                                                                                 \
+  template void greenRow<T>(const GreenTaps<T>&, int, bool, T*, VectorLevel);                              \
+  template void colourRow<T>(const ColourTaps<T>&, int, bool, bool, T*, T*, VectorLevel);                  \
+  template void lumaChromaRow<T>(const T*, const T*, const T*, int, const LumaChromaRow&, VectorLevel);    \
+  template void homogeneityRow<T>(const LumaChromaView[3], const LumaChromaView[3], int, T*, VectorLevel); \
+  template void windowSumRow<T>(const T*, const T*, const T*, int, int32_t*, VectorLevel);                 \
+  template void chooseRow<T>(const T* const[3], const T* const[3], const uint8_t*, int, T*, VectorLevel);
+ZEL_AHD_KERNELS(uint8_t)
+ZEL_AHD_KERNELS(uint16_t)
+#undef ZEL_AHD_KERNELS
+
+}  // namespace zel

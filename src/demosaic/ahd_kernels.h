@@ -1,0 +1,140 @@
+// Row kernels of the homogeneity-directed demosaicing. Each works on
+// `count` pixels of one row with pointers placed at the first pixel; taps
+// reach the stated number of samples to either side. A scalar form built
+// from the formulas of ahd.h and a vector form (SSE4.1 blocks of 4 pixels
+// in 32-bit lanes, then the scalar form for the rest) give the same values.
+#pragma once
+
+#include <cstdint>
+
+#include "demosaic/ahd.h"
+
+namespace zel {
+
+// Lanes of a row that hold green sites alternate; `firstGreen` tells the
+// phase of the first pixel.
+inline bool isGreenLane(bool firstGreen, int i) { return ((i & 1) == 0) == firstGreen; }
+
+// Step 1: green along a line through the site. `c` are the sites, `a` and
+// `b` the same colour two away on either side, `l` and `r` the greens
+// between. For the row direction these are one row at offsets 0, -2, +2,
+// -1, +1; for the column direction five rows.
+template <typename T>
+struct GreenTaps {
+  const T *c, *a, *b, *l, *r;
+};
+
+// Step 2: red and blue from the direction's green plane (rows above, at
+// and below; reach 1) and the samples (reach 1). `redRow`: the row's sites
+// other than green are red.
+template <typename T>
+struct ColourTaps {
+  const T *gUp, *g, *gDown;
+  const T *sUp, *s, *sDown;
+};
+
+// Step 3 output, one row: luma and the two chroma values.
+struct LumaChromaRow {
+  int32_t *y, *cb, *cr;
+};
+struct LumaChromaView {
+  const int32_t *y, *cb, *cr;
+};
+
+template <typename T>
+void greenRowScalar(const GreenTaps<T>& t, int count, bool firstGreen, T* out) {
+  for (int i = 0; i < count; ++i) {
+    const int c = loadSample(t.c + i);
+    storeSample(out + i, T(isGreenLane(firstGreen, i) ? c
+                                                      : greenAlong(c, loadSample(t.a + i), loadSample(t.b + i),
+                                                                   loadSample(t.l + i), loadSample(t.r + i))));
+  }
+}
+
+template <typename T>
+void colourRowScalar(const ColourTaps<T>& t, int count, bool firstGreen, bool redRow, T* outR, T* outB) {
+  constexpr int top = sizeof(T) == 1 ? 255 : 65535;
+  auto at = [](const T* p, int i) { return int(loadSample(p + i)); };
+  for (int i = 0; i < count; ++i) {
+    const int g = at(t.g, i);
+    int rowColour, otherColour;  // the row's non-green colour and the other one
+    if (isGreenLane(firstGreen, i)) {
+      rowColour = colourFromPair(g, at(t.s, i - 1) + at(t.s, i + 1), at(t.g, i - 1) + at(t.g, i + 1), top);
+      otherColour = colourFromPair(g, at(t.sUp, i) + at(t.sDown, i), at(t.gUp, i) + at(t.gDown, i), top);
+    } else {
+      rowColour = at(t.s, i);
+      otherColour =
+          colourFromDiagonals(g, at(t.sUp, i - 1) + at(t.sUp, i + 1) + at(t.sDown, i - 1) + at(t.sDown, i + 1),
+                              at(t.gUp, i - 1) + at(t.gUp, i + 1) + at(t.gDown, i - 1) + at(t.gDown, i + 1), top);
+    }
+    storeSample(outR + i, T(redRow ? rowColour : otherColour));
+    storeSample(outB + i, T(redRow ? otherColour : rowColour));
+  }
+}
+
+template <typename T>
+void lumaChromaRowScalar(const T* r, const T* g, const T* b, int count, const LumaChromaRow& out) {
+  for (int i = 0; i < count; ++i) {
+    const LumaChroma v = lumaChroma(loadSample(r + i), loadSample(g + i), loadSample(b + i));
+    out.y[i] = v.y, out.cb[i] = v.cb, out.cr[i] = v.cr;
+  }
+}
+
+// Step 4: the difference of the homogeneity counts from luma-chroma rows
+// above, at and below, per direction (reach 1 in the middle row). The
+// result is stored as a signed sample.
+template <typename T>
+void homogeneityRowScalar(const LumaChromaView h[3], const LumaChromaView v[3], int count, T* out) {
+  auto pick = [](const LumaChromaView& r, int i) { return LumaChroma{r.y[i], r.cb[i], r.cr[i]}; };
+  for (int i = 0; i < count; ++i) {
+    const Neighbourhood nh{pick(h[1], i), pick(h[1], i - 1), pick(h[1], i + 1), pick(h[0], i), pick(h[2], i)};
+    const Neighbourhood nv{pick(v[1], i), pick(v[1], i - 1), pick(v[1], i + 1), pick(v[0], i), pick(v[2], i)};
+    storeSample(out + i, T(homogeneityDifference(nh, nv)));
+  }
+}
+
+template <typename T>
+inline int signedSample(const T* p) {
+  return sizeof(T) == 1 ? int(int8_t(loadSample(p))) : int(int16_t(loadSample(p)));
+}
+
+// Step 5 input: the sums of the 3 by 3 windows of homogeneity differences.
+template <typename T>
+void windowSumRowScalar(const T* up, const T* mid, const T* down, int count, int32_t* sums) {
+  for (int i = 0; i < count; ++i) {
+    int s = 0;
+    for (int k = -1; k <= 1; ++k)
+      s += signedSample(up + i + k) + signedSample(mid + i + k) + signedSample(down + i + k);
+    sums[i] = s;
+  }
+}
+
+// Step 5 output: the pixels of V where `takeV` is set, else those of H.
+template <typename T>
+void chooseRowScalar(const T* const h[3], const T* const v[3], const uint8_t* takeV, int count, T* dst) {
+  for (int i = 0; i < count; ++i)
+    for (int k = 0; k < 3; ++k) storeSample(dst + 3 * i + k, loadSample((takeV[i] ? v[k] : h[k]) + i));
+}
+
+// The widest vector form in use: chosen once per call from the processor;
+// every level gives the same values.
+enum class VectorLevel { Scalar, Sse41, Avx2 };
+VectorLevel bestVectorLevel();
+
+// Vector blocks of the chosen level first (AVX2 blocks of 8 pixels, then
+// SSE4.1 blocks of 4), the scalar form for what is left.
+template <typename T>
+void greenRow(const GreenTaps<T>& t, int count, bool firstGreen, T* out, VectorLevel level);
+template <typename T>
+void colourRow(const ColourTaps<T>& t, int count, bool firstGreen, bool redRow, T* outR, T* outB, VectorLevel level);
+template <typename T>
+void lumaChromaRow(const T* r, const T* g, const T* b, int count, const LumaChromaRow& out, VectorLevel level);
+template <typename T>
+void homogeneityRow(const LumaChromaView h[3], const LumaChromaView v[3], int count, T* out, VectorLevel level);
+template <typename T>
+void windowSumRow(const T* up, const T* mid, const T* down, int count, int32_t* sums, VectorLevel level);
+// SSE4.1 blocks of 16 bytes of each channel.
+template <typename T>
+void chooseRow(const T* const h[3], const T* const v[3], const uint8_t* takeV, int count, T* dst, VectorLevel level);
+
+}  // namespace zel

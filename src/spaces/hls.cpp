@@ -1,0 +1,385 @@
+// HLS public functions, their row kernels and the two instruction sets of
+// the vector blocks. A row is converted in groups of 4 pixels up to the
+// member's body end (width rounded down to its block), pairs of groups at
+// a time with AVX2; the last pixels take the tail recipe one by one.
+#include <immintrin.h>
+
+#include "frame/export.h"
+#include "frame/image_layout.h"
+#include "frame/row_driver.h"
+#include "frame/simd.h"
+#include "spaces/hls_formulas.h"
+#include "spaces/hls_rows.h"
+
+namespace zel::hls {
+
+struct Sse {
+  using F = __m128;
+  using I = __m128i;
+  static constexpr int kGroups = 1;
+  static F set(float v) { return _mm_set1_ps(v); }
+  static F add(F a, F b) { return _mm_add_ps(a, b); }
+  static F sub(F a, F b) { return _mm_sub_ps(a, b); }
+  static F mul(F a, F b) { return _mm_mul_ps(a, b); }
+  static F div(F a, F b) { return _mm_div_ps(a, b); }
+  static F max(F a, F b) { return _mm_max_ps(a, b); }
+  static F min(F a, F b) { return _mm_min_ps(a, b); }
+  static F eq(F a, F b) { return _mm_cmpeq_ps(a, b); }
+  static F le(F a, F b) { return _mm_cmple_ps(a, b); }
+  static F lt(F a, F b) { return _mm_cmplt_ps(a, b); }
+  static F gt(F a, F b) { return _mm_cmpgt_ps(a, b); }
+  static F select(F mask, F yes, F no) { return _mm_blendv_ps(no, yes, mask); }
+  static F andNot(F mask, F v) { return _mm_andnot_ps(mask, v); }
+  static F rcp(F x) { return _mm_rcp_ps(x); }
+  static I round(F x) { return _mm_cvtps_epi32(x); }
+  static I truncate(F x) { return _mm_cvttps_epi32(x); }
+  static F toFloat(I v) { return _mm_cvtepi32_ps(v); }
+  static F asFloat(I v) { return _mm_castsi128_ps(v); }
+  static I asInt(F v) { return _mm_castps_si128(v); }
+  static I clamp(I v, int max) { return _mm_min_epi32(_mm_max_epi32(v, _mm_setzero_si128()), _mm_set1_epi32(max)); }
+  static I lowBits(I v, int max) { return _mm_and_si128(v, _mm_set1_epi32(max)); }
+  static I join(const __m128i* parts) { return parts[0]; }
+  static __m128i part(I v, int) { return v; }
+};
+
+namespace sse41 {
+#include "spaces/hls_vector.inl"
+}  // namespace sse41
+
+#pragma GCC push_options
+#pragma GCC target("avx2")
+
+struct Avx {
+  using F = __m256;
+  using I = __m256i;
+  static constexpr int kGroups = 2;
+  static F set(float v) { return _mm256_set1_ps(v); }
+  static F add(F a, F b) { return _mm256_add_ps(a, b); }
+  static F sub(F a, F b) { return _mm256_sub_ps(a, b); }
+  static F mul(F a, F b) { return _mm256_mul_ps(a, b); }
+  static F div(F a, F b) { return _mm256_div_ps(a, b); }
+  static F max(F a, F b) { return _mm256_max_ps(a, b); }
+  static F min(F a, F b) { return _mm256_min_ps(a, b); }
+  static F eq(F a, F b) { return _mm256_cmp_ps(a, b, _CMP_EQ_OQ); }
+  static F le(F a, F b) { return _mm256_cmp_ps(a, b, _CMP_LE_OS); }
+  static F lt(F a, F b) { return _mm256_cmp_ps(a, b, _CMP_LT_OS); }
+  static F gt(F a, F b) { return _mm256_cmp_ps(a, b, _CMP_GT_OS); }
+  static F select(F mask, F yes, F no) { return _mm256_blendv_ps(no, yes, mask); }
+  static F andNot(F mask, F v) { return _mm256_andnot_ps(mask, v); }
+  static F rcp(F x) { return _mm256_rcp_ps(x); }
+  static I round(F x) { return _mm256_cvtps_epi32(x); }
+  static I truncate(F x) { return _mm256_cvttps_epi32(x); }
+  static F toFloat(I v) { return _mm256_cvtepi32_ps(v); }
+  static F asFloat(I v) { return _mm256_castsi256_ps(v); }
+  static I asInt(F v) { return _mm256_castps_si256(v); }
+  static I clamp(I v, int max) {
+    return _mm256_min_epi32(_mm256_max_epi32(v, _mm256_setzero_si256()), _mm256_set1_epi32(max));
+  }
+  static I lowBits(I v, int max) { return _mm256_and_si256(v, _mm256_set1_epi32(max)); }
+  static I join(const __m128i* parts) { return _mm256_set_m128i(parts[1], parts[0]); }
+  static __m128i part(I v, int k) { return k == 0 ? _mm256_castsi256_si128(v) : _mm256_extracti128_si256(v, 1); }
+};
+
+namespace avx2 {
+#include "spaces/hls_vector.inl"
+}  // namespace avx2
+
+#pragma GCC pop_options
+
+namespace {
+
+// ---- row kernels ----
+
+template <class M>
+void forwardTailPixel(const typename M::In& in, const typename M::Out& out, int x) {
+  const uint32_t flip = M::kBiased ? 0x8000u : 0u;
+  float c[3];
+  for (int k = 0; k < 3; ++k) c[k] = float(int32_t(in.at(x, k) ^ flip));
+  const Hls v = forwardTail<typename M::TailRecipe>(c[M::kRedAt], c[1], c[2 - M::kRedAt]);
+  out.put(x, 0, uint32_t(v.h) ^ flip);
+  out.put(x, 1, uint32_t(v.l) ^ flip);
+  out.put(x, 2, uint32_t(v.s) ^ flip);
+  if constexpr (M::kCopyAlpha) out.put(x, 3, in.at(x, 3));
+}
+
+template <class M>
+void forwardRow(const typename M::In& in, const typename M::Out& out, int width, bool useAvx2) {
+  const int body = bodyEnd(width, M::kBlock);
+  int x = 0;
+  if (useAvx2) x = avx2::forwardGroups<Avx, M>(in, out, x, body);
+  x = sse41::forwardGroups<Sse, M>(in, out, x, body);
+  for (; x < width; ++x) forwardTailPixel<M>(in, out, x);
+}
+
+template <class M>
+void inverseTailPixel(const typename M::In& in, const typename M::Out& out, int x) {
+  uint32_t rgb[3];
+  if constexpr (M::kFloat) {
+    float v[3];
+    inverseFloat<typename M::TailRecipe>(fromBits<float>(in.at(x, 0)), fromBits<float>(in.at(x, 1)),
+                                         fromBits<float>(in.at(x, 2)), v);
+    for (int c = 0; c < 3; ++c) rgb[c] = bitsOf(v[c]);
+  } else {
+    const uint32_t flip = M::kBiased ? 0x8000u : 0u;
+    int32_t v[3];
+    inversePixel<typename M::TailRecipe>(int32_t(in.at(x, 0) ^ flip), int32_t(in.at(x, 1) ^ flip),
+                                         int32_t(in.at(x, 2) ^ flip), v);
+    for (int c = 0; c < 3; ++c) rgb[c] = uint32_t(v[c]) ^ flip;
+  }
+  out.put(x, M::kRedAt, rgb[0]);
+  out.put(x, 1, rgb[1]);
+  out.put(x, 2 - M::kRedAt, rgb[2]);
+  if constexpr (M::kCopyAlpha) out.put(x, 3, in.at(x, 3));
+}
+
+template <class M>
+void inverseRow(const typename M::In& in, const typename M::Out& out, int width, bool useAvx2) {
+  const int body = bodyEnd(width, M::kBlock);
+  int x = 0;
+  if (useAvx2) x = avx2::inverseGroups<Avx, M>(in, out, x, body);
+  x = sse41::inverseGroups<Sse, M>(in, out, x, body);
+  for (; x < width; ++x) inverseTailPixel<M>(in, out, x);
+}
+
+// Float forward conversion: one formula for every pixel, so the vector
+// groups and the last pixels agree whatever the width.
+template <int Ch>
+void forwardFloatRow(const Packed<float, Ch>& in, const Packed<float, Ch>& out, int width, bool useAvx2) {
+  int x = 0;
+  if (useAvx2) x = avx2::forwardFloatGroups<Avx>(in, out, x, width);
+  x = sse41::forwardFloatGroups<Sse>(in, out, x, width);
+  for (; x < width; ++x) {
+    const HlsF v = forwardFloat(fromBits<float>(in.at(x, 0)), fromBits<float>(in.at(x, 1)),
+                                fromBits<float>(in.at(x, 2)));
+    out.put(x, 0, bitsOf(v.h));
+    out.put(x, 1, bitsOf(v.l));
+    out.put(x, 2, bitsOf(v.s));
+  }
+}
+
+// ---- drivers ----
+
+template <class M, class Row>
+void walk(const typename M::In& in, const typename M::Out& out, ImageSize size, Row row) {
+  const bool useAvx2 = hasAvx2();
+  plainWalk(size.height, [&](int y) { row(in.rowAt(y), out.rowAt(y), size.width, useAvx2); });
+}
+
+// The RGB families count steps in whole samples: the byte step shifted
+// right by 1 for 16-bit samples, by 2 for floats.
+template <typename T>
+int wholeSamples(int step) {
+  constexpr int shift = sizeof(T) == 1 ? 0 : sizeof(T) == 2 ? 1 : 2;
+  return (step >> shift) * int(sizeof(T));
+}
+
+template <typename T>
+uint8_t* bytes(const T* p) {
+  return reinterpret_cast<uint8_t*>(const_cast<T*>(p));
+}
+
+bool badSize(ImageSize size) { return size.width < 1 || size.height < 1; }
+
+// A side from the caller's pointer: an image pointer, or a plane array of
+// which the array and every entry count as pointers.
+template <class Side, typename P>
+bool isNull(P* p) {
+  return !p;
+}
+template <class Side, typename P>
+bool isNull(P* const* planes) {
+  if (!planes) return true;
+  for (int i = 0; i < Side::kPlanes; ++i)
+    if (!planes[i]) return true;
+  return false;
+}
+
+template <class Side, typename P>
+Side sideOf(P* p, int step) {
+  return Side{bytes(p), step};
+}
+template <class Side, typename P>
+Side sideOf(P* const* planes, int step) {
+  Side side{};
+  for (int i = 0; i < Side::kPlanes; ++i) side.base[i] = bytes(planes[i]);
+  side.step = step;
+  return side;
+}
+
+// RGB members: pointers, then size; steps unchecked.
+template <class Body, class Tail, int Block, typename T, int Ch, bool Forward>
+Status rgbMember(const T* src, int srcStep, T* dst, int dstStep, ImageSize size) {
+  if (!src || !dst) return StatusNullPointerError;
+  if (badSize(size)) return StatusSizeError;
+  using M = Member<Body, Tail, Block, Packed<T, Ch>, Packed<T, Ch>, 0, false>;
+  const Packed<T, Ch> in{bytes(src), wholeSamples<T>(srcStep)}, out{bytes(dst), wholeSamples<T>(dstStep)};
+  if constexpr (Forward)
+    walk<M>(in, out, size, [](const auto& i, const auto& o, int w, bool a) { forwardRow<M>(i, o, w, a); });
+  else
+    walk<M>(in, out, size, [](const auto& i, const auto& o, int w, bool a) { inverseRow<M>(i, o, w, a); });
+  return StatusOk;
+}
+
+template <int Ch>
+Status rgbToHlsFloat(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
+  if (!src || !dst) return StatusNullPointerError;
+  if (badSize(size)) return StatusSizeError;
+  const Packed<float, Ch> in{bytes(src), wholeSamples<float>(srcStep)}, out{bytes(dst), wholeSamples<float>(dstStep)};
+  const bool useAvx2 = hasAvx2();
+  for (int y = 0; y < size.height; ++y) forwardFloatRow<Ch>(in.rowAt(y), out.rowAt(y), size.width, useAvx2);
+  return StatusOk;
+}
+
+// BGR members: every pointer (plane entries included), then the steps,
+// then the size; the interleaved AC4 member tests size before steps.
+enum class Order { StepFirst, SizeFirst };
+
+template <class M, bool Forward, Order O, typename S, typename D>
+Status bgrMember(S src, int srcStep, D dst, int dstStep, ImageSize size) {
+  if (isNull<typename M::In>(src) || isNull<typename M::Out>(dst)) return StatusNullPointerError;
+  const bool badStep = srcStep < 1 || dstStep < 1;
+  if (O == Order::StepFirst && badStep) return StatusStepError;
+  if (badSize(size)) return StatusSizeError;
+  if (O == Order::SizeFirst && badStep) return StatusStepError;
+  const auto in = sideOf<typename M::In>(src, srcStep);
+  const auto out = sideOf<typename M::Out>(dst, dstStep);
+  if constexpr (Forward)
+    walk<M>(in, out, size, [](const auto& i, const auto& o, int w, bool a) { forwardRow<M>(i, o, w, a); });
+  else
+    walk<M>(in, out, size, [](const auto& i, const auto& o, int w, bool a) { inverseRow<M>(i, o, w, a); });
+  return StatusOk;
+}
+
+// The BGR family: B, G, R in memory, 4-pixel blocks, truncation.
+template <class In, class Out, bool Copy, Order O = Order::StepFirst, typename S, typename D>
+Status bgrToHls(S src, int srcStep, D dst, int dstStep, ImageSize size) {
+  return bgrMember<Member<BgrToHls8, BgrToHls8, 4, In, Out, 2, Copy>, true, O>(src, srcStep, dst, dstStep, size);
+}
+template <class In, class Out, bool Copy, typename S, typename D>
+Status hlsToBgr(S src, int srcStep, D dst, int dstStep, ImageSize size) {
+  using M = Member<HlsToBgr8Body, HlsToBgr8Tail, 4, In, Out, 2, Copy>;
+  return bgrMember<M, false, Order::StepFirst>(src, srcStep, dst, dstStep, size);
+}
+
+using Pixels3 = Packed<uint8_t, 3>;
+using Pixels4 = Packed<uint8_t, 4>;
+using Planes3 = Planar<uint8_t, 3>;
+using Planes4 = Planar<uint8_t, 4>;
+
+}  // namespace
+
+}  // namespace zel::hls
+
+using namespace zel::hls;
+
+// ---- RGB to HLS ----
+ZEL_PUBLIC Status zeliRGBToHLS_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
+  return rgbMember<RgbToHls8C3, RgbToHls8C3, 8, uint8_t, 3, true>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliRGBToHLS_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
+  return rgbMember<RgbToHls8AC4, RgbToHls8AC4, 4, uint8_t, 4, true>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliRGBToHLS_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size) {
+  return rgbMember<RgbToHls16, RgbToHls16, 4, uint16_t, 3, true>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliRGBToHLS_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                        ImageSize size) {
+  return rgbMember<RgbToHls16, RgbToHls16, 4, uint16_t, 4, true>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliRGBToHLS_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size) {
+  return rgbMember<RgbToHls16, RgbToHls16, 4, int16_t, 3, true>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliRGBToHLS_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size) {
+  return rgbMember<RgbToHls16, RgbToHls16, 4, int16_t, 4, true>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliRGBToHLS_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
+  return rgbToHlsFloat<3>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliRGBToHLS_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
+  return rgbToHlsFloat<4>(src, srcStep, dst, dstStep, size);
+}
+
+// ---- HLS to RGB ----
+ZEL_PUBLIC Status zeliHLSToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
+  return rgbMember<HlsToRgb8Body, HlsToRgb8Tail, 8, uint8_t, 3, false>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliHLSToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
+  return rgbMember<HlsToRgb8Body, HlsToRgb8Tail, 8, uint8_t, 4, false>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliHLSToRGB_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                       ImageSize size) {
+  return rgbMember<HlsToRgb16Body, HlsToRgb16Tail, 4, uint16_t, 3, false>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliHLSToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                        ImageSize size) {
+  return rgbMember<HlsToRgb16Body, HlsToRgb16Tail, 4, uint16_t, 4, false>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliHLSToRGB_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size) {
+  return rgbMember<HlsToRgb16Body, HlsToRgb16Tail, 4, int16_t, 3, false>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliHLSToRGB_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size) {
+  return rgbMember<HlsToRgb16Body, HlsToRgb16Tail, 4, int16_t, 4, false>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliHLSToRGB_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
+  return rgbMember<HlsToRgbFloatBody, HlsToRgbFloatTail, 4, float, 3, false>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliHLSToRGB_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
+  return rgbMember<HlsToRgbFloatBody, HlsToRgbFloatTail, 4, float, 4, false>(src, srcStep, dst, dstStep, size);
+}
+
+// ---- BGR to HLS ----
+ZEL_PUBLIC Status zeliBGRToHLS_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
+  // The fourth byte of the destination is never written; size before steps.
+  return bgrToHls<Pixels4, PackedSkipAlpha<uint8_t>, false, Order::SizeFirst>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliBGRToHLS_8u_AC4P4R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[4], int dstStep,
+                                         ImageSize size) {
+  return bgrToHls<Pixels4, Planes4, true>(src, srcStep, dstPlanes, dstStep, size);
+}
+ZEL_PUBLIC Status zeliBGRToHLS_8u_AP4C4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* dst, int dstStep,
+                                         ImageSize size) {
+  return bgrToHls<Planes4, Pixels4, true>(srcPlanes, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliBGRToHLS_8u_AP4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* const dstPlanes[4],
+                                       int dstStep, ImageSize size) {
+  return bgrToHls<Planes4, Planes4, true>(srcPlanes, srcStep, dstPlanes, dstStep, size);
+}
+ZEL_PUBLIC Status zeliBGRToHLS_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
+                                        ImageSize size) {
+  return bgrToHls<Pixels3, Planes3, false>(src, srcStep, dstPlanes, dstStep, size);
+}
+ZEL_PUBLIC Status zeliBGRToHLS_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                        ImageSize size) {
+  return bgrToHls<Planes3, Pixels3, false>(srcPlanes, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliBGRToHLS_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                      int dstStep, ImageSize size) {
+  return bgrToHls<Planes3, Planes3, false>(srcPlanes, srcStep, dstPlanes, dstStep, size);
+}
+
+// ---- HLS to BGR ----
+ZEL_PUBLIC Status zeliHLSToBGR_8u_AC4P4R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[4], int dstStep,
+                                         ImageSize size) {
+  return hlsToBgr<Pixels4, Planes4, true>(src, srcStep, dstPlanes, dstStep, size);
+}
+ZEL_PUBLIC Status zeliHLSToBGR_8u_AP4C4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* dst, int dstStep,
+                                         ImageSize size) {
+  return hlsToBgr<Planes4, Pixels4, true>(srcPlanes, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliHLSToBGR_8u_AP4R(const uint8_t* const srcPlanes[4], int srcStep, uint8_t* const dstPlanes[4],
+                                       int dstStep, ImageSize size) {
+  return hlsToBgr<Planes4, Planes4, true>(srcPlanes, srcStep, dstPlanes, dstStep, size);
+}
+ZEL_PUBLIC Status zeliHLSToBGR_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
+                                        ImageSize size) {
+  return hlsToBgr<Pixels3, Planes3, false>(src, srcStep, dstPlanes, dstStep, size);
+}
+ZEL_PUBLIC Status zeliHLSToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                        ImageSize size) {
+  return hlsToBgr<Planes3, Pixels3, false>(srcPlanes, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliHLSToBGR_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
+                                      int dstStep, ImageSize size) {
+  return hlsToBgr<Planes3, Planes3, false>(srcPlanes, srcStep, dstPlanes, dstStep, size);
+}

@@ -1,0 +1,224 @@
+// HLS vector blocks, written once over a lane set V (4 floats with SSE4.1,
+// 8 with AVX2). This file is included once for each instruction set, inside
+// a namespace of its own and, for AVX2, with the target enabled; nothing
+// here is visible outside those namespaces. Every lane computes exactly
+// its scalar formula in hls_formulas.h.
+
+template <class V, bool Refined>
+inline typename V::F reciprocalLanes(typename V::F x) {
+  const typename V::F r = V::rcp(x);
+  if constexpr (!Refined) return r;
+  else return V::sub(V::add(r, r), V::mul(V::mul(x, r), r));
+}
+
+template <class V>
+inline typename V::I convertLanes(bool round, typename V::F x) {
+  return round ? V::round(x) : V::truncate(x);
+}
+
+// ---- forward ----
+
+template <class V, class R>
+inline void forwardLanes(typename V::F r, typename V::F g, typename V::F b, typename V::I* out) {
+  using F = typename V::F;
+  const F zero = V::set(0.0f), one = V::set(1.0f);
+  const F mx = V::max(V::max(r, g), b), mn = V::min(V::min(r, g), b);
+  const F sum = V::add(mx, mn), spread = V::sub(mx, mn);
+  const F light = V::mul(sum, V::set(0.5f));
+  const F flat = V::eq(spread, zero);
+  const F d = V::select(flat, one, V::select(V::le(light, V::set(R::kHalf)), sum, V::sub(V::set(R::kFull), sum)));
+  const F rateBase = V::select(flat, one, spread);
+  F sat = V::mul(V::mul(spread, reciprocalLanes<V, R::kRefined>(d)), V::set(R::kRange));
+  const F isR = V::eq(mx, r);
+  const F isG = V::andNot(isR, V::eq(mx, g));
+  const F diff = V::select(isR, V::sub(g, b), V::select(isG, V::sub(b, r), V::sub(r, g)));
+  const F base = V::select(isR, zero, V::select(isG, V::set(120.0f), V::set(240.0f)));
+  const F rate = reciprocalLanes<V, R::kRefined>(rateBase);
+  F hue;
+  if constexpr (R::kForm == HueForm::RateFirst) hue = V::add(V::mul(V::mul(rate, V::set(60.0f)), diff), base);
+  else hue = V::add(V::mul(V::mul(diff, V::set(60.0f)), rate), base);
+  hue = V::select(V::lt(hue, zero), V::add(hue, V::set(360.0f)), hue);
+  const F h = V::andNot(flat, V::mul(hue, V::set(R::kHue)));
+  sat = V::andNot(flat, sat);
+  out[0] = V::clamp(convertLanes<V>(R::kRoundBody, h), R::kMax);
+  out[1] = V::clamp(convertLanes<V>(R::kRoundBody, light), R::kMax);
+  out[2] = V::clamp(convertLanes<V>(R::kRoundBody, sat), R::kMax);
+}
+
+// Groups of 4 * V::kGroups pixels from x while they fit below `end`;
+// returns where it stopped.
+template <class V, class M>
+inline int forwardGroups(const typename M::In& in, const typename M::Out& out, int x, int end) {
+  using F = typename V::F;
+  using I = typename V::I;
+  constexpr int kStep = 4 * V::kGroups;
+  const __m128i bias = _mm_set1_epi32(0x8000);
+  for (; x + kStep <= end; x += kStep) {
+    __m128i raw[V::kGroups][4];
+    for (int k = 0; k < V::kGroups; ++k) {
+      in.template load<M::kChannels>(x + 4 * k, raw[k]);
+      if constexpr (M::kBiased)
+        for (int c = 0; c < 3; ++c) raw[k][c] = _mm_xor_si128(raw[k][c], bias);
+    }
+    F colour[3];
+    for (int c = 0; c < 3; ++c) {
+      __m128i parts[V::kGroups];
+      for (int k = 0; k < V::kGroups; ++k) parts[k] = raw[k][c];
+      colour[c] = V::toFloat(V::join(parts));
+    }
+    I hls[3];
+    forwardLanes<V, typename M::BodyRecipe>(colour[M::kRedAt], colour[1], colour[2 - M::kRedAt], hls);
+    for (int k = 0; k < V::kGroups; ++k) {
+      __m128i lanes[4] = {V::part(hls[0], k), V::part(hls[1], k), V::part(hls[2], k), raw[k][3]};
+      if constexpr (M::kBiased)
+        for (int c = 0; c < 3; ++c) lanes[c] = _mm_xor_si128(lanes[c], bias);
+      out.template store<M::kCopyAlpha ? 4 : 3>(x + 4 * k, lanes);
+    }
+  }
+  return x;
+}
+
+// Float samples: the one formula of every pixel, with true divisions.
+template <class V>
+inline void forwardFloatLanes(typename V::F r, typename V::F g, typename V::F b, typename V::F* out) {
+  using F = typename V::F;
+  const F zero = V::set(0.0f), half = V::set(0.5f);
+  const F mx = V::max(V::max(r, g), b), mn = V::min(V::min(r, g), b);
+  const F spread = V::sub(mx, mn), sum = V::add(mx, mn);
+  const F light = V::mul(sum, half);
+  const F flat = V::le(spread, V::set(kFlatLimit));
+  const F sat = V::select(V::le(light, half), V::div(spread, sum), V::div(spread, V::sub(V::set(2.0f), sum)));
+  const F isR = V::eq(r, mx);
+  const F isG = V::andNot(isR, V::eq(g, mx));
+  const F diff = V::select(isR, V::sub(g, b), V::select(isG, V::sub(b, r), V::sub(r, g)));
+  F hue = V::div(V::mul(diff, V::set(60.0f)), spread);
+  hue = V::select(isR, hue, V::add(hue, V::select(isG, V::set(120.0f), V::set(240.0f))));
+  hue = V::select(V::lt(hue, zero), V::add(hue, V::set(360.0f)), hue);
+  out[0] = V::select(flat, zero, V::div(hue, V::set(360.0f)));
+  out[1] = light;
+  out[2] = V::select(flat, zero, sat);
+}
+
+template <class V, class In, class Out>
+inline int forwardFloatGroups(const In& in, const Out& out, int x, int end) {
+  constexpr int kStep = 4 * V::kGroups;
+  for (; x + kStep <= end; x += kStep) {
+    __m128i raw[V::kGroups][4];
+    for (int k = 0; k < V::kGroups; ++k) in.template load<3>(x + 4 * k, raw[k]);
+    typename V::F colour[3], hls[3];
+    for (int c = 0; c < 3; ++c) {
+      __m128i parts[V::kGroups];
+      for (int k = 0; k < V::kGroups; ++k) parts[k] = raw[k][c];
+      colour[c] = V::asFloat(V::join(parts));
+    }
+    forwardFloatLanes<V>(colour[0], colour[1], colour[2], hls);
+    for (int k = 0; k < V::kGroups; ++k) {
+      const __m128i lanes[3] = {V::part(V::asInt(hls[0]), k), V::part(V::asInt(hls[1]), k),
+                                V::part(V::asInt(hls[2]), k)};
+      out.template store<3>(x + 4 * k, lanes);
+    }
+  }
+  return x;
+}
+
+// ---- inverse ----
+
+template <class V, class R>
+inline typename V::F riseLanes(typename V::F low, typename V::F dm, typename V::F h) {
+  if constexpr (R::kBand == Band::ProductFirst) return V::add(low, V::mul(V::mul(dm, h), V::set(kInv60)));
+  else if constexpr (R::kBand == Band::RateFirst) return V::add(low, V::mul(V::mul(h, V::set(kInv60)), dm));
+  else return V::add(low, V::div(V::mul(dm, h), V::set(60.0f)));
+}
+
+template <class V, class R>
+inline typename V::F levelLanes(typename V::F h, typename V::F low, typename V::F high, typename V::F dm) {
+  using F = typename V::F;
+  F v = low;
+  v = V::select(V::lt(h, V::set(240.0f)), riseLanes<V, R>(low, dm, V::sub(V::set(240.0f), h)), v);
+  v = V::select(V::lt(h, V::set(180.0f)), high, v);
+  return V::select(V::lt(h, V::set(60.0f)), riseLanes<V, R>(low, dm, h), v);
+}
+
+// Levels of R, G, B from hue in degrees, l and s.
+template <class V, class R>
+inline void levelLanesOf(typename V::F h, typename V::F l, typename V::F s, typename V::F* level) {
+  using F = typename V::F;
+  const F half = V::set(0.5f), one = V::set(1.0f);
+  const F lower = V::le(l, half);
+  const F ls = V::mul(l, s);
+  F high;
+  if constexpr (R::kHigh == High::Split) high = V::add(l, V::select(lower, ls, V::sub(s, ls)));
+  else if constexpr (R::kHigh == High::Plain) high = V::select(lower, V::add(l, ls), V::sub(V::add(l, s), ls));
+  else high = V::select(lower, V::mul(l, V::add(s, one)), V::sub(V::add(l, s), ls));
+  const F low = V::sub(V::add(l, l), high);
+  const F dm = V::sub(high, low);
+  const F full = V::set(360.0f), third = V::set(120.0f), zero = V::set(0.0f);
+  F hr = V::add(h, third);
+  hr = V::select(V::gt(hr, full), V::sub(hr, full), hr);
+  F hb = V::sub(h, third);
+  hb = V::select(V::lt(hb, zero), V::add(hb, full), hb);
+  level[0] = levelLanes<V, R>(hr, low, high, dm);
+  level[1] = levelLanes<V, R>(h, low, high, dm);
+  level[2] = levelLanes<V, R>(hb, low, high, dm);
+}
+
+template <class V, class R>
+inline typename V::I outputLanes(typename V::F level) {
+  const typename V::F v = V::mul(level, V::set(R::kRange));
+  if constexpr (R::kOutput == Output::RoundSaturate) return V::clamp(V::round(v), R::kMax);
+  else if constexpr (R::kOutput == Output::TruncateSaturate) return V::clamp(V::truncate(v), R::kMax);
+  else if constexpr (R::kOutput == Output::RoundLow) return V::lowBits(V::round(v), R::kMax);
+  else if constexpr (R::kOutput == Output::TruncateLow) return V::lowBits(V::truncate(v), R::kMax);
+  else return V::asInt(level);
+}
+
+template <class V, class M>
+inline int inverseGroups(const typename M::In& in, const typename M::Out& out, int x, int end) {
+  using F = typename V::F;
+  using I = typename V::I;
+  using R = typename M::BodyRecipe;
+  static_assert(R::kGrey != Grey::CopyL || R::kOutput == Output::Level, "blocks copy L only as a float");
+  constexpr int kStep = 4 * V::kGroups;
+  const __m128i bias = _mm_set1_epi32(0x8000);
+  for (; x + kStep <= end; x += kStep) {
+    __m128i raw[V::kGroups][4];
+    for (int k = 0; k < V::kGroups; ++k) {
+      in.template load<M::kChannels>(x + 4 * k, raw[k]);
+      if constexpr (M::kBiased)
+        for (int c = 0; c < 3; ++c) raw[k][c] = _mm_xor_si128(raw[k][c], bias);
+    }
+    F hls[3];
+    for (int c = 0; c < 3; ++c) {
+      __m128i parts[V::kGroups];
+      for (int k = 0; k < V::kGroups; ++k) parts[k] = raw[k][c];
+      hls[c] = M::kFloat ? V::asFloat(V::join(parts)) : V::toFloat(V::join(parts));
+    }
+    F h, l, s;
+    if constexpr (R::kScale == Scale::Multiply8) {
+      h = V::mul(hls[0], V::set(kDeg8)), l = V::mul(hls[1], V::set(kInv8)), s = V::mul(hls[2], V::set(kInv8));
+    } else if constexpr (R::kScale == Scale::Multiply16) {
+      h = V::mul(hls[0], V::set(kDeg16)), l = V::mul(hls[1], V::set(kInv16)), s = V::mul(hls[2], V::set(kInv16));
+    } else if constexpr (R::kScale == Scale::Divide8) {
+      h = V::div(V::mul(hls[0], V::set(360.0f)), V::set(255.0f));
+      l = V::div(hls[1], V::set(255.0f)), s = V::div(hls[2], V::set(255.0f));
+    } else {
+      h = V::mul(hls[0], V::set(360.0f)), l = hls[1], s = hls[2];
+    }
+    F level[3];
+    levelLanesOf<V, R>(h, l, s, level);
+    const F grey = V::eq(s, V::set(0.0f));
+    I rgb[3];
+    for (int c = 0; c < 3; ++c) {
+      if constexpr (R::kGrey == Grey::Lightness) level[c] = V::select(grey, l, level[c]);
+      if constexpr (R::kGrey == Grey::CopyL) level[c] = V::select(grey, hls[1], level[c]);
+      rgb[c] = outputLanes<V, R>(level[c]);
+    }
+    for (int k = 0; k < V::kGroups; ++k) {
+      __m128i lanes[4] = {V::part(rgb[M::kRedAt], k), V::part(rgb[1], k), V::part(rgb[2 - M::kRedAt], k), raw[k][3]};
+      if constexpr (M::kBiased)
+        for (int c = 0; c < 3; ++c) lanes[c] = _mm_xor_si128(lanes[c], bias);
+      out.template store<M::kCopyAlpha ? 4 : 3>(x + 4 * k, lanes);
+    }
+  }
+  return x;
+}

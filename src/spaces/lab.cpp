@@ -1,0 +1,109 @@
+// RGB (or BGR) to CIE Lab and back: 8u, 16u Lab from and to 8u BGR, 32f.
+#include <type_traits>
+
+#include "frame/export.h"
+#include "spaces/float_lanes.h"
+#include "spaces/lab_formulas.h"
+#include "spaces/lab_kernels.h"
+#include "spaces/space_frame.h"
+
+namespace zel::spaces::lab {
+
+namespace sse {
+using namespace zel::lanes;
+#define ZEL_KERNEL ZEL_LANE
+#define ZEL_KERNEL_LOOP
+#include "spaces/lane_helpers.inc"
+#include "spaces/cube_root_lanes.inc"
+#include "spaces/lab_blocks.inc"
+#undef ZEL_KERNEL
+#undef ZEL_KERNEL_LOOP
+}  // namespace sse
+
+namespace avx2 {
+using namespace zel::lanes;
+#define ZEL_KERNEL ZEL_LANE_AVX2
+#define ZEL_KERNEL_LOOP ZEL_AVX2
+#include "spaces/lane_helpers.inc"
+#include "spaces/cube_root_lanes.inc"
+#include "spaces/lab_blocks.inc"
+#undef ZEL_KERNEL
+#undef ZEL_KERNEL_LOOP
+}  // namespace avx2
+
+template <typename S, typename D, bool Bgr>
+int forwardBlocks(Lanes lanes, const S* src, D* dst, int n) {
+  return lanes == Lanes::Avx2 ? avx2::forwardBlocks<lanes::F8, S, D, Bgr>(src, dst, n)
+                              : sse::forwardBlocks<lanes::F4, S, D, Bgr>(src, dst, n);
+}
+template <typename S, typename D, bool Bgr>
+int inverseBlocks(Lanes lanes, const S* src, D* dst, int n) {
+  return lanes == Lanes::Avx2 ? avx2::inverseBlocks<lanes::F8, S, D, Bgr>(src, dst, n)
+                              : sse::inverseBlocks<lanes::F4, S, D, Bgr>(src, dst, n);
+}
+
+template int forwardBlocks<uint8_t, uint8_t, false>(Lanes, const uint8_t*, uint8_t*, int);
+template int forwardBlocks<uint8_t, uint8_t, true>(Lanes, const uint8_t*, uint8_t*, int);
+template int forwardBlocks<uint8_t, uint16_t, true>(Lanes, const uint8_t*, uint16_t*, int);
+template int forwardBlocks<float, float, false>(Lanes, const float*, float*, int);
+template int forwardBlocks<float, float, true>(Lanes, const float*, float*, int);
+template int inverseBlocks<uint8_t, uint8_t, false>(Lanes, const uint8_t*, uint8_t*, int);
+template int inverseBlocks<uint8_t, uint8_t, true>(Lanes, const uint8_t*, uint8_t*, int);
+template int inverseBlocks<uint16_t, uint8_t, true>(Lanes, const uint16_t*, uint8_t*, int);
+template int inverseBlocks<float, float, false>(Lanes, const float*, float*, int);
+template int inverseBlocks<float, float, true>(Lanes, const float*, float*, int);
+
+namespace {
+
+// Blocks of 4 pixels; steps stay in bytes for every sample type.
+template <typename S, typename D, bool Bgr>
+Status forward(const S* src, int srcStep, D* dst, int dstStep, ImageSize size) {
+  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Bytes, [](const S* s, D* d, int width) {
+    splitRow<3, 3>(s, d, width, 4, forwardBlocks<S, D, Bgr>, forwardPixel<S, D, Bgr, Zone::Tail>);
+  });
+}
+template <typename S, typename D, bool Bgr>
+Status inverse(const S* src, int srcStep, D* dst, int dstStep, ImageSize size) {
+  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Bytes, [](const S* s, D* d, int width) {
+    splitRow<3, 3>(s, d, width, 4, inverseBlocks<S, D, Bgr>, inversePixel<S, D, Bgr>);
+  });
+}
+
+}  // namespace
+
+}  // namespace zel::spaces::lab
+
+using namespace zel::spaces::lab;
+
+ZEL_PUBLIC Status zeliRGBToLab_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
+  return forward<uint8_t, uint8_t, false>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliBGRToLab_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
+  return forward<uint8_t, uint8_t, true>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliBGRToLab_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep,
+                                         ImageSize size) {
+  return forward<uint8_t, uint16_t, true>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliRGBToLab_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
+  return forward<float, float, false>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliBGRToLab_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
+  return forward<float, float, true>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliLabToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
+  return inverse<uint8_t, uint8_t, false>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliLabToBGR_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
+  return inverse<uint8_t, uint8_t, true>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliLabToBGR_16u8u_C3R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep,
+                                         ImageSize size) {
+  return inverse<uint16_t, uint8_t, true>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliLabToRGB_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
+  return inverse<float, float, false>(src, srcStep, dst, dstStep, size);
+}
+ZEL_PUBLIC Status zeliLabToBGR_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
+  return inverse<float, float, true>(src, srcStep, dst, dstStep, size);
+}

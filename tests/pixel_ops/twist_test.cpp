@@ -1,0 +1,289 @@
+// Colour twist: vector blocks against the per-sample formulas for every
+// type and layout, clamping, rounding under a caller's rounding mode, and
+// the row merging of the float members.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cstring>
+#include <random>
+#include <type_traits>
+#include <vector>
+
+#include "frame/simd.h"
+#include "pixel_ops/twist.h"
+#include "support/test_image.h"
+#include "zelcc/zelcc.h"
+
+namespace {
+
+using namespace zel::twist;
+using zel::test::TestImage;
+
+Matrix randomMatrix(std::mt19937& rng, float weight, float constant) {
+  std::uniform_real_distribution<float> w(-weight, weight), c(-constant, constant);
+  Matrix m{};
+  for (int i = 0; i < 4; ++i)
+    for (int j = 0; j < 4; ++j) m.t[i][j] = j == 3 ? c(rng) : w(rng);
+  return m;
+}
+
+// Rows of one layout through the kernel, in place or not, against the
+// formula of each sample; alpha and everything past the row unchanged.
+template <typename T, int K>
+void checkKernel(float weight, float constant, bool inPlace, bool wide) {
+  std::mt19937 rng(K * 100 + int(sizeof(T)));
+  const int planes = K == Planar ? 3 : 1, perPixel = K == Planar ? 1 : K;
+  for (int width = 1; width <= 70; ++width)
+    for (int offset : {0, 1, 2, 5}) {
+      if (offset % int(sizeof(T))) continue;
+      const Matrix m = randomMatrix(rng, weight, constant);
+      std::vector<TestImage<T>> src, dst;
+      for (int k = 0; k < planes; ++k) {
+        src.emplace_back(width * perPixel, 1, offset);
+        dst.emplace_back(width * perPixel, 1, offset + 2 * int(sizeof(T)));
+        src[k].fillRandom(rng(), -2, 3);
+        dst[k].fillRandom(rng(), -2, 3);
+      }
+      std::vector<TestImage<T>>& out = inPlace ? src : dst;
+      // Samples before the call (the images share storage when copied).
+      auto samples = [&](std::vector<TestImage<T>>& imgs) {
+        std::vector<std::vector<T>> v(planes);
+        for (int k = 0; k < planes; ++k)
+          for (int i = 0; i < width * perPixel; ++i) v[k].push_back(imgs[k].get(i, 0));
+        return v;
+      };
+      const auto before = samples(out), in = samples(src);
+      const T* s[3];
+      T* d[3];
+      for (int k = 0; k < 3; ++k) {
+        s[k] = src[k < planes ? k : 0].data();
+        d[k] = out[k < planes ? k : 0].data();
+      }
+      row<T, K>(s, d, width, m, wide);
+      for (int x = 0; x < width; ++x) {
+        auto inAt = [&](int ch) { return K == Planar ? in[ch][x] : in[0][x * K + ch]; };
+        const float a = float(inAt(0)), b = float(inAt(1)), c = float(inAt(2));
+        for (int ch = 0; ch < 3; ++ch) {
+          const T want = Sample<T>::out(m, ch, a, b, c);
+          const T got = K == Planar ? out[ch].get(x, 0) : out[0].get(x * K + ch, 0);
+          ASSERT_EQ(std::memcmp(&got, &want, sizeof(T)), 0) << "width " << width << " pixel " << x << " ch " << ch;
+        }
+        if (K == AC4) {
+          const T got = out[0].get(x * 4 + 3, 0), was = before[0][x * 4 + 3];
+          ASSERT_EQ(std::memcmp(&got, &was, sizeof(T)), 0) << "alpha of pixel " << x;
+        }
+      }
+      for (auto& img : out) ASSERT_TRUE(img.guardsIntact()) << width;
+    }
+}
+
+template <typename T>
+void checkAllLayouts(float weight, float constant) {
+  for (bool wide : {false, true}) {
+    if (wide && (std::is_same_v<T, float> || !zel::hasAvx2())) continue;
+    for (bool inPlace : {false, true}) {
+      checkKernel<T, C3>(weight, constant, inPlace, wide);
+      checkKernel<T, AC4>(weight, constant, inPlace, wide);
+      checkKernel<T, Planar>(weight, constant, inPlace, wide);
+    }
+  }
+}
+
+TEST(TwistKernels, BlocksMatchTheFormulaOfEveryType) {
+  // Weights and constants big enough to reach both clamps often.
+  checkAllLayouts<uint8_t>(1.5f, 200.0f);
+  checkAllLayouts<int8_t>(1.5f, 200.0f);
+  checkAllLayouts<uint16_t>(1.5f, 40000.0f);
+  checkAllLayouts<int16_t>(1.5f, 40000.0f);
+  checkAllLayouts<float>(2.0f, 1.0f);
+}
+
+TEST(TwistKernels, FloatRunsMatchTheFormula) {
+  std::mt19937 rng(9);
+  for (int pixels = 1; pixels <= 70; ++pixels)
+    for (int offset : {0, 4, 8}) {
+      const Matrix m = randomMatrix(rng, 2.0f, 1.0f);
+      TestImage<float> src(pixels * 4, 1, offset), dst(pixels * 4, 1, 0);
+      src.fillRandom(rng(), -1, 2);
+      // Three channels, with and without streaming stores.
+      for (bool stream : {false, true}) {
+        row32fC3(src.data(), dst.data(), pixels, m, stream);
+        for (int x = 0; x < pixels * 3; ++x) {
+          const float* p = src.data() + (x / 3) * 3;
+          ASSERT_EQ(dst.get(x, 0), output(m, x % 3, p[0], p[1], p[2])) << pixels << " " << x;
+        }
+      }
+      // Four channels.
+      row32fC4(src.data(), dst.data(), pixels, m);
+      for (int x = 0; x < pixels * 4; ++x) {
+        const float* p = src.data() + (x / 4) * 4;
+        ASSERT_EQ(dst.get(x, 0), output4(m, x % 4, p[0], p[1], p[2], p[3])) << pixels << " " << x;
+      }
+      ASSERT_TRUE(dst.guardsIntact());
+    }
+}
+
+// A 3 by 4 matrix for the public functions.
+struct Twist {
+  float t[3][4];
+};
+Twist identity(float constant = 0) {
+  Twist w{};
+  for (int i = 0; i < 3; ++i) {
+    w.t[i][i] = 1;
+    w.t[i][3] = constant;
+  }
+  return w;
+}
+
+TEST(TwistReference, IdentityKeepsEveryLayout) {
+  std::mt19937 rng(4);
+  const Twist id = identity();
+  std::vector<uint8_t> px(11 * 4), out(11 * 4, 0);
+  for (auto& v : px) v = uint8_t(rng());
+  ASSERT_EQ(zeliColorTwist32f_8u_C3R(px.data(), 33, out.data(), 33, ImageSize{11, 1}, id.t), StatusOk);
+  EXPECT_TRUE(std::equal(px.begin(), px.begin() + 33, out.begin()));
+  out = px;
+  ASSERT_EQ(zeliColorTwist32f_8u_AC4IR(out.data(), 44, ImageSize{11, 1}, id.t), StatusOk);
+  EXPECT_EQ(out, px);
+  std::vector<uint8_t> planes[3] = {px, px, px};
+  for (int k = 0; k < 3; ++k) std::reverse(planes[k].begin(), planes[k].end() - k);
+  uint8_t* p[3] = {planes[0].data(), planes[1].data(), planes[2].data()};
+  const std::vector<uint8_t> keep[3] = {planes[0], planes[1], planes[2]};
+  ASSERT_EQ(zeliColorTwist32f_8u_IP3R(p, 44, ImageSize{44, 1}, id.t), StatusOk);
+  for (int k = 0; k < 3; ++k) EXPECT_EQ(planes[k], keep[k]);
+}
+
+template <typename T, typename Fn>
+std::vector<T> twistPixels(Fn fn, std::vector<T> pixels, const Twist& w) {
+  const int width = int(pixels.size()) / 3;
+  const int step = int(pixels.size() * sizeof(T));
+  EXPECT_EQ(fn(pixels.data(), step, ImageSize{width, 1}, w.t), StatusOk);
+  return pixels;
+}
+
+TEST(TwistReference, ClampBeforeRounding) {
+  // 8u: a constant of 300 saturates, -10 on black stays 0; in block and tail.
+  const std::vector<uint8_t> black(7 * 3, 0);
+  for (uint8_t v : twistPixels(zeliColorTwist32f_8u_C3IR, black, identity(300))) EXPECT_EQ(v, 255);
+  for (uint8_t v : twistPixels(zeliColorTwist32f_8u_C3IR, black, identity(-10))) EXPECT_EQ(v, 0);
+  // 8s: 127.4 is clamped to 127; -200 reaches -128 by saturation only.
+  const std::vector<int8_t> zero8s(6 * 3, 0);
+  for (int8_t v : twistPixels(zeliColorTwist32f_8s_C3IR, zero8s, identity(127.4f))) EXPECT_EQ(v, 127);
+  for (int8_t v : twistPixels(zeliColorTwist32f_8s_C3IR, zero8s, identity(-200))) EXPECT_EQ(v, -128);
+  for (int8_t v : twistPixels(zeliColorTwist32f_8s_C3IR, zero8s, identity(-3e9f))) EXPECT_EQ(v, -128);
+  // 16s: 40000 becomes 32767, -40000 -32768.
+  const std::vector<int16_t> zero16s(5 * 3, 0);
+  for (int16_t v : twistPixels(zeliColorTwist32f_16s_C3IR, zero16s, identity(40000))) EXPECT_EQ(v, 32767);
+  for (int16_t v : twistPixels(zeliColorTwist32f_16s_C3IR, zero16s, identity(-40000))) EXPECT_EQ(v, -32768);
+  // Floats are not clamped.
+  const std::vector<float> ones(5 * 3, 1.0f);
+  for (float v : twistPixels(zeliColorTwist_32f_C3IR, ones, identity(2.5f))) EXPECT_EQ(v, 3.5f);
+}
+
+TEST(TwistReference, EightBitSignedAddsLeftToRight) {
+  // With a = b = c = 1: the general order gives (0.5 + 2^24) + (1 - 2^24)
+  // = 1, the 8s order ((2^24 + 1) - 2^24) + 0.5 = 0.5, rounded to 0.
+  Twist w{};
+  for (int i = 0; i < 3; ++i) {
+    w.t[i][0] = 16777216.0f;
+    w.t[i][1] = 1.0f;
+    w.t[i][2] = -16777216.0f;
+    w.t[i][3] = 0.5f;
+  }
+  for (int8_t v : twistPixels(zeliColorTwist32f_8s_C3IR, std::vector<int8_t>(5 * 3, 1), w)) EXPECT_EQ(v, 0);
+  for (uint8_t v : twistPixels(zeliColorTwist32f_8u_C3IR, std::vector<uint8_t>(5 * 3, 1), w)) EXPECT_EQ(v, 1);
+}
+
+// Sets a rounding mode for the length of a test and restores the default.
+struct CallerRounding {
+  explicit CallerRounding(unsigned mode) : saved(_mm_getcsr()) { _mm_setcsr((saved & ~_MM_ROUND_MASK) | mode); }
+  ~CallerRounding() { _mm_setcsr(saved); }
+  unsigned saved;
+};
+
+TEST(TwistRounding, IntegerMembersRoundToNearestAndRestoreTheCallersMode) {
+  // v = 2.5 gives 2 and v = 3.5 gives 4, in the vector block and the tail.
+  std::vector<uint8_t> px;
+  for (int x = 0; x < 18; ++x) px.push_back(x % 3 == 1 ? 3 : 2);
+  for (unsigned mode : {_MM_ROUND_TOWARD_ZERO, _MM_ROUND_UP, _MM_ROUND_DOWN}) {
+    CallerRounding caller(mode);
+    const auto out = twistPixels(zeliColorTwist32f_8u_C3IR, px, identity(0.5f));
+    const unsigned after = _mm_getcsr() & _MM_ROUND_MASK;
+    for (int x = 0; x < 6; ++x) {
+      EXPECT_EQ(out[3 * x], 2) << mode;
+      EXPECT_EQ(out[3 * x + 1], 4) << mode;
+    }
+    EXPECT_EQ(after, mode);
+  }
+  // A failed check also leaves the mode alone.
+  CallerRounding caller(_MM_ROUND_UP);
+  const Twist id = identity();
+  EXPECT_EQ(zeliColorTwist32f_16u_C3IR(nullptr, 6, ImageSize{1, 1}, id.t), StatusNullPointerError);
+  EXPECT_EQ(_mm_getcsr() & _MM_ROUND_MASK, unsigned(_MM_ROUND_UP));
+}
+
+TEST(TwistRounding, FloatMembersComputeInTheCallersMode) {
+  std::mt19937 rng(2);
+  std::vector<float> px(9 * 3);
+  for (auto& v : px) v = std::uniform_real_distribution<float>(0, 1)(rng);
+  const Twist w = {{{0.3f, 0.6f, 0.1f, 0.01f}, {0.7f, -0.2f, 0.5f, 0.02f}, {0.1f, 0.1f, 0.9f, 0.03f}}};
+  const Matrix m = matrix3(w.t);
+  CallerRounding caller(_MM_ROUND_TOWARD_ZERO);
+  const auto out = twistPixels(zeliColorTwist_32f_C3IR, px, w);
+  int differs = 0;
+  for (int x = 0; x < 9; ++x)
+    for (int i = 0; i < 3; ++i) {
+      const float* p = &px[3 * x];
+      const float truncated = output(m, i, p[0], p[1], p[2]);
+      EXPECT_EQ(out[3 * x + i], truncated);
+      _mm_setcsr(caller.saved);
+      differs += output(m, i, p[0], p[1], p[2]) != truncated;
+      _mm_setcsr((caller.saved & ~_MM_ROUND_MASK) | _MM_ROUND_TOWARD_ZERO);
+    }
+  EXPECT_GT(differs, 0) << "the data does not tell the modes apart";
+}
+
+TEST(TwistFloatRows, DenseImagesStreamFromTheThresholdWithTheSameResults) {
+  EXPECT_FALSE(streamsC3(100, 100));  // 30000 samples
+  EXPECT_TRUE(streamsC3(200, 100));   // 60000 samples
+  EXPECT_FALSE(streamsC3(11664, 1));  // 34992
+  EXPECT_TRUE(streamsC3(11665, 1));   // 34995
+  std::mt19937 rng(5);
+  const Twist w = {{{0.3f, 0.6f, 0.1f, 0.5f}, {0.7f, -0.2f, 0.5f, -2.0f}, {0.1f, 0.1f, 0.9f, 0.03f}}};
+  const Matrix m = matrix3(w.t);
+  for (int width : {100, 200}) {
+    std::vector<float> src(size_t(width) * 100 * 3), dst(src.size() + 1, -1.0f);
+    for (auto& v : src) v = std::uniform_real_distribution<float>(-1, 2)(rng);
+    ASSERT_EQ(zeliColorTwist_32f_C3R(src.data(), width * 12, dst.data(), width * 12, ImageSize{width, 100}, w.t),
+              StatusOk);
+    for (size_t i = 0; i < src.size(); ++i) {
+      const float* p = &src[i / 3 * 3];
+      ASSERT_EQ(dst[i], output(m, int(i % 3), p[0], p[1], p[2])) << width << " " << i;
+    }
+    EXPECT_EQ(dst.back(), -1.0f);
+  }
+}
+
+TEST(TwistFloatRows, FourChannelDiagonalAndMergedRun) {
+  std::mt19937 rng(6);
+  float diag[4][4] = {};
+  for (int i = 0; i < 4; ++i) diag[i][i] = 1.0f;
+  std::vector<float> src(9 * 4 * 3), dst(src.size(), 0.0f);
+  for (auto& v : src) v = std::uniform_real_distribution<float>(-5, 5)(rng) + 0.125f;
+  ASSERT_EQ(zeliColorTwist_32f_C4R(src.data(), 9 * 16, dst.data(), 9 * 16, ImageSize{9, 3}, diag), StatusOk);
+  EXPECT_EQ(std::memcmp(src.data(), dst.data(), src.size() * 4), 0);
+  // Steps of width * 4 bytes: width * height pixels as one run from the
+  // first row, which here covers exactly the 27 pixels of the buffer.
+  float swap[4][4] = {{0, 1, 0, 0}, {1, 0, 0, 0}, {0, 0, 0, 1}, {0, 0, 1, 0}};
+  std::fill(dst.begin(), dst.end(), 0.0f);
+  ASSERT_EQ(zeliColorTwist_32f_C4R(src.data(), 9 * 4, dst.data(), 9 * 4, ImageSize{9, 3}, swap), StatusOk);
+  for (int px = 0; px < 27; ++px) {
+    EXPECT_EQ(dst[px * 4], src[px * 4 + 1]) << px;
+    EXPECT_EQ(dst[px * 4 + 3], src[px * 4 + 2]) << px;
+  }
+  EXPECT_TRUE(mergesC4(36, 36, 9));
+  EXPECT_FALSE(mergesC4(36, 40, 9));
+}
+
+}  // namespace

@@ -1,0 +1,212 @@
+#include "info.h"
+
+#include <cstring>
+#include <iomanip>
+#include <sstream>
+
+#include "buffers.h"
+#include "options.h"
+
+namespace zel::tool {
+
+using meta::ArgKind;
+using meta::Chroma;
+using meta::Descriptor;
+using meta::Layout;
+using meta::Role;
+using meta::Side;
+
+std::string statusName(int status) {
+  switch (status) {
+    case StatusOk: return "StatusOk";
+    case StatusNothingDoneWarning: return "StatusNothingDoneWarning";
+    case StatusOddSizeWarning: return "StatusOddSizeWarning";
+    case StatusBadArgumentError: return "StatusBadArgumentError";
+    case StatusSizeError: return "StatusSizeError";
+    case StatusNullPointerError: return "StatusNullPointerError";
+    case StatusOutOfMemoryError: return "StatusOutOfMemoryError";
+    case StatusStepError: return "StatusStepError";
+    case StatusStateIdentityError: return "StatusStateIdentityError";
+    case StatusEmptyRangeError: return "StatusEmptyRangeError";
+    case StatusLevelsError: return "StatusLevelsError";
+    case StatusNoiseError: return "StatusNoiseError";
+    case StatusDitherKindError: return "StatusDitherKindError";
+  }
+  return "Status(" + std::to_string(status) + ")";
+}
+
+namespace {
+
+const char* layoutText(const Side& s) {
+  if (s.packedWord) return "one 16-bit packed word a pixel";
+  switch (s.layout) {
+    case Layout::C1: return "one channel";
+    case Layout::C2: return "4:2:2 stream, two pixels in four samples";
+    case Layout::C3: return "three interleaved channels";
+    case Layout::C4: return "four interleaved channels";
+    case Layout::AC4: return "three channels and alpha, interleaved";
+    case Layout::P2: return "luma plane and a plane of chroma pairs";
+    case Layout::P3: return "three planes";
+    case Layout::P4: return "four planes";
+    case Layout::AP4: return "three planes and an alpha plane";
+  }
+  return "";
+}
+
+const char* chromaText(Chroma c) {
+  switch (c) {
+    case Chroma::Full: return "full-resolution chroma";
+    case Chroma::S422: return "chroma 4:2:2 (halved across)";
+    case Chroma::S420: return "chroma 4:2:0 (halved across and down)";
+    case Chroma::S411: return "chroma 4:1:1 (quartered across)";
+    case Chroma::S1620: return "chroma quartered across and down";
+  }
+  return "";
+}
+
+std::string sideText(const Side& s) {
+  std::ostringstream o;
+  o << (s.format.empty() ? "-" : s.format) << ", " << meta::layoutName(s.layout) << " (" << layoutText(s) << "), "
+    << meta::sampleName(s.sample) << ", " << chromaText(s.chroma);
+  return o.str();
+}
+
+std::string number(double v) {
+  std::ostringstream o;
+  o << std::setprecision(9) << v;
+  return o.str();
+}
+
+std::string argumentName(const Descriptor& d, const meta::ArgSlot& s, size_t index) {
+  const Side& src = d.src;
+  const Side& dst = d.dst;
+  auto pairName = [](const char* base, const Side& side, int plane, const char* tail) {
+    if (side.layout == Layout::P2) return std::string(base) + (plane == 0 ? "Y" : "CbCr") + tail;
+    return std::string(base) + tail;
+  };
+  auto planes = [](const Side& side) { return "[" + std::to_string(side.planes()) + "]"; };
+  switch (s.role) {
+    case Role::SrcPtr: return pairName("src", src, s.plane, "");
+    case Role::SrcPlanes: return "srcPlanes" + planes(src);
+    case Role::SrcStep: return pairName("src", src, s.plane, "Step");
+    case Role::SrcSteps: return "srcSteps" + planes(src);
+    case Role::DstPtr: return pairName("dst", dst, s.plane, "");
+    case Role::DstPlanes: return "dstPlanes" + planes(dst);
+    case Role::DstStep: return pairName("dst", dst, s.plane, "Step");
+    case Role::DstSteps: return "dstSteps" + planes(dst);
+    case Role::SrcDstPtr: return "srcDst";
+    case Role::SrcDstPlanes: return "srcDstPlanes" + planes(src);
+    case Role::SrcDstStep: return "srcDstStep";
+    case Role::Size: return "size";
+    case Role::Extra: return d.extras[s.extra].name;
+    default:
+      if (index < d.prototype.size() && d.prototype[index] == ArgKind::Region) return "srcRegion";
+      return "argument" + std::to_string(index + 1);
+  }
+}
+
+std::string argumentRole(const Descriptor& d, const meta::ArgSlot& s) {
+  switch (s.role) {
+    case Role::SrcPtr:
+    case Role::SrcPlanes: return "source";
+    case Role::DstPtr:
+    case Role::DstPlanes: return "destination";
+    case Role::SrcDstPtr:
+    case Role::SrcDstPlanes: return "image converted in place";
+    case Role::SrcStep:
+    case Role::SrcSteps:
+    case Role::DstStep:
+    case Role::DstSteps:
+    case Role::SrcDstStep:
+      return d.checksSteps ? "row step in bytes, checked: at least 1" : "row step in bytes, used unchecked";
+    case Role::Size: return "width and height in pixels";
+    case Role::Extra: {
+      const meta::Extra& e = d.extras[s.extra];
+      if (e.kind == ArgKind::Pointer) return "family argument, default: " + number(e.good) + " bytes of floats 0.25";
+      return "family argument, default " + number(e.good);
+    }
+    default: return "";
+  }
+}
+
+std::string checkText(const Descriptor& d, const meta::CheckStage& c) {
+  switch (c.check) {
+    case meta::Check::NullTop: return "null pointers";
+    case meta::Check::NullPlanes: return "null plane entries";
+    case meta::Check::SizePositive: return "size at least 1x1";
+    case meta::Check::Size: return "size";
+    case meta::Check::Step: return "steps";
+    case meta::Check::Extra: return d.extras[c.extra].name;
+    default: return "check " + std::to_string(int(c.check));
+  }
+}
+
+}  // namespace
+
+std::string describeExport(const Descriptor& d) {
+  std::ostringstream o;
+  if (!d.isImageFunction()) {
+    o << d.name << "\n  the version query: no arguments, returns a pointer to the constant version record\n"
+      << describeVersion();
+    return o.str();
+  }
+  o << d.name << "\n";
+  o << "  operation     " << d.operation << (d.qualifier.empty() ? "" : ", qualifier " + d.qualifier) << "\n";
+  if (d.inPlace) {
+    o << "  image         " << sideText(d.src) << ", converted in place\n";
+  } else {
+    o << "  source        " << sideText(d.src) << "\n";
+    o << "  destination   " << sideText(d.dst) << "\n";
+  }
+  o << "  steps         "
+    << (!d.region ? "none: whole images, rows tightly packed"
+                  : d.checksSteps ? "one per image or plane, each at least 1 (else StatusStepError)"
+                                  : "one per image or plane, used unchecked")
+    << "\n";
+  o << "  minimum size  " << d.minWidth << "x" << d.minHeight << "\n";
+  o << "  odd sizes     " << (d.warnsOdd ? "may return StatusOddSizeWarning after the work" : "no warning") << "\n";
+  if (d.writesAlpha) o << "  alpha         the destination's fourth channel is written\n";
+  if (readsMosaic(d)) o << "  run input     a Bayer mosaic of the picture, laid out as the grid argument says\n";
+
+  o << "  arguments\n";
+  for (size_t i = 0; i < d.slots.size(); ++i) {
+    const std::string kind = i < d.prototype.size() ? argKindName(d.prototype[i]) : "";
+    o << "    " << std::left << std::setw(16) << argumentName(d, d.slots[i], i) << std::setw(17) << kind
+      << argumentRole(d, d.slots[i]) << "\n";
+  }
+  o << "  family arguments";
+  if (d.extras.empty()) o << "  none";
+  o << "\n";
+  for (const meta::Extra& e : d.extras) {
+    o << "    " << std::left << std::setw(16) << e.name << argKindName(e.kind) << ", default ";
+    if (e.kind == ArgKind::Pointer) o << number(e.good) << " bytes of floats 0.25 (give V1,V2,... to replace)";
+    else o << number(e.good);
+    for (const meta::BadValue& b : e.bad) o << "; " << number(b.value) << " gives " << statusName(b.status);
+    o << "\n";
+  }
+  o << "  checks        ";
+  for (size_t i = 0; i < d.order.size(); ++i) o << (i ? ", " : "") << checkText(d, d.order[i]);
+  o << "\n";
+
+  o << "  buffers at 640x480\n";
+  auto planesOf = [&](const Side& s, const char* what) {
+    for (int p = 0; p < s.planes(); ++p) {
+      const meta::PlaneGeometry g = meta::planeGeometry(s, p, 640, 480);
+      o << "    " << what << " plane " << p << ": " << g.rows << " rows of " << g.rowBytes << " bytes\n";
+    }
+  };
+  planesOf(d.src, d.inPlace ? "image" : "source");
+  if (!d.inPlace) planesOf(d.dst, "destination");
+  return o.str();
+}
+
+std::string describeVersion() {
+  const LibraryVersion* v = zelccGetLibVersion();
+  std::ostringstream o;
+  o << "  zelcc " << v->version << ", " << v->name << ", variant "
+    << std::string(v->variantCode, strnlen(v->variantCode, 4)) << ", version " << v->major << "." << v->minor << "."
+    << v->revision << " build " << v->build << " of " << v->buildDate << "\n";
+  return o.str();
+}
+
+}  // namespace zel::tool
