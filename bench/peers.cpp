@@ -139,6 +139,8 @@ const std::map<std::string, PeerFactory>& table() {
        [] { return std::vector<Peer>{cvtColorPeer("OpenCV cvtColor RGB2YCrCb", CV_8UC3, CV_8UC3, cv::COLOR_RGB2YCrCb)}; }},
       {"zeliRGBToYCbCr_8u_AC4R",
        [] { return std::vector<Peer>{cvtColorPeer("OpenCV cvtColor RGBA2YCrCb", CV_8UC4, CV_8UC3, cv::COLOR_RGB2YCrCb)}; }},
+      {"zeliRGBToYUV420_8u_C3P3R",
+       [] { return std::vector<Peer>{cvtColorPeer("OpenCV cvtColor RGB2YUV_I420", CV_8UC3, CV_8UC1, cv::COLOR_RGB2YUV_I420)}; }},
       {"zeliYCbCrToRGB_8u_C3R",
        [] { return std::vector<Peer>{cvtColorPeer("OpenCV cvtColor YCrCb2RGB", CV_8UC3, CV_8UC3, cv::COLOR_YCrCb2RGB)}; }},
       {"zeliYCbCrToRGB_8u_AC4R",
@@ -241,6 +243,58 @@ const std::map<std::string, PeerFactory>& table() {
          return yuvPeer("libyuv I420ToNV12", [](YuvFrame& f) {
            libyuv::I420ToNV12(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.y2.data(), kWidth,
                               f.uv2.data(), kWidth, kWidth, kHeight);
+         });
+       }},
+      // RGB or BGR to subsampled YCbCr: libyuv's RGB24 holds B, G, R bytes,
+      // its RAW R, G, B; ARGB holds B, G, R, A.
+      {"zeliBGRToYCbCr420_8u_C3P3R",
+       [] {
+         return yuvPeer("libyuv RGB24ToI420", [](YuvFrame& f) {
+           libyuv::RGB24ToI420(f.argb.data(), kWidth * 3, f.y2.data(), kWidth, f.u2.data(), kWidth / 2, f.v2.data(),
+                               kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliRGBToYCbCr420_8u_C3P3R",
+       [] {
+         auto p = yuvPeer("libyuv RAWToI420", [](YuvFrame& f) {
+           libyuv::RAWToI420(f.argb.data(), kWidth * 3, f.y2.data(), kWidth, f.u2.data(), kWidth / 2, f.v2.data(),
+                             kWidth / 2, kWidth, kHeight);
+         });
+#ifdef ZELCC_BENCH_OPENCV
+         p.push_back(cvtColorPeer("OpenCV cvtColor RGB2YUV_I420", CV_8UC3, CV_8UC1, cv::COLOR_RGB2YUV_I420));
+#endif
+         return p;
+       }},
+      {"zeliBGRToYCbCr420_8u_AC4P3R",
+       [] {
+         return yuvPeer("libyuv ARGBToI420", [](YuvFrame& f) {
+           libyuv::ARGBToI420(f.argb.data(), kWidth * 4, f.y2.data(), kWidth, f.u2.data(), kWidth / 2, f.v2.data(),
+                              kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliRGBToYCbCr420_8u_C4P2R",
+       [] {
+         return yuvPeer("libyuv ABGRToNV12", [](YuvFrame& f) {
+           libyuv::ABGRToNV12(f.argb.data(), kWidth * 4, f.y2.data(), kWidth, f.uv2.data(), kWidth, kWidth, kHeight);
+         });
+       }},
+      {"zeliBGRToYCbCr422_8u_AC4P3R",
+       [] {
+         return yuvPeer("libyuv ARGBToI422", [](YuvFrame& f) {
+           libyuv::ARGBToI422(f.argb.data(), kWidth * 4, f.y2.data(), kWidth, f.u2.data(), kWidth / 2, f.v2.data(),
+                              kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliBGRToYCbCr422_8u_AC4C2R",
+       [] {
+         return yuvPeer("libyuv ARGBToYUY2", [](YuvFrame& f) {
+           libyuv::ARGBToYUY2(f.argb.data(), kWidth * 4, f.packed2.data(), kWidth * 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliBGRToCbYCr422_8u_AC4C2R",
+       [] {
+         return yuvPeer("libyuv ARGBToUYVY", [](YuvFrame& f) {
+           libyuv::ARGBToUYVY(f.argb.data(), kWidth * 4, f.packed2.data(), kWidth * 2, kWidth, kHeight);
          });
        }},
       {"zeliYCbCr422ToGray_8u_C2C1R",

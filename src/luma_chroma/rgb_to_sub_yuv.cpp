@@ -48,9 +48,17 @@ void walk420(const Rows& rows, uint8_t* const dst[3], const int steps[3], ImageS
   });
 }
 
-// The wide form for every pixel (no body).
+// The wide form for every pixel (no body), in exact 32-bit lanes where
+// whole blocks of 16 fit.
 void planes420(const uint8_t* const src[3], int srcStep, uint8_t* const dst[3], const int steps[3], ImageSize size) {
-  walk420<DifferenceBody<4>, WideDifference420Tail>(PlaneRows{src, srcStep}, dst, steps, size, 0);
+  const PlaneRows rows{src, srcStep};
+  const int end = size.width & ~1;
+  rowPairWalk(size.height, [&](int r, int c) {
+    const Planes420Out out{rowAt(dst[0], steps[0], r), rowAt(dst[0], steps[0], r + 1), rowAt(dst[1], steps[1], c),
+                           rowAt(dst[2], steps[2], c)};
+    const PlanesSource top = rows(r), bottom = rows(r + 1);
+    pairSpan(top, bottom, out, wideDifference420Blocks(top, bottom, out, 0, end), end, WideDifference420Tail{});
+  });
 }
 
 // Rounded lanes over half-width blocks, 2.14 tail.

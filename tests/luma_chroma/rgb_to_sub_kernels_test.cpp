@@ -151,6 +151,16 @@ TEST(SubsampledKernels, YuvBlocksMatchTheScalarForms) {
   rowBodyAgrees<2, false>(RoundedDifferenceBody<2>{}, In::C3, Out::Planes);
 }
 
+TEST(SubsampledKernels, WideYuvBlocksMatchTheWideForm) {
+  agree(3, 3, 2, [&](const uint8_t* s, uint8_t* b, uint8_t* p, int w, bool) {
+    const PlanesSource top{{s, s + w, s + 2 * w}}, bottom{{s + 3 * w, s + 4 * w, s + 5 * w}};
+    const Planes420Out ob{b, b + w, b + 2 * w, b + 2 * w + w / 2}, op{p, p + w, p + 2 * w, p + 2 * w + w / 2};
+    const int n = w & ~1;
+    pairSpan(top, bottom, ob, wideDifference420Blocks(top, bottom, ob, 0, n), n, WideDifference420Tail{});
+    pairSpan(top, bottom, op, 0, n, WideDifference420Tail{});
+  });
+}
+
 TEST(SubsampledKernels, FilteredBlocksMatchTheScalarPairs) {
   for (const uint8_t* table : {static_cast<const uint8_t*>(nullptr), gammaTable()})
     agree(3, 2, 1, [&](const uint8_t* s, uint8_t* b, uint8_t* p, int w, bool) {
