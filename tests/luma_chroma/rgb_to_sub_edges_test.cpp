@@ -54,20 +54,6 @@ TEST(SubsampledEdges, TheBlockOfFourIsUsedOnlyWhenWidthAnd7IsFourOrMore) {
   }
 }
 
-TEST(SubsampledEdges, OddSizesOfFourTwoZeroLeaveTheLastRowAndColumn) {
-  TestImage<uint8_t> src(9, 3);
-  src.fillRandom(7);
-  Planes dst(3, 3, 2, 2);
-  for (auto* im : {&dst.y, &dst.c1, &dst.c2}) im->fill(0xEE);
-  EXPECT_EQ(zeliBGRToYCbCr420_8u_C3P3R(src.data(), src.step(), dst.ptrs, dst.steps, {3, 3}), StatusOddSizeWarning);
-  for (int y = 0; y < 3; ++y)
-    for (int x = 0; x < 3; ++x) EXPECT_EQ(dst.y.get(x, y) == 0xEE, x == 2 || y == 2) << x << "," << y;
-  for (auto* im : {&dst.c1, &dst.c2})
-    for (int y = 0; y < 2; ++y)
-      for (int x = 0; x < 2; ++x) EXPECT_EQ(im->get(x, y) == 0xEE, x > 0 || y > 0);
-  EXPECT_TRUE(dst.y.guardsIntact() && dst.c1.guardsIntact() && dst.c2.guardsIntact());
-}
-
 // Every combination of 0 and 255 in the three channels, then random pixels.
 void extremes(TestImage<uint8_t>& src, int stride) {
   src.fillRandom(3);
@@ -133,52 +119,7 @@ TEST(SubsampledEdges, KnownColours) {
   }
 }
 
-TEST(SubsampledEdges, OddWidthOfAPairStreamKeepsTheLastCr) {
-  TestImage<uint8_t> src(3 * 5, 2);
-  src.fillRandom(5);
-  TestImage<uint8_t> dst(2 * 5 + 1, 2);
-  dst.fill(0xEE);
-  ASSERT_EQ(zeliRGBToYCbCr422_8u_C3C2R(src.data(), src.step(), dst.data(), dst.step(), {5, 2}), StatusOk);
-  for (int y = 0; y < 2; ++y) {
-    EXPECT_NE(dst.get(8, y), 0xEE);  // Y of the last pixel
-    EXPECT_GE(dst.get(9, y), 16);    // its Cb
-    EXPECT_EQ(dst.get(10, y), 0xEE) << "the Cr position after them stays";
-  }
-}
-
 // ---- YUV 4:2:2 in planes ----
-
-// Only the buffers' alignment differs: the second kernel changes last bits.
-TEST(SubsampledEdges, AlignmentChoosesTheKernelOfTheInterleavedYuvMember) {
-  const int w = 32, h = 4;
-  TestImage<uint8_t> src(3 * w, h);
-  src.fillRandom(9);
-  TestImage<uint8_t> moved(3 * w, h, 1);
-  for (int y = 0; y < h; ++y)
-    for (int x = 0; x < 3 * w; ++x) moved.set(x, y, src.get(x, y));
-  // Planes on 64-byte boundaries with steps of 32 bytes.
-  auto planes = [&] {
-    std::vector<TestImage<uint8_t>> p;
-    p.reserve(3);
-    p.emplace_back(w, h);
-    p.emplace_back(w / 2, h, 0, 16);
-    p.emplace_back(w / 2, h, 0, 16);
-    return p;
-  };
-  auto run = [&](const TestImage<uint8_t>& in, std::vector<TestImage<uint8_t>>& out) {
-    uint8_t* ptrs[3] = {out[0].data(), out[1].data(), out[2].data()};
-    const int steps[3] = {out[0].step(), out[1].step(), out[2].step()};
-    return zeliRGBToYUV422_8u_C3P3R(in.data(), in.step(), ptrs, steps, {w, h});
-  };
-  auto aligned = planes(), unaligned = planes();
-  ASSERT_EQ(run(src, aligned), StatusOk);
-  ASSERT_EQ(run(moved, unaligned), StatusOk);
-  int differ = 0;
-  for (int p = 0; p < 3; ++p)
-    for (int y = 0; y < h; ++y)
-      for (int x = 0; x < aligned[p].rowSamples(); ++x) differ += aligned[p].get(x, y) != unaligned[p].get(x, y);
-  EXPECT_GT(differ, 0);
-}
 
 // The name without steps treats 18 by 16 pixels as one row, all of it body;
 // row by row (the name with steps, given the same steps), columns 16 and 17
