@@ -132,7 +132,8 @@ namespace {
 Status filtered(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size, const uint8_t* table) {
   if (!src || !dst) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
-  plainWalk(size.height, [&](int y) { filteredRow(rowAt(src, srcStep, y), rowAt(dst, dstStep, y), size.width, table, true); });
+  plainWalk(size.height,
+            [&](int y) { filteredRow(rowAt(src, srcStep, y), rowAt(dst, dstStep, y), size.width, table, true); });
   return StatusOk;
 }
 

@@ -57,12 +57,12 @@ struct MatrixSet {
   bool narrow;                             // every result clamped to 1..254
 };
 
-inline constexpr MatrixSet set601{8422,  16515, 3212,  2112,  9699,   19071, 28770, 28770, 24117, 4653,  16843,
-                                  33030, 6423,  -9699, -19071, 28770, 28770, -24117, -4653, false};
-inline constexpr MatrixSet set709Csc{5997,  20120, 2032,  2112,  6619,   22151, 28770, 28770, 26149, 2621,  11993,
-                                     40239, 4063,  -6619, -22151, 28770, 28770, -26149, -2621, false};
-inline constexpr MatrixSet set709Hdtv{6980,  23429, 2359,  64,     3834,   12911, 16744, 16744, 15204, 1540,  13959,
-                                      46858, 4719,  -7668, -25821, 33489, 33489, -30409, -3080, true};
+inline constexpr MatrixSet set601{8422,  16515, 3212, 2112,  9699,   19071, 28770, 28770,  24117, 4653,
+                                  16843, 33030, 6423, -9699, -19071, 28770, 28770, -24117, -4653, false};
+inline constexpr MatrixSet set709Csc{5997,  20120, 2032, 2112,  6619,   22151, 28770, 28770,  26149, 2621,
+                                     11993, 40239, 4063, -6619, -22151, 28770, 28770, -26149, -2621, false};
+inline constexpr MatrixSet set709Hdtv{6980,  23429, 2359, 64,    3834,   12911, 16744, 16744,  15204, 1540,
+                                      13959, 46858, 4719, -7668, -25821, 33489, 33489, -30409, -3080, true};
 
 // The store of a result: SaturateU8, or the 1..254 clamp of the narrow set.
 // Wide results of the other sets always fit, and their low byte is stored.
@@ -92,8 +92,8 @@ inline int rounded5(int x, int c) { return MulHighRound(static_cast<int16_t>(x <
 // lumaLanes: (H(R, cR) + H(G, cG) + H(B, cB) + k) >> 7.
 template <const MatrixSet& S>
 inline uint8_t lumaLanes(const Rgb& p) {
-  const uint16_t sum = static_cast<uint16_t>(lc::highU(p.r, S.lumaR) + lc::highU(p.g, S.lumaG) +
-                                             lc::highU(p.b, S.lumaB) + S.k);
+  const uint16_t sum =
+      static_cast<uint16_t>(lc::highU(p.r, S.lumaR) + lc::highU(p.g, S.lumaG) + lc::highU(p.b, S.lumaB) + S.k);
   return store<S>(sum >> 7);
 }
 
@@ -197,8 +197,7 @@ inline typename U::V lumaLanesV(const MatrixSet& s, typename U::V r, typename U:
 }
 
 template <const MatrixSet& S, int Pixels, class U>
-inline void chromaLanesV(typename U::V sr, typename U::V sg, typename U::V sb, typename U::V& c1,
-                         typename U::V& c2) {
+inline void chromaLanesV(typename U::V sr, typename U::V sg, typename U::V sb, typename U::V& c1, typename U::V& c2) {
   using V = typename U::V;
   using Shape = ChromaLaneShape<S, Pixels>;
   const V xr = U::template sll16<Shape::kInShift>(sr), xg = U::template sll16<Shape::kInShift>(sg),

@@ -262,8 +262,7 @@ inline void pairSpan(const Src& top, const Src& bottom, const Out& out, int x, i
 // the last pixel of an odd width takes the tail's odd form. Pixels after
 // the last whole block of 4:1:1 are not written.
 template <int Ratio, class Body, class Tail, class Src, class Out>
-inline void convertRow(const Src& in, const Out& out, int width, int n, const Body& body, const Tail& tail,
-                       bool avx2) {
+inline void convertRow(const Src& in, const Out& out, int width, int n, const Body& body, const Tail& tail, bool avx2) {
   int x = 0;
   if (avx2) x = rowBlocksAvx<Ratio>(in, out, n, body);
   x = rowBlocks<Sse, Ratio>(in, out, x, n, body);

@@ -123,8 +123,8 @@ Status lanes422Planes(const uint8_t* src, int srcStep, uint8_t* const dst[3], co
   if (!src || !dst || !dstStep) return StatusNullPointerError;
   if (size.width < 2 || size.height < 1) return StatusSizeError;
   if (anyNull(reinterpret_cast<const void* const*>(dst), 3)) return StatusNullPointerError;
-  walkRows<2, LanesBody<set601, 2>, WideTail<set601, 2>>(PackedRows<Stride, Bgr>{src, srcStep},
-                                                         PlaneOutRows<2>{dst, dstStep}, size, bodyBy32Then8(size.width));
+  walkRows<2, LanesBody<set601, 2>, WideTail<set601, 2>>(
+      PackedRows<Stride, Bgr>{src, srcStep}, PlaneOutRows<2>{dst, dstStep}, size, bodyBy32Then8(size.width));
   return StatusOk;
 }
 
@@ -207,9 +207,8 @@ ZEL_PUBLIC Status zeliBGRToYCbCr420_709CSC_8u_C3P2R(const uint8_t* src, int srcS
                                                     uint8_t* dstCbCr, int dstCbCrStep, ImageSize size) {
   if (!src || !dstY || !dstCbCr) return StatusNullPointerError;
   if (size.width < 2 || size.height < 2) return StatusSizeError;
-  walk420TwoPlane<LanesBody<set709Csc, 4>, WideTail<set709Csc, 4>>(PackedRows<3, true>{src, srcStep}, dstY, dstYStep,
-                                                                    dstCbCr, dstCbCrStep, size,
-                                                                    bodyByHalfWidth(size.width));
+  walk420TwoPlane<LanesBody<set709Csc, 4>, WideTail<set709Csc, 4>>(
+      PackedRows<3, true>{src, srcStep}, dstY, dstYStep, dstCbCr, dstCbCrStep, size, bodyByHalfWidth(size.width));
   return oddWarning(size, true);
 }
 
@@ -288,15 +287,15 @@ ZEL_PUBLIC Status zeliRGBToYCrCb422_8u_C3C2R(const uint8_t* src, int srcStep, ui
   if (size.width < 1 || size.height < 1) return StatusSizeError;
   return exactPairs<PairOrder::YCrCb>(PackedRows<3, false>{src, srcStep}, dst, dstStep, size);
 }
-ZEL_PUBLIC Status zeliRGBToYCbCr422_8u_P3C2R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst,
-                                             int dstStep, ImageSize size) {
+ZEL_PUBLIC Status zeliRGBToYCbCr422_8u_P3C2R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                             ImageSize size) {
   if (!srcPlanes || !dst) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
   if (anyNull(reinterpret_cast<const void* const*>(srcPlanes), 3)) return StatusNullPointerError;
   return exactPairs<PairOrder::YCbCr>(PlaneRows{srcPlanes, srcStep}, dst, dstStep, size);
 }
-ZEL_PUBLIC Status zeliRGBToYCrCb422_8u_P3C2R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst,
-                                             int dstStep, ImageSize size) {
+ZEL_PUBLIC Status zeliRGBToYCrCb422_8u_P3C2R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
+                                             ImageSize size) {
   if (!srcPlanes || !dst) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
   if (anyNull(reinterpret_cast<const void* const*>(srcPlanes), 3)) return StatusNullPointerError;

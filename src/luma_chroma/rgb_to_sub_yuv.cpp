@@ -64,7 +64,7 @@ void planes420(const uint8_t* const src[3], int srcStep, uint8_t* const dst[3], 
 // Rounded lanes over half-width blocks, 2.14 tail.
 void packed420(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int steps[3], ImageSize size) {
   walk420<RoundedDifferenceBody<4>, Wide14Difference420Tail>(PackedRows<3, false>{src, srcStep}, dst, steps, size,
-                                                            bodyByHalfWidth(size.width));
+                                                             bodyByHalfWidth(size.width));
 }
 
 // ---- 4:2:2 in planes ----
@@ -86,7 +86,8 @@ template <class Rows>
 void walk422(const Rows& rows, uint8_t* const dst[3], const int steps[3], ImageSize size, bool aligned) {
   const bool avx2 = hasAvx2();
   plainWalk(size.height, [&](int y) {
-    row422(rows(y), PlanesOutSub<2, true>{rowAt(dst[0], steps[0], y), rowAt(dst[1], steps[1], y), rowAt(dst[2], steps[2], y)},
+    row422(rows(y),
+           PlanesOutSub<2, true>{rowAt(dst[0], steps[0], y), rowAt(dst[1], steps[1], y), rowAt(dst[2], steps[2], y)},
            size.width, aligned, avx2);
   });
 }
@@ -178,8 +179,7 @@ ZEL_PUBLIC Status zeliRGBToYUV420_8u_C3P3(const uint8_t* src, uint8_t* const dst
 
 // ---- 4:2:2 ----
 
-ZEL_PUBLIC Status zeliRGBToYUV422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
-                                           ImageSize size) {
+ZEL_PUBLIC Status zeliRGBToYUV422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
   if (!src || !dst) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
   const bool avx2 = zel::hasAvx2();
@@ -214,7 +214,9 @@ ZEL_PUBLIC Status zeliRGBToYUV422_8u_C3P3(const uint8_t* src, uint8_t* const dst
         const PlanesOutSub<2, true> out{dstPlanes[0] + first, dstPlanes[1] + first / 2, dstPlanes[2] + first / 2};
         row422(PackedSource<3, false>{PackedIn<3>{src + 3 * first}}, out, pixels, false, zel::hasAvx2());
       },
-      [&] { walk422(PackedRows<3, false>{src, 3 * w}, dstPlanes, steps, size, allAligned16(src, 3 * w, dstPlanes, steps)); });
+      [&] {
+        walk422(PackedRows<3, false>{src, 3 * w}, dstPlanes, steps, size, allAligned16(src, 3 * w, dstPlanes, steps));
+      });
   return StatusOk;
 }
 
@@ -245,6 +247,8 @@ ZEL_PUBLIC Status zeliRGBToYUV422_8u_P3(const uint8_t* const srcPlanes[3], uint8
         const PlanesOutSub<2, true> out{dstPlanes[0] + first, dstPlanes[1] + first / 2, dstPlanes[2] + first / 2};
         row422(in, out, pixels, false, zel::hasAvx2());
       },
-      [&] { walk422(PlaneRows{srcPlanes, w}, dstPlanes, steps, size, false); });
+      [&] {
+        walk422(PlaneRows{srcPlanes, w}, dstPlanes, steps, size, false);
+      });
   return StatusOk;
 }

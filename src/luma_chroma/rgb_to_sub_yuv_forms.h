@@ -24,9 +24,9 @@ namespace zel::lc::sub {
 // ---- per-pixel terms ----
 
 inline int16_t yuvP(const Rgb& p) {
-  return wrapAdd16(wrapAdd16(MulHighS16(static_cast<int16_t>(p.r << 2), 9798),
-                             MulHighS16(static_cast<int16_t>(p.g << 2), 19235)),
-                   MulHighS16(static_cast<int16_t>(p.b << 2), 3736));
+  return wrapAdd16(
+      wrapAdd16(MulHighS16(static_cast<int16_t>(p.r << 2), 9798), MulHighS16(static_cast<int16_t>(p.g << 2), 19235)),
+      MulHighS16(static_cast<int16_t>(p.b << 2), 3736));
 }
 inline int16_t yuvQ(const Rgb& p) {
   return wrapAdd16(wrapAdd16(lc::rounded(p.r, 4899), lc::rounded(p.g, 9617)), lc::rounded(p.b, 1868));
@@ -194,10 +194,10 @@ inline int wideDifference420Blocks(const Src& top, const Src& bottom, const Out&
       for (int h = 0; h < 2; ++h) {
         const __m128i R = h ? r.hi : r.lo, G = h ? g.hi : g.lo, B = h ? b.hi : b.lo;
         // t = 19595 R + 19235 G + 7471 B + 19235 G, pixels 0..3 and 4..7.
-        const __m128i t0 = _mm_add_epi32(_mm_madd_epi16(_mm_unpacklo_epi16(R, G), kRG),
-                                         _mm_madd_epi16(_mm_unpacklo_epi16(B, G), kBG));
-        const __m128i t1 = _mm_add_epi32(_mm_madd_epi16(_mm_unpackhi_epi16(R, G), kRG),
-                                         _mm_madd_epi16(_mm_unpackhi_epi16(B, G), kBG));
+        const __m128i t0 =
+            _mm_add_epi32(_mm_madd_epi16(_mm_unpacklo_epi16(R, G), kRG), _mm_madd_epi16(_mm_unpacklo_epi16(B, G), kBG));
+        const __m128i t1 =
+            _mm_add_epi32(_mm_madd_epi16(_mm_unpackhi_epi16(R, G), kRG), _mm_madd_epi16(_mm_unpackhi_epi16(B, G), kBG));
         half[h] = _mm_packs_epi32(_mm_srai_epi32(t0, 16), _mm_srai_epi32(t1, 16));
         st[h] = _mm_add_epi32(st[h], _mm_hadd_epi32(t0, t1));
       }
@@ -208,7 +208,8 @@ inline int wideDifference420Blocks(const Src& top, const Src& bottom, const Out&
     // (((S << 16) - T + 131071) >> 16) k >> 18, plus 128.
     auto scaled = [&](__m128i sums, int h, int k) {
       const __m128i s32 = _mm_cvtepi16_epi32(h ? _mm_srli_si128(sums, 8) : sums);
-      const __m128i d = _mm_srai_epi32(_mm_add_epi32(_mm_sub_epi32(_mm_slli_epi32(s32, 16), st[h]), _mm_set1_epi32(131071)), 16);
+      const __m128i d =
+          _mm_srai_epi32(_mm_add_epi32(_mm_sub_epi32(_mm_slli_epi32(s32, 16), st[h]), _mm_set1_epi32(131071)), 16);
       return _mm_add_epi32(_mm_srai_epi32(_mm_mullo_epi32(d, _mm_set1_epi32(k)), 18), _mm_set1_epi32(128));
     };
     const __m128i u = _mm_packs_epi32(scaled(sb, 0, 32244), scaled(sb, 1, 32244));

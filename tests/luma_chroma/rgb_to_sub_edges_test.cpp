@@ -188,10 +188,10 @@ void filteredModel(bool gamma) {
       for (int x = 0; x + 1 < width; x += 2) {
         const int left = x > 0 ? 1 : 0;
         // The centre taps are not quite twice the side taps.
-        const int b = (7193 * px(x, 2) - 2426 * px(x, 0) - 4769 * px(x, 1) + cb(x - left, left) + cb(x + 1, 1) +
-                       4210687) >> 15;
-        const int r = (7193 * px(x, 0) - 6030 * px(x, 1) - 1164 * px(x, 2) + cr(x - left, left) + cr(x + 1, 1) +
-                       4210687) >> 15;
+        const int b =
+            (7193 * px(x, 2) - 2426 * px(x, 0) - 4769 * px(x, 1) + cb(x - left, left) + cb(x + 1, 1) + 4210687) >> 15;
+        const int r =
+            (7193 * px(x, 0) - 6030 * px(x, 1) - 1164 * px(x, 2) + cr(x - left, left) + cr(x + 1, 1) + 4210687) >> 15;
         ASSERT_EQ(dst.get(2 * x, y), b) << width << " " << x;
         ASSERT_EQ(dst.get(2 * x + 1, y), luma(x));
         ASSERT_EQ(dst.get(2 * x + 2, y), r);

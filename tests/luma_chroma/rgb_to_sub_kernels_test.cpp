@@ -46,8 +46,10 @@ int pixelBytes(In in) { return in == In::C3 ? 3 : in == In::AC4 ? 4 : 3; }
 template <bool Bgr, class F>
 auto withSource(In in, int width, F f) {
   switch (in) {
-    case In::C3: return f([](const uint8_t* p) { return PackedSource<3, Bgr>{{p}}; });
-    case In::AC4: return f([](const uint8_t* p) { return PackedSource<4, Bgr>{{p}}; });
+    case In::C3:
+      return f([](const uint8_t* p) { return PackedSource<3, Bgr>{{p}}; });
+    case In::AC4:
+      return f([](const uint8_t* p) { return PackedSource<4, Bgr>{{p}}; });
     default:
       return f([width](const uint8_t* p) { return RgbSource<PlanesIn, Bgr>{{p, p + width, p + 2 * width}}; });
   }
@@ -85,9 +87,15 @@ void rowBodyAgrees(const Body& body, In in, Out out) {
         rowSpan<Ratio>(src, op, 0, n, body);
       };
       switch (out) {
-        case Out::Pairs: go(PairsOut<PairOrder::YCbCr>{b}, PairsOut<PairOrder::YCbCr>{p}); break;
-        case Out::PairsCrFirst: go(PairsOut<PairOrder::YCrCb>{b}, PairsOut<PairOrder::YCrCb>{p}); break;
-        case Out::PairsCbFirst: go(PairsOut<PairOrder::CbYCr>{b}, PairsOut<PairOrder::CbYCr>{p}); break;
+        case Out::Pairs:
+          go(PairsOut<PairOrder::YCbCr>{b}, PairsOut<PairOrder::YCbCr>{p});
+          break;
+        case Out::PairsCrFirst:
+          go(PairsOut<PairOrder::YCrCb>{b}, PairsOut<PairOrder::YCrCb>{p});
+          break;
+        case Out::PairsCbFirst:
+          go(PairsOut<PairOrder::CbYCr>{b}, PairsOut<PairOrder::CbYCr>{p});
+          break;
         default:
           go(PlanesOutSub<Ratio>{b, b + w, b + w + w / Ratio}, PlanesOutSub<Ratio>{p, p + w, p + w + w / Ratio});
       }

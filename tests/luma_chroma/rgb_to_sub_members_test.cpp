@@ -32,17 +32,17 @@ struct CC {
 // ---- constant sets, as the matrix tables give them ----
 
 struct Set {
-  int lr, lg, lb, k;                   // luma lanes
-  int cbR, cbG, cbB, crR, crG, crB;    // chroma lanes, positive
-  int wr, wg, wb;                      // luma 16.16
+  int lr, lg, lb, k;                 // luma lanes
+  int cbR, cbG, cbB, crR, crG, crB;  // chroma lanes, positive
+  int wr, wg, wb;                    // luma 16.16
   int wcbR, wcbG, wcbB, wcrR, wcrG, wcrB;
   bool narrow;
 };
-const Set k601{8422, 16515, 3212, 2112, 9699, 19071, 28770, 28770, 24117, 4653,
+const Set k601{8422,  16515, 3212, 2112,  9699,   19071, 28770, 28770,  24117, 4653,
                16843, 33030, 6423, -9699, -19071, 28770, 28770, -24117, -4653, false};
-const Set kCsc{5997, 20120, 2032, 2112, 6619, 22151, 28770, 28770, 26149, 2621,
+const Set kCsc{5997,  20120, 2032, 2112,  6619,   22151, 28770, 28770,  26149, 2621,
                11993, 40239, 4063, -6619, -22151, 28770, 28770, -26149, -2621, false};
-const Set kHdtv{6980, 23429, 2359, 64, 3834, 12911, 16744, 16744, 15204, 1540,
+const Set kHdtv{6980,  23429, 2359, 64,    3834,   12911, 16744, 16744,  15204, 1540,
                 13959, 46858, 4719, -7668, -25821, 33489, 33489, -30409, -3080, true};
 
 int clamp(int v, int lo, int hi) { return std::min(std::max(v, lo), hi); }
@@ -55,7 +55,9 @@ int sat8(int v) { return clamp(v, 0, 255); }
 int lumaLanes(const Set& s, Px p) {
   return sat(s, (((p.r * s.lr) >> 8) + ((p.g * s.lg) >> 8) + ((p.b * s.lb) >> 8) + s.k) >> 7);
 }
-int lumaWide(const Set& s, Px p, int addend) { return wideByte(s, (s.wr * p.r + s.wg * p.g + s.wb * p.b + addend) >> 16); }
+int lumaWide(const Set& s, Px p, int addend) {
+  return wideByte(s, (s.wr * p.r + s.wg * p.g + s.wb * p.b + addend) >> 16);
+}
 int lumaWide(const Set& s, Px p) { return lumaWide(s, p, s.narrow ? 32768 : 1081344); }
 int m8(int v, int c) { return (v * c + 128) >> 8; }  // MulHighRound(v << 7, c)
 int lumaRounded(Px p) { return sat8((m8(p.r, 4211) + m8(p.g, 8258) + m8(p.b, 1606) + 1026) >> 6); }
@@ -200,29 +202,48 @@ Model lanes420Model(const Set& s, Dst d, bool bgr, std::function<int(int)> n) {
 }
 
 Model rounded420Model(Dst d) {
-  return {Geo::S420, d, false, byHalf, [](Px p, int) { return lumaRounded(p); },
+  return {Geo::S420,
+          d,
+          false,
+          byHalf,
+          [](Px p, int) { return lumaRounded(p); },
           [](Px p, int) { return lumaWide(k601, p); },
           [](const std::vector<Px>& v) { return rounded420(sumOf(v)); },
-          [](const std::vector<Px>& v) { return wide420(k601, sumOf(v)); }, nullptr};
+          [](const std::vector<Px>& v) { return wide420(k601, sumOf(v)); },
+          nullptr};
 }
 
 Model lanes422Model(Dst d, bool bgr) {
-  return {Geo::S422, d, bgr, by32Then8, [](Px p, int) { return lumaLanes(k601, p); },
+  return {Geo::S422,
+          d,
+          bgr,
+          by32Then8,
+          [](Px p, int) { return lumaLanes(k601, p); },
           [](Px p, int) { return lumaWide(k601, p); },
           [](const std::vector<Px>& v) { return lanes422(k601, sumOf(v)); },
           [](const std::vector<Px>& v) { return wide422(k601, sumOf(v)); },
-          [](Px p) { return wideSingle(k601, p); }, d != Dst::P3};
+          [](Px p) { return wideSingle(k601, p); },
+          d != Dst::P3};
 }
 
 Model exactPairModel(Dst d) {
-  return {Geo::S422, d, false, [](int w) { return w & ~7; }, [](Px p, int) { return lumaExactLow(p); },
+  return {Geo::S422,
+          d,
+          false,
+          [](int w) { return w & ~7; },
+          [](Px p, int) { return lumaExactLow(p); },
           [](Px p, int k) { return lumaWide(k601, p, k ? 1048576 : 1081344); },
           [](const std::vector<Px>& v) { return exact422(sumOf(v)); },
-          [](const std::vector<Px>& v) { return exact422(sumOf(v)); }, [](Px p) { return wideSingle(k601, p); }};
+          [](const std::vector<Px>& v) { return exact422(sumOf(v)); },
+          [](Px p) { return wideSingle(k601, p); }};
 }
 
 Model cbycrModel(const Set& s, std::function<int(int)> n) {
-  return {Geo::S422, Dst::C2CbYCr, true, n, [&s](Px p, int) { return lumaLanes(s, p); },
+  return {Geo::S422,
+          Dst::C2CbYCr,
+          true,
+          n,
+          [&s](Px p, int) { return lumaLanes(s, p); },
           [&s](Px p, int) { return lumaWide(s, p); },
           [&s](const std::vector<Px>& v) { return s.narrow ? lanes422(s, sumOf(v)) : signed422(sumOf(v)); },
           [&s](const std::vector<Px>& v) { return wide(s, sumOf(v), 16842752, 16842750, 17); },
@@ -230,25 +251,47 @@ Model cbycrModel(const Set& s, std::function<int(int)> n) {
 }
 
 Model model411(bool lanes) {
-  return {Geo::S411, Dst::P3, true, [lanes](int w) { return lanes ? w & ~31 : w & ~15; },
+  return {Geo::S411,
+          Dst::P3,
+          true,
+          [lanes](int w) { return lanes ? w & ~31 : w & ~15; },
           [lanes](Px p, int) { return lanes ? lumaLanes(k601, p) : lumaRounded411(p); },
           [](Px p, int) { return lumaWide(k601, p); },
           [lanes](const std::vector<Px>& v) { return lanes ? lanes420(k601, sumOf(v)) : rounded411(sumOf(v)); },
-          [](const std::vector<Px>& v) { return wide420(k601, sumOf(v)); }, nullptr};
+          [](const std::vector<Px>& v) { return wide420(k601, sumOf(v)); },
+          nullptr};
 }
 
 Model yuv420Model(bool bgr, std::function<int(int)> n) {
-  return {Geo::S420, Dst::P3, bgr, n, [](Px p, int) { return sat8(yuvP(p) >> 1); },
-          [](Px p, int) { return yuvT(p) >> 16; }, difference420,
-          [](const std::vector<Px>& v) { return wideDifference(v, 131071, 18); }, nullptr};
+  return {Geo::S420,
+          Dst::P3,
+          bgr,
+          n,
+          [](Px p, int) { return sat8(yuvP(p) >> 1); },
+          [](Px p, int) { return yuvT(p) >> 16; },
+          difference420,
+          [](const std::vector<Px>& v) { return wideDifference(v, 131071, 18); },
+          nullptr};
 }
 Model yuv420RoundedModel() {
-  return {Geo::S420, Dst::P3, false, byHalf, [](Px p, int) { return sat8(yuvQ(p) >> 6); },
-          [](Px p, int) { return yuvT14(p) >> 14; }, roundedDifference420, wide14Difference, nullptr};
+  return {Geo::S420,
+          Dst::P3,
+          false,
+          byHalf,
+          [](Px p, int) { return sat8(yuvQ(p) >> 6); },
+          [](Px p, int) { return yuvT14(p) >> 14; },
+          roundedDifference420,
+          wide14Difference,
+          nullptr};
 }
 Model yuv422Model(bool interleaved, bool oneRow) {
-  Model m{Geo::S422, Dst::P3, false, [](int w) { return w & ~15; }, [](Px p, int) { return sat8(yuvP(p) >> 1); },
-          [](Px p, int) { return yuvT(p) >> 16; }, difference422,
+  Model m{Geo::S422,
+          Dst::P3,
+          false,
+          [](int w) { return w & ~15; },
+          [](Px p, int) { return sat8(yuvP(p) >> 1); },
+          [](Px p, int) { return yuvT(p) >> 16; },
+          difference422,
           [](const std::vector<Px>& v) { return wideDifference(v, 65535, 17); },
           [interleaved](Px p) { return odd15(p, interleaved); }};
   m.oddLuma = [](Px p) { return yuvT15(p) >> 15; };
@@ -258,16 +301,29 @@ Model yuv422Model(bool interleaved, bool oneRow) {
 // The pair stream: rounded luma, and the rounded difference form of the
 // full-resolution family (Y and U) for a last odd pixel.
 Model yuv422PairsModel() {
-  return {Geo::S422, Dst::C2YCbCr, false, [](int w) { return w & ~15; }, [](Px p, int) { return sat8(yuvP(p) >> 1); },
-          [](Px p, int) { return (yuvT(p) + 32768) >> 16; }, difference422,
+  return {Geo::S422,
+          Dst::C2YCbCr,
+          false,
+          [](int w) { return w & ~15; },
+          [](Px p, int) { return sat8(yuvP(p) >> 1); },
+          [](Px p, int) { return (yuvT(p) + 32768) >> 16; },
+          difference422,
           [](const std::vector<Px>& v) { return wideDifference(v, 32768, 17); },
-          [](Px p) { return CC{((((p.b << 16) - yuvT(p) + 32768) >> 16) * 32244 >> 16) + 128 & 255, 0}; }};
+          [](Px p) {
+            return CC{((((p.b << 16) - yuvT(p) + 32768) >> 16) * 32244 >> 16) + 128 & 255, 0};
+          }};
 }
 
 // The second kernel of the interleaved member, for aligned buffers.
 Model yuv422AlignedModel() {
-  Model m{Geo::S422, Dst::P3, false, [](int w) { return w & ~15; }, [](Px p, int) { return sat8(yuvQ(p) >> 6); },
-          [](Px p, int) { return sat8(splitLuma(p) >> 1); }, roundedDifference422, splitPair,
+  Model m{Geo::S422,
+          Dst::P3,
+          false,
+          [](int w) { return w & ~15; },
+          [](Px p, int) { return sat8(yuvQ(p) >> 6); },
+          [](Px p, int) { return sat8(splitLuma(p) >> 1); },
+          roundedDifference422,
+          splitPair,
           [](Px p) { return odd15(p, true); }};
   m.oddLuma = [](Px p) { return yuvT15(p) >> 15; };
   return m;
@@ -369,7 +425,8 @@ std::vector<std::vector<uint8_t>> expected(Workspace& w, const Model& m) {
         put(1, 2 * i, row, c.c1);
         put(1, 2 * i + 1, row, c.c2);
         break;
-      default: break;
+      default:
+        break;
     }
   };
   if (m.geo == Geo::S420) {
@@ -442,13 +499,26 @@ std::vector<std::vector<uint8_t>> expected(Workspace& w, const Model& m) {
     const int first = int(total) & ~7, half = width / 2;
     for (int start : {0, first}) {
       const int count = start == 0 ? first : int(total) - first;
-      row(count, [&](int i) { return At{(start + i) % width, (start + i) / width}; },
-          [&](int j) { return At{(start / 2 + j) % half, (start / 2 + j) / half}; });
+      row(
+          count,
+          [&](int i) {
+            return At{(start + i) % width, (start + i) / width};
+          },
+          [&](int j) {
+            return At{(start / 2 + j) % half, (start / 2 + j) / half};
+          });
     }
     return out;
   }
   for (int y = 0; y < height; ++y)
-    row(width, [y](int i) { return At{i, y}; }, [y](int j) { return At{j, y}; });
+    row(
+        width,
+        [y](int i) {
+          return At{i, y};
+        },
+        [y](int j) {
+          return At{j, y};
+        });
   return out;
 }
 
@@ -456,7 +526,7 @@ Status expectedStatus(const Descriptor& d, ImageSize s) {
   if (s.width < d.minWidth || s.height < d.minHeight) return StatusSizeError;
   if (!d.warnsOdd) return StatusOk;
   const std::string& n = d.name;
-  const bool odd = n.find("411") != std::string::npos ? (s.width & 3) != 0
+  const bool odd = n.find("411") != std::string::npos   ? (s.width & 3) != 0
                    : n.find("420") != std::string::npos ? ((s.width | s.height) & 1) != 0
                                                         : (s.width & 1) != 0;
   return odd ? StatusOddSizeWarning : StatusOk;
