@@ -56,56 +56,52 @@ using zel::lc::wide601a;
 
 // ---- luma plane and chroma pairs ----
 
-ZEL_PUBLIC Status zeliYCbCr420ToRGB_8u_P2C3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr,
-                                             int srcCbCrStep, uint8_t* dst, int dstStep, ImageSize size) {
+ZEL_PUBLIC Status zeliYCbCr420ToRGB_8u_P2C3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep,
+                                             uint8_t* dst, int dstStep, ImageSize size) {
   if (const Status s = pairArguments(srcY, srcCbCr, dst, size)) return s;
   return pairPlane420<false>(srcY, srcYStep, srcCbCr, srcCbCrStep, packedRows3<false>(dst, dstStep), size);
 }
 
-ZEL_PUBLIC Status zeliYCbCr420ToRGB_8u_P2C4R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr,
-                                             int srcCbCrStep, uint8_t* dst, int dstStep, ImageSize size,
-                                             uint8_t alpha) {
+ZEL_PUBLIC Status zeliYCbCr420ToRGB_8u_P2C4R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep,
+                                             uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha) {
   if (const Status s = pairArguments(srcY, srcCbCr, dst, size)) return s;
   return pairPlane420<false>(srcY, srcYStep, srcCbCr, srcCbCrStep, packedRows4<false>(dst, dstStep, alpha), size);
 }
 
-ZEL_PUBLIC Status zeliYCbCr420ToBGR_8u_P2C3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr,
-                                             int srcCbCrStep, uint8_t* dst, int dstStep, ImageSize size) {
+ZEL_PUBLIC Status zeliYCbCr420ToBGR_8u_P2C3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep,
+                                             uint8_t* dst, int dstStep, ImageSize size) {
   if (const Status s = pairArguments(srcY, srcCbCr, dst, size)) return s;
   return pairPlane420<false>(srcY, srcYStep, srcCbCr, srcCbCrStep, packedRows3<true>(dst, dstStep), size);
 }
 
-ZEL_PUBLIC Status zeliYCbCr420ToBGR_8u_P2C4R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr,
-                                             int srcCbCrStep, uint8_t* dst, int dstStep, ImageSize size,
-                                             uint8_t alpha) {
+ZEL_PUBLIC Status zeliYCbCr420ToBGR_8u_P2C4R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep,
+                                             uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha) {
   if (const Status s = pairArguments(srcY, srcCbCr, dst, size)) return s;
   return pairPlane420<false>(srcY, srcYStep, srcCbCr, srcCbCrStep, packedRows4<true>(dst, dstStep, alpha), size);
 }
 
-ZEL_PUBLIC Status zeliYCrCb420ToRGB_8u_P2C3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCrCb,
-                                             int srcCrCbStep, uint8_t* dst, int dstStep, ImageSize size) {
+ZEL_PUBLIC Status zeliYCrCb420ToRGB_8u_P2C3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCrCb, int srcCrCbStep,
+                                             uint8_t* dst, int dstStep, ImageSize size) {
   if (const Status s = pairArguments(srcY, srcCrCb, dst, size)) return s;
   return pairPlane420<true>(srcY, srcYStep, srcCrCb, srcCrCbStep, packedRows3<false>(dst, dstStep), size);
 }
 
 // These two test the size before the pointers.
-ZEL_PUBLIC Status zeliYCrCb420ToRGB_8u_P2C4R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCrCb,
-                                             int srcCrCbStep, uint8_t* dst, int dstStep, ImageSize size,
-                                             uint8_t alpha) {
+ZEL_PUBLIC Status zeliYCrCb420ToRGB_8u_P2C4R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCrCb, int srcCrCbStep,
+                                             uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha) {
   if (sizeBelow(size, 1, 1)) return StatusSizeError;
   if (!srcY || !srcCrCb || !dst) return StatusNullPointerError;
   return pairPlane420<true>(srcY, srcYStep, srcCrCb, srcCrCbStep, packedRows4<false>(dst, dstStep, alpha), size);
 }
 
-ZEL_PUBLIC Status zeliYCrCb420ToBGR_8u_P2C3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCrCb,
-                                             int srcCrCbStep, uint8_t* dst, int dstStep, ImageSize size) {
+ZEL_PUBLIC Status zeliYCrCb420ToBGR_8u_P2C3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCrCb, int srcCrCbStep,
+                                             uint8_t* dst, int dstStep, ImageSize size) {
   if (const Status s = pairArguments(srcY, srcCrCb, dst, size)) return s;
   return pairPlane420<true>(srcY, srcYStep, srcCrCb, srcCrCbStep, packedRows3<true>(dst, dstStep), size);
 }
 
-ZEL_PUBLIC Status zeliYCrCb420ToBGR_8u_P2C4R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCrCb,
-                                             int srcCrCbStep, uint8_t* dst, int dstStep, ImageSize size,
-                                             uint8_t alpha) {
+ZEL_PUBLIC Status zeliYCrCb420ToBGR_8u_P2C4R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCrCb, int srcCrCbStep,
+                                             uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha) {
   if (sizeBelow(size, 1, 1)) return StatusSizeError;
   if (!srcY || !srcCrCb || !dst) return StatusNullPointerError;
   return pairPlane420<true>(srcY, srcYStep, srcCrCb, srcCrCbStep, packedRows4<true>(dst, dstStep, alpha), size);
@@ -117,8 +113,8 @@ ZEL_PUBLIC Status zeliYCbCr420ToBGR_8u_P3C4R(const uint8_t* const srcPlanes[3], 
                                              int dstStep, ImageSize size, uint8_t alpha) {
   if (const Status s = planeArguments(srcPlanes, dst, size)) return s;
   const PairRawForm body{pairLanesA};
-  return planes420<false>(SubPlanes{srcPlanes, srcSteps}, size.width & ~1, packedRows4<true>(dst, dstStep, alpha),
-                          size, body, body);
+  return planes420<false>(SubPlanes{srcPlanes, srcSteps}, size.width & ~1, packedRows4<true>(dst, dstStep, alpha), size,
+                          body, body);
 }
 
 // Planes Y, Cr, Cb.
@@ -126,8 +122,8 @@ ZEL_PUBLIC Status zeliYCrCb420ToRGB_8u_P3C4R(const uint8_t* const srcPlanes[3], 
                                              int dstStep, ImageSize size, uint8_t alpha) {
   if (const Status s = planeArguments(srcPlanes, dst, size)) return s;
   const PairRawForm body{pairLanesA};
-  return planes420<true>(SubPlanes{srcPlanes, srcSteps}, size.width & ~1, packedRows4<false>(dst, dstStep, alpha),
-                         size, body, body);
+  return planes420<true>(SubPlanes{srcPlanes, srcSteps}, size.width & ~1, packedRows4<false>(dst, dstStep, alpha), size,
+                         body, body);
 }
 
 // Two kernels of different results: the centred pair lanes when every
@@ -147,21 +143,20 @@ ZEL_PUBLIC Status zeliYCbCr420ToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], 
 ZEL_PUBLIC Status zeliYCbCr420ToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst,
                                              int dstStep, ImageSize size) {
   if (const Status s = planeArguments(srcPlanes, dst, size)) return s;
-  return planes420<false>(SubPlanes{srcPlanes, srcSteps}, groupsOf8(size.width), packedRows3<false>(dst, dstStep),
-                          size, LanesForm{lanes601b}, WideTail{wide601a, 32768});
+  return planes420<false>(SubPlanes{srcPlanes, srcSteps}, groupsOf8(size.width), packedRows3<false>(dst, dstStep), size,
+                          LanesForm{lanes601b}, WideTail{wide601a, 32768});
 }
 
 ZEL_PUBLIC Status zeliYCbCr420ToBGR_709CSC_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3],
                                                     uint8_t* dst, int dstStep, ImageSize size) {
   if (const Status s = planeArguments(srcPlanes, dst, size)) return s;
-  return planes420<false>(SubPlanes{srcPlanes, srcSteps}, groupsOf8(size.width), packedRows3<true>(dst, dstStep),
-                          size, LanesForm{lanes709}, WideTail{wide709, 32768});
+  return planes420<false>(SubPlanes{srcPlanes, srcSteps}, groupsOf8(size.width), packedRows3<true>(dst, dstStep), size,
+                          LanesForm{lanes709}, WideTail{wide709, 32768});
 }
 
 ZEL_PUBLIC Status zeliYCbCr420ToBGR_709HDTV_8u_P3C4R(const uint8_t* const srcPlanes[3], const int srcSteps[3],
                                                      uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha) {
   if (const Status s = planeArguments(srcPlanes, dst, size)) return s;
-  return planes420<false>(SubPlanes{srcPlanes, srcSteps}, groupsOf8(size.width),
-                          packedRows4<true>(dst, dstStep, alpha), size, SixteenthsForm{lanesHDTV},
-                          WideTail{wideHDTV, 32768});
+  return planes420<false>(SubPlanes{srcPlanes, srcSteps}, groupsOf8(size.width), packedRows4<true>(dst, dstStep, alpha),
+                          size, SixteenthsForm{lanesHDTV}, WideTail{wideHDTV, 32768});
 }

@@ -15,8 +15,8 @@ template <PairOrder Order, class MakeOut, class Body, class Tail>
 void streamRows(const uint8_t* src, int srcStep, MakeOut out, ImageSize size, int bodyEnd, const Body& body,
                 const Tail& tail) {
   expandRows(
-      size.height, bodyEnd, size.width,
-      [=](int y) { return streamRow<Order>(rowAt(src, srcStep, y), out(y)); }, body, tail);
+      size.height, bodyEnd, size.width, [=](int y) { return streamRow<Order>(rowAt(src, srcStep, y), out(y)); }, body,
+      tail);
 }
 
 // Three planes, chroma subsampled by Spread, row by row.
@@ -25,7 +25,10 @@ void planarRows(const SubPlanes& src, MakeOut out, ImageSize size, int bodyEnd, 
   using Set = RowSet<1, LumaRow, ChromaPlanes<Spread>, decltype(out(0))>;
   expandRows(
       size.height, bodyEnd, size.width,
-      [=](int y) { return Set{{LumaRow{src.luma(y)}}, chromaPlanes<Spread>(src, y), {out(y)}}; }, body, tail);
+      [=](int y) {
+        return Set{{LumaRow{src.luma(y)}}, chromaPlanes<Spread>(src, y), {out(y)}};
+      },
+      body, tail);
 }
 
 Status streamArguments(const uint8_t* src, const void* dst, ImageSize size, int minWidth = 1) {
@@ -89,8 +92,8 @@ ZEL_PUBLIC Status zeliCbYCr422ToBGR_709HDTV_8u_C2C4R(const uint8_t* src, int src
   return StatusOk;
 }
 
-ZEL_PUBLIC Status zeliCbYCr422ToBGR_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
-                                             ImageSize size, uint8_t alpha) {
+ZEL_PUBLIC Status zeliCbYCr422ToBGR_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                             uint8_t alpha) {
   if (const Status s = streamArguments(src, dst, size)) return s;
   streamRows<PairOrder::CbYCr>(src, srcStep, packedRows4<true>(dst, dstStep, alpha), size, size.width & ~7,
                                LanesForm{lanes601b}, WideTail{wide601b, 32768});
@@ -112,7 +115,7 @@ ZEL_PUBLIC Status zeliYCbCr411ToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], 
                                              int dstStep, ImageSize size) {
   if (const Status s = planeArguments(srcPlanes, dst, size, 4)) return s;
   planarRows<4>(SubPlanes{srcPlanes, srcSteps}, packedRows3<true>(dst, dstStep), size, size.width & ~3,
-               LanesForm{lanes601a}, WideTail{wide411, 32768});
+                LanesForm{lanes601a}, WideTail{wide411, 32768});
   return StatusOk;
 }
 
@@ -120,7 +123,7 @@ ZEL_PUBLIC Status zeliYCbCr411ToBGR_8u_P3C4R(const uint8_t* const srcPlanes[3], 
                                              int dstStep, ImageSize size, uint8_t alpha) {
   if (const Status s = planeArguments(srcPlanes, dst, size, 4)) return s;
   planarRows<4>(SubPlanes{srcPlanes, srcSteps}, packedRows4<true>(dst, dstStep, alpha), size, size.width & ~3,
-               LanesForm{lanes601a}, WideTail{wide411, 32768});
+                LanesForm{lanes601a}, WideTail{wide411, 32768});
   return StatusOk;
 }
 
@@ -133,8 +136,8 @@ ZEL_PUBLIC Status zeliYCbCr422ToBGR_8u_C2C3R(const uint8_t* src, int srcStep, ui
   return StatusOk;
 }
 
-ZEL_PUBLIC Status zeliYCbCr422ToBGR_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
-                                             ImageSize size, uint8_t alpha) {
+ZEL_PUBLIC Status zeliYCbCr422ToBGR_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                             uint8_t alpha) {
   if (const Status s = streamArguments(src, dst, size, 2)) return s;
   lanesThenRaw<PairOrder::YCbCr>(src, srcStep, packedRows4<true>(dst, dstStep, alpha), size);
   return StatusOk;
@@ -144,7 +147,7 @@ ZEL_PUBLIC Status zeliYCbCr422ToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], 
                                              int dstStep, ImageSize size) {
   if (const Status s = planeArguments(srcPlanes, dst, size)) return s;
   planarRows<2>(SubPlanes{srcPlanes, srcSteps}, packedRows3<true>(dst, dstStep), size, size.width & ~7,
-               LanesForm{lanes601b}, RawTail{});
+                LanesForm{lanes601b}, RawTail{});
   return StatusOk;
 }
 
@@ -155,16 +158,16 @@ ZEL_PUBLIC Status zeliYCbCr422ToRGB_8u_C2C3R(const uint8_t* src, int srcStep, ui
   return StatusOk;
 }
 
-ZEL_PUBLIC Status zeliYCbCr422ToRGB_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3],
-                                             int dstStep, ImageSize size) {
+ZEL_PUBLIC Status zeliYCbCr422ToRGB_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
+                                             ImageSize size) {
   if (const Status s = streamArguments(src, dstPlanes, size)) return s;
   if (anyPlaneNull(dstPlanes)) return StatusNullPointerError;
   lanesEvenPart<PairOrder::YCbCr>(src, srcStep, planeOutRows(dstPlanes, dstStep), size);
   return StatusOk;
 }
 
-ZEL_PUBLIC Status zeliYCbCr422ToRGB_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
-                                             ImageSize size, uint8_t alpha) {
+ZEL_PUBLIC Status zeliYCbCr422ToRGB_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                             uint8_t alpha) {
   if (const Status s = streamArguments(src, dst, size)) return s;
   streamRows<PairOrder::YCbCr>(src, srcStep, packedRows4<false>(dst, dstStep, alpha), size, size.width & ~1,
                                PairRawForm{pairLanesB}, WideTail{wide601a, 32768});
@@ -195,8 +198,8 @@ ZEL_PUBLIC Status zeliYCrCb422ToRGB_8u_C2C3R(const uint8_t* src, int srcStep, ui
   return StatusOk;
 }
 
-ZEL_PUBLIC Status zeliYCrCb422ToRGB_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
-                                             ImageSize size, uint8_t alpha) {
+ZEL_PUBLIC Status zeliYCrCb422ToRGB_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                             uint8_t alpha) {
   if (const Status s = streamArguments(src, dst, size)) return s;
   pairsThenWide<PairOrder::YCrCb>(src, srcStep, packedRows4<false>(dst, dstStep, alpha), size);
   return StatusOk;
@@ -209,15 +212,15 @@ ZEL_PUBLIC Status zeliYCrCb422ToBGR_8u_C2C3R(const uint8_t* src, int srcStep, ui
   return StatusOk;
 }
 
-ZEL_PUBLIC Status zeliYCrCb422ToBGR_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
-                                             ImageSize size, uint8_t alpha) {
+ZEL_PUBLIC Status zeliYCrCb422ToBGR_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
+                                             uint8_t alpha) {
   if (const Status s = streamArguments(src, dst, size)) return s;
   pairsThenWide<PairOrder::YCrCb>(src, srcStep, packedRows4<true>(dst, dstStep, alpha), size);
   return StatusOk;
 }
 
-ZEL_PUBLIC Status zeliYCrCb422ToRGB_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3],
-                                             int dstStep, ImageSize size) {
+ZEL_PUBLIC Status zeliYCrCb422ToRGB_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep,
+                                             ImageSize size) {
   if (const Status s = streamArguments(src, dstPlanes, size)) return s;
   if (anyPlaneNull(dstPlanes)) return StatusNullPointerError;
   lanesEvenPart<PairOrder::YCrCb>(src, srcStep, planeOutRows(dstPlanes, dstStep), size);

@@ -56,15 +56,17 @@ inline auto packedRows4(uint8_t* dst, int step, uint8_t alpha) {
   return [=](int y) { return PackedOutAlpha<Reverse>{rowAt(dst, step, y), alpha}; };
 }
 inline auto planeOutRows(uint8_t* const planes[3], int step) {
-  return [=](int y) { return PlanesOut{rowAt(planes[0], step, y), rowAt(planes[1], step, y), rowAt(planes[2], step, y)}; };
+  return [=](int y) {
+    return PlanesOut{rowAt(planes[0], step, y), rowAt(planes[1], step, y), rowAt(planes[2], step, y)};
+  };
 }
 
 // The 4:2:0 row-pair loop: luma rows 2j and 2j + 1 with chroma row j, for
 // height / 2 pairs; a last odd row and column are not written. The makers
 // give the views of a luma row, a chroma row and a destination row.
 template <class MakeLuma, class MakeChroma, class MakeOut, class Body, class Tail>
-inline Status expandPairs(ImageSize size, int bodyEnd, MakeLuma luma, MakeChroma chroma, MakeOut out,
-                          const Body& body, const Tail& tail) {
+inline Status expandPairs(ImageSize size, int bodyEnd, MakeLuma luma, MakeChroma chroma, MakeOut out, const Body& body,
+                          const Tail& tail) {
   const int end = size.width & ~1;
   const bool avx2 = hasAvx2();
   using Set = RowSet<2, LumaRow, decltype(chroma(0)), decltype(out(0))>;

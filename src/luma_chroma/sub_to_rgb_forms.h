@@ -80,9 +80,9 @@ inline Rgb8 lumaSixteenths(const SixteenthsSet& s, int Y, int U, int V) {
   const int16_t y4 = static_cast<int16_t>(Y << 4);
   const int u = U - 128, v = V - 128;
   const int16_t r = AddSaturateS16(AddSaturateS16(y4, termL(v, s.vToR)), 8);
-  const int16_t g = AddSaturateS16(
-      AddSaturateS16(AddSaturateS16(y4, static_cast<int16_t>(-termL(v, s.vToG))), static_cast<int16_t>(-termL(u, s.uToG))),
-      8);
+  const int16_t g = AddSaturateS16(AddSaturateS16(AddSaturateS16(y4, static_cast<int16_t>(-termL(v, s.vToG))),
+                                                  static_cast<int16_t>(-termL(u, s.uToG))),
+                                   8);
   const int16_t b = AddSaturateS16(AddSaturateS16(y4, termL(u, s.uToB)), 8);
   return {SaturateU8(r >> 4), SaturateU8(g >> 4), SaturateU8(b >> 4)};
 }

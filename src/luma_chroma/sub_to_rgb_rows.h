@@ -199,8 +199,8 @@ inline int expandBlocks(const RowSet<Rows, Luma, Chroma, Out>& rows, int x, int 
       const Wide16<U> y = rows.luma[r].template lumaBlock<U>(x);
       const Trio<U> lo = form.template combine<U>(y.lo, t.lo);
       const Trio<U> hi = form.template combine<U>(y.hi, t.hi);
-      rows.out[r].template block<U>(
-          x, Trio<U>{U::packU8(lo.c0, hi.c0), U::packU8(lo.c1, hi.c1), U::packU8(lo.c2, hi.c2)});
+      rows.out[r].template block<U>(x,
+                                    Trio<U>{U::packU8(lo.c0, hi.c0), U::packU8(lo.c1, hi.c1), U::packU8(lo.c2, hi.c2)});
     }
   }
   return x;

@@ -27,7 +27,10 @@ void planes422(const SubPlanes& src, MakeOut out, ImageSize size, int bodyEnd, c
   using Set = RowSet<1, LumaRow, ChromaPlanes<2>, decltype(out(0))>;
   expandRows(
       size.height, bodyEnd, size.width,
-      [=](int y) { return Set{{LumaRow{src.luma(y)}}, chromaPlanes<2>(src, y), {out(y)}}; }, body, tail);
+      [=](int y) {
+        return Set{{LumaRow{src.luma(y)}}, chromaPlanes<2>(src, y), {out(y)}};
+      },
+      body, tail);
 }
 
 // The lane shape of the second YUV set up to width AND NOT 15, the
@@ -49,8 +52,9 @@ void planes422Packed(const uint8_t* const srcPlanes[3], ImageSize size, Out (*ou
   }
   const int chroma = (size.width >> 1) + (size.width & 1);
   const int steps[3] = {size.width, chroma, chroma};
-  planes422(SubPlanes{srcPlanes, steps}, [=](int y) { return outRow(dst, size.width, y); }, size, size.width & ~15,
-            kHalves2, kWideTruncated);
+  planes422(
+      SubPlanes{srcPlanes, steps}, [=](int y) { return outRow(dst, size.width, y); }, size, size.width & ~15, kHalves2,
+      kWideTruncated);
 }
 
 PackedOut3<false> packedOutRow(uint8_t* const* dst, int width, int y) { return {dst[0] + 3 * size_t(width) * y}; }
@@ -120,8 +124,7 @@ ZEL_PUBLIC Status zeliYUV420ToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], co
                                            int dstStep, ImageSize size) {
   if (const Status s = planeArguments(srcPlanes, dst, size, 2)) return s;
   const YuvHalvesForm body{rgbLanes1Set};
-  return planes420(SubPlanes{srcPlanes, srcSteps}, size.width & ~1, packedRows3<true>(dst, dstStep), size, body,
-                   body);
+  return planes420(SubPlanes{srcPlanes, srcSteps}, size.width & ~1, packedRows3<true>(dst, dstStep), size, body, body);
 }
 
 // Blocks of 4 chroma pairs and then 2; a remaining pair takes the rounded
@@ -136,8 +139,7 @@ ZEL_PUBLIC Status zeliYUV420ToRGB_8u_P3AC4R(const uint8_t* const srcPlanes[3], c
 
 // ---- 4:2:2 ----
 
-ZEL_PUBLIC Status zeliYUV422ToRGB_8u_C2C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
-                                           ImageSize size) {
+ZEL_PUBLIC Status zeliYUV422ToRGB_8u_C2C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
   if (!src || !dst) return StatusNullPointerError;
   if (sizeBelow(size, 1, 1)) return StatusSizeError;
   const auto out = packedRows3<false>(dst, dstStep);

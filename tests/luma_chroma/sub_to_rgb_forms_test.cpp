@@ -16,73 +16,65 @@ using namespace zel::lc::expand;
 
 std::string str(Rgb8 p) { return std::to_string(p.r) + "," + std::to_string(p.g) + "," + std::to_string(p.b); }
 
-struct Worked {
-  int y, u, v;
-  Rgb8 want;
-};
-
-void expectWorked(const char* form, Rgb8 (*f)(int, int, int), std::initializer_list<Worked> cases) {
-  for (const Worked& c : cases)
-    EXPECT_EQ(str(f(c.y, c.u, c.v)), str(c.want)) << form << " at " << c.y << "," << c.u << "," << c.v;
-}
-
-TEST(SubsampledForms, PairLanesCentredAndRawPartWhereTheirOffsetsDo) {
-  // y = 219: L(219, 4769) = 2039; 2039 >> 3 = 254 in the centred form. The
-  // raw form takes L(235, 4769) = 2188 less the set's offsets.
-  expectWorked("centred A", [](int y, int u, int v) { return pairLanesCentred(pairLanesA, y, u, v); },
-               {{235, 128, 128, {254, 254, 254}}, {16, 128, 128, {0, 0, 0}}, {44, 205, 246, {220, 0, 187}}});
-  expectWorked("raw A", [](int y, int u, int v) { return pairLanesRaw(pairLanesA, y, u, v); },
-               {{235, 128, 128, {255, 255, 255}}, {128, 128, 128, {130, 131, 130}}, {145, 54, 34, {0, 255, 1}}});
-  expectWorked("raw B", [](int y, int u, int v) { return pairLanesRaw(pairLanesB, y, u, v); },
-               {{235, 128, 128, {254, 255, 254}}, {128, 128, 128, {130, 130, 130}}, {84, 111, 30, {0, 165, 44}}});
-}
-
-TEST(SubsampledForms, LaneFormsAgainstTheirWideTails) {
-  auto lanesB = [](int y, int u, int v) { return laneAdded(lanes601b, y, u, v, 8); };
-  auto lanes7 = [](int y, int u, int v) { return laneAdded(lanes709, y, u, v, 8); };
-  expectWorked("lanes 601b", lanesB, {{235, 128, 128, {255, 255, 255}}, {44, 205, 246, {221, 0, 188}}});
-  expectWorked("lanes 709", lanes7, {{219, 86, 135, {249, 241, 147}}, {81, 90, 240, {255, 24, 0}}});
-  expectWorked("wide 709", [](int y, int u, int v) { return wideRounded(wide709, y, u, v); },
-               {{219, 86, 135, {249, 242, 147}}});
-  expectWorked("wide 601a", [](int y, int u, int v) { return wideRounded(wide601a, y, u, v); },
-               {{84, 111, 30, {0, 165, 45}}, {90, 29, 131, {91, 123, 0}}});
-}
-
-TEST(SubsampledForms, FourOneOneTailCarriesItsOwnConstants) {
-  // 76294 Y and -25625 u: (76294 * 90 - 25625 * -99 - 53281 * 3 - 1187936) >> 16 = 122, where
-  // the 601 constants give 123.
-  expectWorked("wide 411", [](int y, int u, int v) { return wideRounded(wide411, y, u, v); },
-               {{90, 29, 131, {91, 122, 0}}, {176, 181, 128, {186, 166, 255}}, {76, 30, 215, {209, 37, 0}}});
-}
-
-TEST(SubsampledForms, RawWideOffsetsLieShortOfTheCentringConstants) {
-  // R of (160, 252, 132): (76284 * 160 + 104595 * 132 - 14608761) >> 16 = 173; the exact offset gives 174.
-  expectWorked("raw", wideRaw,
-               {{160, 252, 132, {173, 115, 255}}, {135, 109, 107, {104, 163, 100}}, {235, 128, 128, {254, 254, 254}}});
-  expectWorked("wide 601a truncated", [](int y, int u, int v) { return wideTruncated(wide601a, y, u, v); },
-               {{160, 252, 132, {174, 115, 255}}, {135, 109, 107, {105, 163, 100}}});
-}
-
-TEST(SubsampledForms, HdtvFormsKeepTheLumaBias) {
-  const auto hdtv = [](int y, int u, int v) { return lumaSixteenths(lanesHDTV, y, u, v); };
-  const auto wide = [](int y, int u, int v) { return wideRounded(wideHDTV, y, u, v); };
-  // Black only for Y = 0: a neutral Y of 16 stays 16.
-  expectWorked("hdtv lanes", hdtv,
-               {{0, 128, 128, {0, 0, 0}}, {16, 128, 128, {16, 16, 16}}, {195, 158, 176, {255, 168, 249}}});
-  expectWorked("hdtv wide", wide,
-               {{0, 128, 128, {0, 0, 0}}, {16, 128, 128, {16, 16, 16}}, {195, 158, 176, {255, 167, 249}}});
-}
-
-TEST(SubsampledForms, YuvLaneShapesAndSets) {
-  expectWorked("halves, second set", [](int y, int u, int v) { return YuvHalvesForm{rgbLanes2Set}.pixel(y, u, v); },
-               {{8, 161, 12, {0, 62, 75}}, {81, 90, 240, {208, 30, 3}}});
-  expectWorked("halves, first set", [](int y, int u, int v) { return YuvHalvesForm{rgbLanes1Set}.pixel(y, u, v); },
-               {{8, 161, 12, {0, 61, 75}}, {91, 161, 0, {0, 151, 158}}});
-  expectWorked("quad lanes", [](int y, int u, int v) { return lumaSixteenths(lanesYuvQuad, y, u, v); },
-               {{212, 44, 124, {207, 248, 41}}, {128, 128, 128, {128, 128, 128}}});
-  expectWorked("wide A rounded",
-               [](int y, int u, int v) { return YuvWideForm{rgbWideA, {32768, 32768, 32768}}.pixel(y, u, v); },
-               {{212, 44, 124, {207, 247, 41}}});
+// Values worked out by hand from the formulas, chosen where two forms that
+// could stand for one another part in the last bit.
+TEST(SubsampledForms, WorkedValues) {
+  using F = Rgb8 (*)(int, int, int);
+  struct Case {
+    const char* form;
+    F f;
+    int y, u, v;
+    Rgb8 want;
+  };
+  const F centredA = [](int y, int u, int v) { return pairLanesCentred(pairLanesA, y, u, v); };
+  const F rawA = [](int y, int u, int v) { return pairLanesRaw(pairLanesA, y, u, v); };
+  const F rawB = [](int y, int u, int v) { return pairLanesRaw(pairLanesB, y, u, v); };
+  const F lanesB = [](int y, int u, int v) { return laneAdded(lanes601b, y, u, v, 8); };
+  const F lanes7 = [](int y, int u, int v) { return laneAdded(lanes709, y, u, v, 8); };
+  const F wide7 = [](int y, int u, int v) { return wideRounded(wide709, y, u, v); };
+  const F wideA = [](int y, int u, int v) { return wideRounded(wide601a, y, u, v); };
+  const F wideATruncated = [](int y, int u, int v) { return wideTruncated(wide601a, y, u, v); };
+  const F wide411r = [](int y, int u, int v) { return wideRounded(wide411, y, u, v); };
+  const F hdtv = [](int y, int u, int v) { return lumaSixteenths(lanesHDTV, y, u, v); };
+  const F hdtvWide = [](int y, int u, int v) { return wideRounded(wideHDTV, y, u, v); };
+  const F quad = [](int y, int u, int v) { return lumaSixteenths(lanesYuvQuad, y, u, v); };
+  const F halves2 = [](int y, int u, int v) { return YuvHalvesForm{rgbLanes2Set}.pixel(y, u, v); };
+  const F halves1 = [](int y, int u, int v) { return YuvHalvesForm{rgbLanes1Set}.pixel(y, u, v); };
+  const F yuvWide = [](int y, int u, int v) { return YuvWideForm{rgbWideA, {32768, 32768, 32768}}.pixel(y, u, v); };
+  const Case cases[] = {
+      // L(219, 4769) = 2039 and 2039 >> 3 = 254; the lane form reaches 255.
+      {"centred A", centredA, 235, 128, 128, {254, 254, 254}},
+      {"lanes 601b", lanesB, 235, 128, 128, {255, 255, 255}},
+      {"centred A", centredA, 44, 205, 246, {220, 0, 187}},
+      {"lanes 601b", lanesB, 44, 205, 246, {221, 0, 188}},
+      // The raw form's offsets: set A rounds green up where set B does not.
+      {"raw A", rawA, 128, 128, 128, {130, 131, 130}},
+      {"raw B", rawB, 128, 128, 128, {130, 130, 130}},
+      {"raw B", rawB, 235, 128, 128, {254, 255, 254}},
+      {"raw B", rawB, 84, 111, 30, {0, 165, 44}},
+      {"wide 601a", wideA, 84, 111, 30, {0, 165, 45}},
+      {"lanes 709", lanes7, 219, 86, 135, {249, 241, 147}},
+      {"wide 709", wide7, 219, 86, 135, {249, 242, 147}},
+      // (76294 * 90 - 25625 * -99 - 53281 * 3 - 1187936) >> 16 = 122; the 601 constants give 123.
+      {"wide 411", wide411r, 90, 29, 131, {91, 122, 0}},
+      {"wide 601a", wideA, 90, 29, 131, {91, 123, 0}},
+      // (76284 * 160 + 104595 * 132 - 14608761) >> 16 = 173; the exact offset gives 174.
+      {"raw", wideRaw, 160, 252, 132, {173, 115, 255}},
+      {"wide 601a truncated", wideATruncated, 160, 252, 132, {174, 115, 255}},
+      {"raw", wideRaw, 235, 128, 128, {254, 254, 254}},
+      // The HDTV forms keep the luma bias: black only for Y = 0.
+      {"hdtv", hdtv, 0, 128, 128, {0, 0, 0}},
+      {"hdtv", hdtv, 16, 128, 128, {16, 16, 16}},
+      {"hdtv wide", hdtvWide, 16, 128, 128, {16, 16, 16}},
+      {"hdtv", hdtv, 195, 158, 176, {255, 168, 249}},
+      {"hdtv wide", hdtvWide, 195, 158, 176, {255, 167, 249}},
+      {"halves, second set", halves2, 8, 161, 12, {0, 62, 75}},
+      {"halves, first set", halves1, 8, 161, 12, {0, 61, 75}},
+      {"quad lanes", quad, 212, 44, 124, {207, 248, 41}},
+      {"yuv wide rounded", yuvWide, 212, 44, 124, {207, 247, 41}},
+  };
+  for (const Case& c : cases)
+    EXPECT_EQ(str(c.f(c.y, c.u, c.v)), str(c.want)) << c.form << " at " << c.y << "," << c.u << "," << c.v;
 }
 
 // ---- vector forms against scalar forms ----

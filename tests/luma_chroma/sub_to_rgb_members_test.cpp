@@ -6,7 +6,6 @@
 
 #include <algorithm>
 #include <functional>
-#include <stdexcept>
 #include <string>
 #include <vector>
 
@@ -69,15 +68,15 @@ struct Call {
 
 struct Member {
   const char* name;
+  std::function<Status(const Call&)> run;
   SrcLayout src;
   DstLayout dst;
   Form body;
   int (*bodyEnd)(int width);
   Form tail;
-  std::function<Status(const Call&)> run;
   int minWidth = 1, minHeight = 1;
-  bool implied = false;    // a name without steps
-  bool wholeRow = false;   // ... that takes a large even-width image as one row
+  bool implied = false;        // a name without steps
+  bool wholeRow = false;       // ... that takes a large even-width image as one row
   Form alignedBody = nullptr;  // the body when every pointer and step is a multiple of 16
 };
 
@@ -121,119 +120,82 @@ int none(int) { return 0; }
 #define RUN_P3A(f) [](const Call& c) { return f(c.src, c.srcSteps, c.dst[0], c.dstStep, c.size, kAlpha); }
 #define RUN_P2(f) \
   [](const Call& c) { return f(c.src[0], c.srcSteps[0], c.src[1], c.srcSteps[1], c.dst[0], c.dstStep, c.size); }
-#define RUN_P2A(f)                                                                                 \
-  [](const Call& c) {                                                                              \
-    return f(c.src[0], c.srcSteps[0], c.src[1], c.srcSteps[1], c.dst[0], c.dstStep, c.size, kAlpha); \
-  }
+#define RUN_P2A(f) \
+  [](const Call& c) { return f(c.src[0], c.srcSteps[0], c.src[1], c.srcSteps[1], c.dst[0], c.dstStep, c.size, kAlpha); }
 #define RUN_C2(f) [](const Call& c) { return f(c.src[0], c.srcSteps[0], c.dst[0], c.dstStep, c.size); }
 #define RUN_C2A(f) [](const Call& c) { return f(c.src[0], c.srcSteps[0], c.dst[0], c.dstStep, c.size, kAlpha); }
 #define RUN_C2P3(f) [](const Call& c) { return f(c.src[0], c.srcSteps[0], c.dst, c.dstStep, c.size); }
 #define RUN_P3P3(f) [](const Call& c) { return f(c.src, c.srcSteps, c.dst, c.dstStep, c.size); }
+#define RUN_P3C3_(f) [](const Call& c) { return f(c.src, c.dst[0], c.size); }
+#define RUN_P3P3_(f) [](const Call& c) { return f(c.src, c.dst, c.size); }
+#define M(f, how, ...) \
+  { #f, RUN_##how(f), __VA_ARGS__ }
 
 const std::vector<Member>& members() {
   static const std::vector<Member> all = {
       // 4:2:0, luma and chroma pairs
-      {"zeliYCbCr420ToRGB_8u_P2C3R", kPairs, kRgb, pairRawA, evenPart, pairRawA, RUN_P2(zeliYCbCr420ToRGB_8u_P2C3R)},
-      {"zeliYCbCr420ToRGB_8u_P2C4R", kPairs, kRgba, pairRawA, evenPart, pairRawA, RUN_P2A(zeliYCbCr420ToRGB_8u_P2C4R)},
-      {"zeliYCbCr420ToBGR_8u_P2C3R", kPairs, kBgr, pairRawA, evenPart, pairRawA, RUN_P2(zeliYCbCr420ToBGR_8u_P2C3R)},
-      {"zeliYCbCr420ToBGR_8u_P2C4R", kPairs, kBgra, pairRawA, evenPart, pairRawA, RUN_P2A(zeliYCbCr420ToBGR_8u_P2C4R)},
-      {"zeliYCrCb420ToRGB_8u_P2C3R", kPairsCr, kRgb, pairRawA, evenPart, pairRawA, RUN_P2(zeliYCrCb420ToRGB_8u_P2C3R)},
-      {"zeliYCrCb420ToRGB_8u_P2C4R", kPairsCr, kRgba, pairRawA, evenPart, pairRawA,
-       RUN_P2A(zeliYCrCb420ToRGB_8u_P2C4R)},
-      {"zeliYCrCb420ToBGR_8u_P2C3R", kPairsCr, kBgr, pairRawA, evenPart, pairRawA, RUN_P2(zeliYCrCb420ToBGR_8u_P2C3R)},
-      {"zeliYCrCb420ToBGR_8u_P2C4R", kPairsCr, kBgra, pairRawA, evenPart, pairRawA,
-       RUN_P2A(zeliYCrCb420ToBGR_8u_P2C4R)},
+      M(zeliYCbCr420ToRGB_8u_P2C3R, P2, kPairs, kRgb, pairRawA, evenPart, pairRawA),
+      M(zeliYCbCr420ToRGB_8u_P2C4R, P2A, kPairs, kRgba, pairRawA, evenPart, pairRawA),
+      M(zeliYCbCr420ToBGR_8u_P2C3R, P2, kPairs, kBgr, pairRawA, evenPart, pairRawA),
+      M(zeliYCbCr420ToBGR_8u_P2C4R, P2A, kPairs, kBgra, pairRawA, evenPart, pairRawA),
+      M(zeliYCrCb420ToRGB_8u_P2C3R, P2, kPairsCr, kRgb, pairRawA, evenPart, pairRawA),
+      M(zeliYCrCb420ToRGB_8u_P2C4R, P2A, kPairsCr, kRgba, pairRawA, evenPart, pairRawA),
+      M(zeliYCrCb420ToBGR_8u_P2C3R, P2, kPairsCr, kBgr, pairRawA, evenPart, pairRawA),
+      M(zeliYCrCb420ToBGR_8u_P2C4R, P2A, kPairsCr, kBgra, pairRawA, evenPart, pairRawA),
       // 4:2:0 planes
-      {"zeliYCbCr420ToBGR_8u_P3C4R", kPlanes420, kBgra, pairRawA, evenPart, pairRawA,
-       RUN_P3A(zeliYCbCr420ToBGR_8u_P3C4R)},
-      {"zeliYCrCb420ToRGB_8u_P3C4R", kPlanes420Cr, kRgba, pairRawA, evenPart, pairRawA,
-       RUN_P3A(zeliYCrCb420ToRGB_8u_P3C4R)},
-      {"zeliYCbCr420ToBGR_8u_P3C3R", kPlanes420, kBgr, lanes601b_, halfGroupsOf4, wide601aRounded,
-       RUN_P3(zeliYCbCr420ToBGR_8u_P3C3R), 1, 1, false, false, pairCentredA},
-      {"zeliYCbCr420ToRGB_8u_P3C3R", kPlanes420, kRgb, lanes601b_, halfGroupsOf4, wide601aRounded,
-       RUN_P3(zeliYCbCr420ToRGB_8u_P3C3R)},
-      {"zeliYCbCr420ToBGR_709CSC_8u_P3C3R", kPlanes420, kBgr, lanes709_, halfGroupsOf4, wide709Rounded,
-       RUN_P3(zeliYCbCr420ToBGR_709CSC_8u_P3C3R)},
-      {"zeliYCbCr420ToBGR_709HDTV_8u_P3C4R", kPlanes420, kBgra, hdtv, halfGroupsOf4, wideHdtvRounded,
-       RUN_P3A(zeliYCbCr420ToBGR_709HDTV_8u_P3C4R)},
+      M(zeliYCbCr420ToBGR_8u_P3C4R, P3A, kPlanes420, kBgra, pairRawA, evenPart, pairRawA),
+      M(zeliYCrCb420ToRGB_8u_P3C4R, P3A, kPlanes420Cr, kRgba, pairRawA, evenPart, pairRawA),
+      M(zeliYCbCr420ToBGR_8u_P3C3R, P3, kPlanes420, kBgr, lanes601b_, halfGroupsOf4, wide601aRounded, 1, 1, false,
+        false, pairCentredA),
+      M(zeliYCbCr420ToRGB_8u_P3C3R, P3, kPlanes420, kRgb, lanes601b_, halfGroupsOf4, wide601aRounded),
+      M(zeliYCbCr420ToBGR_709CSC_8u_P3C3R, P3, kPlanes420, kBgr, lanes709_, halfGroupsOf4, wide709Rounded),
+      M(zeliYCbCr420ToBGR_709HDTV_8u_P3C4R, P3A, kPlanes420, kBgra, hdtv, halfGroupsOf4, wideHdtvRounded),
       // Cb Y0 Cr Y1 streams
-      {"zeliCbYCr422ToBGR_709HDTV_8u_C2C3R", kStreamCbYCr, kBgr, hdtv, andNot7, wideHdtvRounded,
-       RUN_C2(zeliCbYCr422ToBGR_709HDTV_8u_C2C3R)},
-      {"zeliCbYCr422ToBGR_709HDTV_8u_C2C4R", kStreamCbYCr, kBgra, hdtv, andNot7, wideHdtvRounded,
-       RUN_C2A(zeliCbYCr422ToBGR_709HDTV_8u_C2C4R)},
-      {"zeliCbYCr422ToBGR_8u_C2C4R", kStreamCbYCr, kBgra, lanes601b_, andNot7, wide601bRounded,
-       RUN_C2A(zeliCbYCr422ToBGR_8u_C2C4R)},
-      {"zeliCbYCr422ToRGB_8u_C2C3R", kStreamCbYCr, kRgb, lanes601b_, andNot7, wide601bRounded,
-       RUN_C2(zeliCbYCr422ToRGB_8u_C2C3R)},
+      M(zeliCbYCr422ToBGR_709HDTV_8u_C2C3R, C2, kStreamCbYCr, kBgr, hdtv, andNot7, wideHdtvRounded),
+      M(zeliCbYCr422ToBGR_709HDTV_8u_C2C4R, C2A, kStreamCbYCr, kBgra, hdtv, andNot7, wideHdtvRounded),
+      M(zeliCbYCr422ToBGR_8u_C2C4R, C2A, kStreamCbYCr, kBgra, lanes601b_, andNot7, wide601bRounded),
+      M(zeliCbYCr422ToRGB_8u_C2C3R, C2, kStreamCbYCr, kRgb, lanes601b_, andNot7, wide601bRounded),
       // 4:1:1
-      {"zeliYCbCr411ToBGR_8u_P3C3R", kPlanes411, kBgr, lanes601a_, blocksOf8Then4, wide411Rounded,
-       RUN_P3(zeliYCbCr411ToBGR_8u_P3C3R), 4},
-      {"zeliYCbCr411ToBGR_8u_P3C4R", kPlanes411, kBgra, lanes601a_, blocksOf8Then4, wide411Rounded,
-       RUN_P3A(zeliYCbCr411ToBGR_8u_P3C4R), 4},
+      M(zeliYCbCr411ToBGR_8u_P3C3R, P3, kPlanes411, kBgr, lanes601a_, blocksOf8Then4, wide411Rounded, 4),
+      M(zeliYCbCr411ToBGR_8u_P3C4R, P3A, kPlanes411, kBgra, lanes601a_, blocksOf8Then4, wide411Rounded, 4),
       // Y0 Cb Y1 Cr streams and 4:2:2 planes
-      {"zeliYCbCr422ToBGR_8u_C2C3R", kStreamYCbCr, kBgr, lanes601b_, by16Plus8, raw, RUN_C2(zeliYCbCr422ToBGR_8u_C2C3R),
-       2},
-      {"zeliYCbCr422ToBGR_8u_C2C4R", kStreamYCbCr, kBgra, lanes601b_, by16Plus8, raw,
-       RUN_C2A(zeliYCbCr422ToBGR_8u_C2C4R), 2},
-      {"zeliYCbCr422ToBGR_8u_P3C3R", kPlanes422, kBgr, lanes601b_, by16Plus8, raw, RUN_P3(zeliYCbCr422ToBGR_8u_P3C3R)},
-      {"zeliYCbCr422ToRGB_8u_C2C3R", kStreamYCbCr, kRgb, lanes601a_, evenPart, raw, RUN_C2(zeliYCbCr422ToRGB_8u_C2C3R)},
-      {"zeliYCbCr422ToRGB_8u_C2P3R", kStreamYCbCr, kRgbPlanes, lanes601a_, evenPart, raw,
-       RUN_C2P3(zeliYCbCr422ToRGB_8u_C2P3R)},
-      {"zeliYCrCb422ToRGB_8u_C2P3R", kStreamYCrCb, kRgbPlanes, lanes601a_, evenPart, raw,
-       RUN_C2P3(zeliYCrCb422ToRGB_8u_C2P3R)},
-      {"zeliYCbCr422ToRGB_8u_C2C4R", kStreamYCbCr, kRgba, pairRawB, evenPart, wide601aRounded,
-       RUN_C2A(zeliYCbCr422ToRGB_8u_C2C4R)},
-      {"zeliYCbCr422ToRGB_8u_P3C3R", kPlanes422, kRgb, lanes601b_, andNot7, wide601bTruncated,
-       RUN_P3(zeliYCbCr422ToRGB_8u_P3C3R), 1, 1, false, false, pairCentredA},
+      M(zeliYCbCr422ToBGR_8u_C2C3R, C2, kStreamYCbCr, kBgr, lanes601b_, by16Plus8, raw, 2),
+      M(zeliYCbCr422ToBGR_8u_C2C4R, C2A, kStreamYCbCr, kBgra, lanes601b_, by16Plus8, raw, 2),
+      M(zeliYCbCr422ToBGR_8u_P3C3R, P3, kPlanes422, kBgr, lanes601b_, by16Plus8, raw),
+      M(zeliYCbCr422ToRGB_8u_C2C3R, C2, kStreamYCbCr, kRgb, lanes601a_, evenPart, raw),
+      M(zeliYCbCr422ToRGB_8u_C2P3R, C2P3, kStreamYCbCr, kRgbPlanes, lanes601a_, evenPart, raw),
+      M(zeliYCrCb422ToRGB_8u_C2P3R, C2P3, kStreamYCrCb, kRgbPlanes, lanes601a_, evenPart, raw),
+      M(zeliYCbCr422ToRGB_8u_C2C4R, C2A, kStreamYCbCr, kRgba, pairRawB, evenPart, wide601aRounded),
+      M(zeliYCbCr422ToRGB_8u_P3C3R, P3, kPlanes422, kRgb, lanes601b_, andNot7, wide601bTruncated, 1, 1, false, false,
+        pairCentredA),
       // Y0 Cr Y1 Cb streams
-      {"zeliYCrCb422ToRGB_8u_C2C3R", kStreamYCrCb, kRgb, pairRawB, andNot7, wide601aRounded,
-       RUN_C2(zeliYCrCb422ToRGB_8u_C2C3R)},
-      {"zeliYCrCb422ToRGB_8u_C2C4R", kStreamYCrCb, kRgba, pairRawB, andNot7, wide601aRounded,
-       RUN_C2A(zeliYCrCb422ToRGB_8u_C2C4R)},
-      {"zeliYCrCb422ToBGR_8u_C2C3R", kStreamYCrCb, kBgr, pairRawB, andNot7, wide601aRounded,
-       RUN_C2(zeliYCrCb422ToBGR_8u_C2C3R)},
-      {"zeliYCrCb422ToBGR_8u_C2C4R", kStreamYCrCb, kBgra, pairRawB, andNot7, wide601aRounded,
-       RUN_C2A(zeliYCrCb422ToBGR_8u_C2C4R)},
+      M(zeliYCrCb422ToRGB_8u_C2C3R, C2, kStreamYCrCb, kRgb, pairRawB, andNot7, wide601aRounded),
+      M(zeliYCrCb422ToRGB_8u_C2C4R, C2A, kStreamYCrCb, kRgba, pairRawB, andNot7, wide601aRounded),
+      M(zeliYCrCb422ToBGR_8u_C2C3R, C2, kStreamYCrCb, kBgr, pairRawB, andNot7, wide601aRounded),
+      M(zeliYCrCb422ToBGR_8u_C2C4R, C2A, kStreamYCrCb, kBgra, pairRawB, andNot7, wide601aRounded),
       // YUV 4:2:0
-      {"zeliYUV420ToRGB_8u_P3R", kPlanes420, kRgbPlanes, yuvWideTruncated, none, yuvWideTruncated,
-       RUN_P3P3(zeliYUV420ToRGB_8u_P3R)},
-      {"zeliYUV420ToRGB_8u_P3", kPlanes420, kRgbPlanes, yuvWideTruncated, none, yuvWideTruncated,
-       [](const Call& c) { return zeliYUV420ToRGB_8u_P3(c.src, c.dst, c.size); }, 1, 1, true},
-      {"zeliYUV420ToRGB_8u_P3C3R", kPlanes420, kRgb, halves2, evenPart, halves2, RUN_P3(zeliYUV420ToRGB_8u_P3C3R)},
-      {"zeliYUV420ToRGB_8u_P3C3", kPlanes420, kRgb, halves2, evenPart, halves2,
-       [](const Call& c) { return zeliYUV420ToRGB_8u_P3C3(c.src, c.dst[0], c.size); }, 1, 1, true},
-      {"zeliYUV420ToBGR_8u_P3C3R", kPlanes420, kBgr, halves1, evenPart, halves1, RUN_P3(zeliYUV420ToBGR_8u_P3C3R), 2,
-       2},
-      {"zeliYUV420ToRGB_8u_P3AC4R", kPlanes420, kRgbZero, yuvQuad, halfPairsOf2, yuvWideRounded,
-       RUN_P3(zeliYUV420ToRGB_8u_P3AC4R)},
+      M(zeliYUV420ToRGB_8u_P3R, P3P3, kPlanes420, kRgbPlanes, yuvWideTruncated, none, yuvWideTruncated),
+      M(zeliYUV420ToRGB_8u_P3, P3P3_, kPlanes420, kRgbPlanes, yuvWideTruncated, none, yuvWideTruncated, 1, 1, true),
+      M(zeliYUV420ToRGB_8u_P3C3R, P3, kPlanes420, kRgb, halves2, evenPart, halves2),
+      M(zeliYUV420ToRGB_8u_P3C3, P3C3_, kPlanes420, kRgb, halves2, evenPart, halves2, 1, 1, true),
+      M(zeliYUV420ToBGR_8u_P3C3R, P3, kPlanes420, kBgr, halves1, evenPart, halves1, 2, 2),
+      M(zeliYUV420ToRGB_8u_P3AC4R, P3, kPlanes420, kRgbZero, yuvQuad, halfPairsOf2, yuvWideRounded),
       // YUV 4:2:2
-      {"zeliYUV422ToRGB_8u_C2C3R", kStreamYCbCr, kRgb, halves2, andNot15, yuvWideRounded,
-       RUN_C2(zeliYUV422ToRGB_8u_C2C3R)},
-      {"zeliYUV422ToRGB_8u_P3C3R", kPlanes422, kRgb, halves2, andNot15, yuvWideTruncated,
-       RUN_P3(zeliYUV422ToRGB_8u_P3C3R)},
-      {"zeliYUV422ToRGB_8u_P3C3", kPlanes422, kRgb, halves2, andNot15, yuvWideTruncated,
-       [](const Call& c) { return zeliYUV422ToRGB_8u_P3C3(c.src, c.dst[0], c.size); }, 1, 1, true, true},
-      {"zeliYUV422ToRGB_8u_P3R", kPlanes422, kRgbPlanes, halves2, andNot15, yuvWideTruncated,
-       RUN_P3P3(zeliYUV422ToRGB_8u_P3R)},
-      {"zeliYUV422ToRGB_8u_P3", kPlanes422, kRgbPlanes, halves2, andNot15, yuvWideTruncated,
-       [](const Call& c) { return zeliYUV422ToRGB_8u_P3(c.src, c.dst, c.size); }, 1, 1, true, true},
-      {"zeliYUV422ToRGB_8u_P3AC4R", kPlanes422, kRgbZero, yuvQuad, blocksOf8Then4, yuvWideTruncated,
-       RUN_P3(zeliYUV422ToRGB_8u_P3AC4R)},
+      M(zeliYUV422ToRGB_8u_C2C3R, C2, kStreamYCbCr, kRgb, halves2, andNot15, yuvWideRounded),
+      M(zeliYUV422ToRGB_8u_P3C3R, P3, kPlanes422, kRgb, halves2, andNot15, yuvWideTruncated),
+      M(zeliYUV422ToRGB_8u_P3C3, P3C3_, kPlanes422, kRgb, halves2, andNot15, yuvWideTruncated, 1, 1, true, true),
+      M(zeliYUV422ToRGB_8u_P3R, P3P3, kPlanes422, kRgbPlanes, halves2, andNot15, yuvWideTruncated),
+      M(zeliYUV422ToRGB_8u_P3, P3P3_, kPlanes422, kRgbPlanes, halves2, andNot15, yuvWideTruncated, 1, 1, true, true),
+      M(zeliYUV422ToRGB_8u_P3AC4R, P3, kPlanes422, kRgbZero, yuvQuad, blocksOf8Then4, yuvWideTruncated),
   };
   return all;
-}
-
-const Member& member(const std::string& name) {
-  for (const Member& m : members())
-    if (name == m.name) return m;
-  throw std::runtime_error("no member " + name);
 }
 
 // ---- the images of one call ----
 
 struct Placement {
-  int offset = 1;  // bytes past a 64-byte boundary, for every buffer
-  int pad = 0;     // bytes after each row
+  int offset = 1;        // bytes past a 64-byte boundary, for every buffer
+  int pad = 0;           // bytes after each row
   bool aligned = false;  // every pointer and step a multiple of 16
 };
 
@@ -325,34 +287,24 @@ struct Images {
     return (at < end ? body : m.tail)(luma(x, y), u, v);
   }
 
-  // Bytes of pixel (x, y) in the destination, in memory order.
-  std::vector<int> pixelBytes(int x, int y) const {
-    switch (m.dst.kind) {
-      case DstKind::C3: return {dst[0].get(3 * x, y), dst[0].get(3 * x + 1, y), dst[0].get(3 * x + 2, y)};
-      case DstKind::C4:
-        return {dst[0].get(4 * x, y), dst[0].get(4 * x + 1, y), dst[0].get(4 * x + 2, y), dst[0].get(4 * x + 3, y)};
-      case DstKind::P3: return {dst[0].get(x, y), dst[1].get(x, y), dst[2].get(x, y)};
-    }
-    return {};
-  }
-  std::vector<int> wantBytes(int x, int y, Form body) const {
-    if (!written(x, y)) return std::vector<int>(m.dst.kind == DstKind::C4 ? 4 : 3, kUnwritten);
-    const Rgb8 p = expected(x, y, body);
-    std::vector<int> out = m.dst.bgr ? std::vector<int>{p.b, p.g, p.r} : std::vector<int>{p.r, p.g, p.b};
-    if (m.dst.kind == DstKind::C4) out.push_back(m.dst.zeroFourth ? 0 : kAlpha);
-    return out;
-  }
-
   // "" when every pixel and every byte around the rows is as the model says.
   std::string check(Form body) const {
+    const int n = m.dst.kind == DstKind::C4 ? 4 : 3;
     for (int y = 0; y < height; ++y)
       for (int x = 0; x < width; ++x) {
-        const auto got = pixelBytes(x, y), want = wantBytes(x, y, body);
-        if (got != want) {
-          std::string g, w;
-          for (int b : got) g += std::to_string(b) + " ";
-          for (int b : want) w += std::to_string(b) + " ";
-          return "pixel " + std::to_string(x) + "," + std::to_string(y) + ": " + g + "for " + w;
+        int want[4] = {kUnwritten, kUnwritten, kUnwritten, kUnwritten};
+        if (written(x, y)) {
+          const Rgb8 p = expected(x, y, body);
+          want[0] = m.dst.bgr ? p.b : p.r;
+          want[1] = p.g;
+          want[2] = m.dst.bgr ? p.r : p.b;
+          want[3] = m.dst.zeroFourth ? 0 : kAlpha;
+        }
+        for (int c = 0; c < n; ++c) {
+          const int got = m.dst.kind == DstKind::P3 ? dst[c].get(x, y) : dst[0].get(n * x + c, y);
+          if (got != want[c])
+            return "pixel " + std::to_string(x) + "," + std::to_string(y) + " byte " + std::to_string(c) + ": " +
+                   std::to_string(got) + " for " + std::to_string(want[c]);
         }
       }
     for (const auto& d : dst)
