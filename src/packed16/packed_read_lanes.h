@@ -18,6 +18,10 @@
 #include "packed16/packed_fields.h"
 #include "packed16/packed_read_formulas.h"
 
+// Every helper is inlined into its kernel: an AVX2 kernel then holds all of
+// its operations, and no 256-bit value passes through a call.
+#define ZEL_UNPACK_LANE inline __attribute__((always_inline))
+
 namespace zel::unpack {
 
 // The units, with the few operations the readers add.
@@ -66,79 +70,84 @@ struct Words {
   static constexpr bool kRedHigh = RedHigh;
 };
 
-template <class U>
-struct Expanded {
-  V<U> r, g, b;  // 8-bit expansions in 16-bit lanes
-};
-
+// The 8-bit expansions of the fields in 16-bit lanes. Results leave the
+// helpers through references: aggregates of 256-bit values would go
+// through memory.
 template <class U, class W>
-inline Expanded<U> expand(V<U> w) {
+ZEL_UNPACK_LANE void expand(V<U> w, V<U>& r, V<U>& g, V<U>& b) {
   using L = typename W::Layout;
   const V<U> lo = U::and_(U::template sll16<8 - L::kLowBits>(w), U::set16(L::kLowMask << (8 - L::kLowBits)));
-  const V<U> mid = U::and_(U::template srl16<L::kMidShift - (8 - L::kMidBits)>(w),
-                           U::set16(L::kMidMask << (8 - L::kMidBits)));
+  g = U::and_(U::template srl16<L::kMidShift - (8 - L::kMidBits)>(w), U::set16(L::kMidMask << (8 - L::kMidBits)));
   const V<U> top = U::and_(U::template srl16<L::kTopShift - (8 - L::kTopBits)>(w),
                            U::set16(L::kTopMask << (8 - L::kTopBits)));
-  return W::kRedHigh ? Expanded<U>{top, mid, lo} : Expanded<U>{lo, mid, top};
+  r = W::kRedHigh ? top : lo;
+  b = W::kRedHigh ? lo : top;
 }
 
 // ---- forms ----
+//
+// pixel(r, g, b -> y, q0, q1, q2): luma lanes and the three quantities that
+// are summed over the pixels of a chroma sample; chroma(sums -> c1, c2).
 
-// Per pixel: luma lanes and the quantities summed for chroma.
+// MulHighU16(c << N, k) and MulHighS16(c, k).
+template <class U, int N>
+ZEL_UNPACK_LANE V<U> highU(V<U> c, int k) {
+  return U::mulHighU16(U::template sll16<N>(c), U::set16(k));
+}
 template <class U>
-struct PixelLanes {
-  V<U> y;
-  lc::Trio<U> q;
-};
-template <class U>
-struct ChromaLanes {
-  V<U> c1, c2;  // Cb and Cr, or U and V
-};
+ZEL_UNPACK_LANE V<U> highS(V<U> c, int k) {
+  return U::mulHighS16(c, U::set16(k));
+}
 
 // Studio-range YCbCr; Pixels is the count of a chroma sample (2 or 4).
 template <int Pixels>
 struct StudioLanes {
   template <class U>
-  static PixelLanes<U> pixel(const Expanded<U>& e) {
-    auto h = [](V<U> c, int w) { return U::mulHighU16(U::template sll16<8>(c), U::set16(w)); };
-    const V<U> s = U::add16(U::add16(U::add16(h(e.r, kStudioYR), h(e.g, kStudioYG)), h(e.b, kStudioYB)),
+  static ZEL_UNPACK_LANE void pixel(V<U> r, V<U> g, V<U> b, V<U>& y, V<U>& q0, V<U>& q1, V<U>& q2) {
+    const V<U> s = U::add16(U::add16(U::add16(highU<U, 8>(r, kStudioYR), highU<U, 8>(g, kStudioYG)),
+                                     highU<U, 8>(b, kStudioYB)),
                             U::set16(kStudioYAdd));
-    return {U::template sra16<7>(s), {e.r, e.g, e.b}};
+    y = U::template sra16<7>(s);
+    q0 = r;
+    q1 = g;
+    q2 = b;
   }
   template <class U>
-  static ChromaLanes<U> chroma(const lc::Trio<U>& sums) {
+  static ZEL_UNPACK_LANE void chroma(V<U> rs, V<U> gs, V<U> bs, V<U>& cb, V<U>& cr) {
     using C = StudioChromaBody<Pixels>;
-    auto h = [](V<U> c, int w) { return U::mulHighU16(U::template sll16<5>(c), U::set16(w)); };
     const V<U> add = U::set16(C::kAdd);
-    const V<U> cb = U::add16(U::sub16(U::sub16(h(sums.c2, kStudioBlue), h(sums.c0, kStudioCbR)),
-                                      h(sums.c1, kStudioCbG)),
-                             add);
-    const V<U> cr = U::add16(U::sub16(U::sub16(h(sums.c0, kStudioBlue), h(sums.c1, kStudioCrG)),
-                                      h(sums.c2, kStudioCrB)),
-                             add);
-    return {U::template sra16<C::kShift>(cb), U::template sra16<C::kShift>(cr)};
+    cb = U::template sra16<C::kShift>(U::add16(
+        U::sub16(U::sub16(highU<U, 5>(bs, kStudioBlue), highU<U, 5>(rs, kStudioCbR)), highU<U, 5>(gs, kStudioCbG)),
+        add));
+    cr = U::template sra16<C::kShift>(U::add16(
+        U::sub16(U::sub16(highU<U, 5>(rs, kStudioBlue), highU<U, 5>(gs, kStudioCrG)), highU<U, 5>(bs, kStudioCrB)),
+        add));
   }
 };
 
 // Full-range YUV of 2 x 2 blocks, blue-low words: y summed with the
-// expansions of red and blue.
+// expansions of blue and red.
 struct YuvLanes {
   template <class U>
-  static PixelLanes<U> pixel(const Expanded<U>& e) {
-    auto h = [](V<U> c, int w) { return U::mulHighU16(U::template sll16<8>(c), U::set16(w)); };
-    const V<U> s =
-        U::add16(U::add16(U::add16(h(e.r, kYuvYR), h(e.g, kYuvYG)), h(e.b, kYuvYB)), U::set16(64));
-    const V<U> y = U::template sra16<7>(s);
-    return {y, {y, e.r, e.b}};
+  static ZEL_UNPACK_LANE void pixel(V<U> r, V<U> g, V<U> b, V<U>& y, V<U>& q0, V<U>& q1, V<U>& q2) {
+    const V<U> s = U::add16(
+        U::add16(U::add16(highU<U, 8>(r, kYuvYR), highU<U, 8>(g, kYuvYG)), highU<U, 8>(b, kYuvYB)), U::set16(64));
+    y = U::template sra16<7>(s);
+    q0 = y;
+    q1 = b;
+    q2 = r;
+  }
+  // (MulHighS16((sum << 5) - (Ys << 5), gain) + 8224) >> 6
+  template <class U>
+  static ZEL_UNPACK_LANE V<U> difference(V<U> sum, V<U> ys32, int gain) {
+    const V<U> d = U::sub16(U::template sll16<5>(sum), ys32);
+    return U::template sra16<6>(U::add16(highS<U>(d, gain), U::set16(8224)));
   }
   template <class U>
-  static ChromaLanes<U> chroma(const lc::Trio<U>& sums) {
-    const V<U> ys = U::template sll16<5>(sums.c0);
-    auto c = [&](V<U> sum, int gain) {
-      const V<U> d = U::sub16(U::template sll16<5>(sum), ys);
-      return U::template sra16<6>(U::add16(U::mulHighS16(d, U::set16(gain)), U::set16(8224)));
-    };
-    return {c(sums.c2, kYuvUGain), c(sums.c1, kYuvVGain)};
+  static ZEL_UNPACK_LANE void chroma(V<U> ys, V<U> bs, V<U> rs, V<U>& u, V<U>& v) {
+    const V<U> ys32 = U::template sll16<5>(ys);
+    u = difference<U>(bs, ys32, kYuvUGain);
+    v = difference<U>(rs, ys32, kYuvVGain);
   }
 };
 
@@ -146,107 +155,95 @@ struct YuvLanes {
 // expansions times four; Pixels is the count of a chroma sample.
 template <int Pixels>
 struct YuvTwiceLanes {
-  static constexpr int kMeanShift = Pixels == 4 ? 2 : 1;   // mean of y2
-  static constexpr int kSumShift = Pixels == 4 ? 3 : 2;    // sums of R', B'
+  static constexpr int kMeanShift = Pixels == 4 ? 2 : 1;  // mean of y2
+  static constexpr int kSumShift = Pixels == 4 ? 3 : 2;   // sums of B', R'
   template <class U>
-  static PixelLanes<U> pixel(const Expanded<U>& e) {
-    const V<U> r4 = U::template sll16<2>(e.r), g4 = U::template sll16<2>(e.g), b4 = U::template sll16<2>(e.b);
-    auto h = [](V<U> c, int w) { return U::mulHighS16(c, U::set16(w)); };
-    const V<U> y2 = U::add16(U::add16(h(r4, kYuvYR), h(b4, kYuvYB)), h(g4, kYuvYG));
-    return {U::template sra16<1>(U::add16(y2, U::set16(1))), {y2, r4, b4}};
+  static ZEL_UNPACK_LANE void pixel(V<U> r, V<U> g, V<U> b, V<U>& y, V<U>& q0, V<U>& q1, V<U>& q2) {
+    q1 = U::template sll16<2>(b);
+    q2 = U::template sll16<2>(r);
+    q0 = U::add16(U::add16(highS<U>(q2, kYuvYR), highS<U>(q1, kYuvYB)), highS<U>(U::template sll16<2>(g), kYuvYG));
+    y = U::template sra16<1>(U::add16(q0, U::set16(1)));
+  }
+  // MulHighS16(mean - m, gain) + 128
+  template <class U>
+  static ZEL_UNPACK_LANE V<U> difference(V<U> sum, V<U> m, int gain) {
+    return U::add16(highS<U>(U::sub16(U::template sra16<kSumShift>(sum), m), gain), U::set16(128));
   }
   template <class U>
-  static ChromaLanes<U> chroma(const lc::Trio<U>& sums) {
-    const V<U> m = U::template sra16<kMeanShift>(sums.c0);
-    auto c = [&](V<U> sum, int gain) {
-      const V<U> d = U::sub16(U::template sra16<kSumShift>(sum), m);
-      return U::add16(U::mulHighS16(d, U::set16(gain)), U::set16(128));
-    };
-    return {c(sums.c2, kYuvUGainRedLow), c(sums.c1, kYuvVGain)};
+  static ZEL_UNPACK_LANE void chroma(V<U> y2s, V<U> bs, V<U> rs, V<U>& u, V<U>& v) {
+    const V<U> m = U::template sra16<kMeanShift>(y2s);
+    u = difference<U>(bs, m, kYuvUGainRedLow);
+    v = difference<U>(rs, m, kYuvVGain);
   }
 };
 
 // ---- blocks ----
+//
+// Words of a block: wa holds pixels 0..7 and wb pixels 8..15 of each lane
+// (U::loadUnits(p, 32) and U::loadUnits(p + 8, 32)).
 
-// The words of one block: a = pixels 0..7, b = pixels 8..15 of each lane
-// (lanes 32 bytes apart).
 template <class U>
-struct WordPair {
-  V<U> a, b;
-};
-template <class U>
-inline WordPair<U> loadWords(const uint16_t* p) {
-  return {U::loadUnits(p, 32), U::loadUnits(p + 8, 32)};
+ZEL_UNPACK_LANE V<U> loadLanes(const uint16_t* p) {
+  return U::loadUnits(p, 32);
 }
 
-template <class U>
-inline lc::Trio<U> sum(const lc::Trio<U>& x, const lc::Trio<U>& y) {
-  return {U::add16(x.c0, y.c0), U::add16(x.c1, y.c1), U::add16(x.c2, y.c2)};
-}
-// Sums of neighbouring pixels: eight pairs a lane, pixel order.
-template <class U>
-inline lc::Trio<U> pairSums(const lc::Trio<U>& a, const lc::Trio<U>& b) {
-  return {U::hadd16(a.c0, b.c0), U::hadd16(a.c1, b.c1), U::hadd16(a.c2, b.c2)};
-}
-
-template <class U>
-struct RowLanes {
-  V<U> yBytes;  // 16 luma bytes a lane
-  lc::Trio<U> qa, qb;
-};
-
+// Eight pixels a lane: luma lanes and the quantities to sum.
 template <class U, class W, class Form>
-inline RowLanes<U> rowLanes(const WordPair<U>& w) {
-  const PixelLanes<U> a = Form::pixel(expand<U, W>(w.a)), b = Form::pixel(expand<U, W>(w.b));
-  return {U::packU8(a.y, b.y), a.q, b.q};
+ZEL_UNPACK_LANE void halfBlock(V<U> w, V<U>& y, V<U>& q0, V<U>& q1, V<U>& q2) {
+  V<U> r, g, b;
+  expand<U, W>(w, r, g, b);
+  Form::template pixel<U>(r, g, b, y, q0, q1, q2);
 }
 
-// Chroma bytes of a lane: eight first-chroma bytes, then eight second.
+// Chroma bytes of a lane from its sums: eight first-chroma bytes, then
+// eight second.
 template <class U, class Form>
-inline V<U> chromaBytes(const lc::Trio<U>& sums) {
-  const ChromaLanes<U> c = Form::template chroma<U>(sums);
-  return U::packU8(c.c1, c.c2);
+ZEL_UNPACK_LANE V<U> chromaBytes(V<U> s0, V<U> s1, V<U> s2) {
+  V<U> c1, c2;
+  Form::template chroma<U>(s0, s1, s2, c1, c2);
+  return U::packU8(c1, c2);
 }
 
-// One block of a row pair in 4:2:0: two luma rows, one chroma row.
-template <class U>
-struct Block420 {
-  V<U> y0, y1, chroma;
-};
+// A block of a 4:2:0 row pair: luma bytes of both rows, chroma of the
+// 2 x 2 groups (horizontal adds give eight pair sums a lane in order).
 template <class U, class W, class Form>
-inline Block420<U> block420(const WordPair<U>& w0, const WordPair<U>& w1) {
-  const RowLanes<U> t = rowLanes<U, W, Form>(w0), d = rowLanes<U, W, Form>(w1);
-  return {t.yBytes, d.yBytes, chromaBytes<U, Form>(pairSums<U>(sum<U>(t.qa, d.qa), sum<U>(t.qb, d.qb)))};
+ZEL_UNPACK_LANE void block420(V<U> wa0, V<U> wb0, V<U> wa1, V<U> wb1, V<U>& y0, V<U>& y1, V<U>& chroma) {
+  V<U> ya, yb, a0, a1, a2, b0, b1, b2, c0, c1, c2, d0, d1, d2;
+  halfBlock<U, W, Form>(wa0, ya, a0, a1, a2);
+  halfBlock<U, W, Form>(wb0, yb, b0, b1, b2);
+  y0 = U::packU8(ya, yb);
+  halfBlock<U, W, Form>(wa1, ya, c0, c1, c2);
+  halfBlock<U, W, Form>(wb1, yb, d0, d1, d2);
+  y1 = U::packU8(ya, yb);
+  chroma = chromaBytes<U, Form>(U::hadd16(U::add16(a0, c0), U::add16(b0, d0)),
+                                U::hadd16(U::add16(a1, c1), U::add16(b1, d1)),
+                                U::hadd16(U::add16(a2, c2), U::add16(b2, d2)));
 }
 
-// One block of a row: luma, and chroma of pairs (4:2:2) or of groups of
-// four (4:1:1, four bytes of each chroma a lane at bytes 0 and 8).
-template <class U>
-struct BlockRow {
-  V<U> y, chroma;
-};
-template <class U, class W, class Form>
-inline BlockRow<U> block422(const WordPair<U>& w) {
-  const RowLanes<U> t = rowLanes<U, W, Form>(w);
-  return {t.yBytes, chromaBytes<U, Form>(pairSums<U>(t.qa, t.qb))};
-}
-template <class U, class W, class Form>
-inline BlockRow<U> block411(const WordPair<U>& w) {
-  const RowLanes<U> t = rowLanes<U, W, Form>(w);
-  const lc::Trio<U> pairs = pairSums<U>(t.qa, t.qb);
-  return {t.yBytes, chromaBytes<U, Form>(pairSums<U>(pairs, pairs))};
+// A block of one row: luma bytes, chroma of pairs (Group 2) or of groups
+// of four (Group 4: four bytes of each chroma a lane, at bytes 0 and 8).
+template <int Group, class U, class W, class Form>
+ZEL_UNPACK_LANE void blockRow(V<U> wa, V<U> wb, V<U>& y, V<U>& chroma) {
+  V<U> ya, yb, a0, a1, a2, b0, b1, b2;
+  halfBlock<U, W, Form>(wa, ya, a0, a1, a2);
+  halfBlock<U, W, Form>(wb, yb, b0, b1, b2);
+  y = U::packU8(ya, yb);
+  V<U> s0 = U::hadd16(a0, b0), s1 = U::hadd16(a1, b1), s2 = U::hadd16(a2, b2);
+  if constexpr (Group == 4) {
+    s0 = U::hadd16(s0, s0);
+    s1 = U::hadd16(s1, s1);
+    s2 = U::hadd16(s2, s2);
+  }
+  chroma = chromaBytes<U, Form>(s0, s1, s2);
 }
 
-// Eight or four words in both registers of a short block (SSE): the
+// Eight or four words of a short block (SSE), in both halves: the
 // results of its pixels come first in every output.
-inline WordPair<SseUnit> loadShort(const uint16_t* p, int n) {
-  const __m128i a = n == 8 ? load128(p) : load64(p);
-  return {a, a};
-}
+ZEL_UNPACK_LANE __m128i loadShort(const uint16_t* p, int n) { return n == 8 ? load128(p) : load64(p); }
 
 // Y0 Cb Y1 Cr order of a lane's 16 pixels: 32 bytes, two registers.
 template <class U>
-inline void storePairStream(uint8_t* q, V<U> y, V<U> chroma) {
+ZEL_UNPACK_LANE void storePairStream(uint8_t* q, V<U> y, V<U> chroma) {
   // Cb0 Cr0 Cb1 Cr1 ... from Cb0..7 Cr0..7.
   static constexpr lc::Shuffle16 kZip = {{0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15}};
   const V<U> c = U::shuffle8(chroma, U::shuffleOf(kZip));
@@ -256,11 +253,15 @@ inline void storePairStream(uint8_t* q, V<U> y, V<U> chroma) {
 
 // ---- words to interleaved bytes ----
 
-// 16 pixels a lane to 48 bytes: low field, green, top field.
+// 16 pixels a lane: the bytes of the low field, green, the top field.
 template <class U, class L>
-inline lc::Trio<U> byteChannels(const WordPair<U>& w) {
-  const Expanded<U> a = expand<U, Words<L, false>>(w.a), b = expand<U, Words<L, false>>(w.b);
-  return {U::packU8(a.r, b.r), U::packU8(a.g, b.g), U::packU8(a.b, b.b)};
+ZEL_UNPACK_LANE void byteChannels(V<U> wa, V<U> wb, V<U>& c0, V<U>& c1, V<U>& c2) {
+  V<U> ra, ga, ba, rb, gb, bb;
+  expand<U, Words<L, false>>(wa, ra, ga, ba);
+  expand<U, Words<L, false>>(wb, rb, gb, bb);
+  c0 = U::packU8(ra, rb);
+  c1 = U::packU8(ga, gb);
+  c2 = U::packU8(ba, bb);
 }
 
 }  // namespace zel::unpack

@@ -41,12 +41,14 @@ inline Rgb operator+(const Rgb& a, const Rgb& b) { return {a.r + b.r, a.g + b.g,
 // ---- 4:2:0 vector part ----
 
 template <class U, class W, class Form>
-inline int blocks420(const PairRows& r, int x, int end) {
+ZEL_UNPACK_LANE int blocks420(const PairRows& r, int x, int end) {
   for (; x + U::kPixels <= end; x += U::kPixels) {
-    const Block420<U> b = block420<U, W, Form>(loadWords<U>(r.s0 + x), loadWords<U>(r.s1 + x));
-    U::storeUnits(r.y0 + x, 16, b.y0);
-    U::storeUnits(r.y1 + x, 16, b.y1);
-    U::storeHalves(r.c1 + x / 2, r.c2 + x / 2, b.chroma);
+    V<U> y0, y1, c;
+    block420<U, W, Form>(loadLanes<U>(r.s0 + x), loadLanes<U>(r.s0 + x + 8), loadLanes<U>(r.s1 + x),
+                         loadLanes<U>(r.s1 + x + 8), y0, y1, c);
+    U::storeUnits(r.y0 + x, 16, y0);
+    U::storeUnits(r.y1 + x, 16, y1);
+    U::storeHalves(r.c1 + x / 2, r.c2 + x / 2, c);
   }
   return x;
 }
@@ -60,15 +62,15 @@ ZEL_AVX2 __attribute__((flatten)) int blocks420Avx(const PairRows& r, int end) {
 // only the block's own bytes are copied out.
 template <class W, class Form>
 inline void short420(const PairRows& r, int x, int n) {
-  const Block420<SseUnit> b = block420<SseUnit, W, Form>(loadShort(r.s0 + x, n), loadShort(r.s1 + x, n));
-  alignas(16) uint8_t y0[16], y1[16], c[16];
-  _mm_store_si128(reinterpret_cast<__m128i*>(y0), b.y0);
-  _mm_store_si128(reinterpret_cast<__m128i*>(y1), b.y1);
-  _mm_store_si128(reinterpret_cast<__m128i*>(c), b.chroma);
-  std::memcpy(r.y0 + x, y0, n);
-  std::memcpy(r.y1 + x, y1, n);
-  std::memcpy(r.c1 + x / 2, c, n / 2);
-  std::memcpy(r.c2 + x / 2, c + 8, n / 2);
+  const __m128i a = loadShort(r.s0 + x, n), b = loadShort(r.s1 + x, n);
+  __m128i v[3];
+  block420<SseUnit, W, Form>(a, a, b, b, v[0], v[1], v[2]);
+  alignas(16) uint8_t out[3][16];
+  for (int k = 0; k < 3; ++k) _mm_store_si128(reinterpret_cast<__m128i*>(out[k]), v[k]);
+  std::memcpy(r.y0 + x, out[0], n);
+  std::memcpy(r.y1 + x, out[1], n);
+  std::memcpy(r.c1 + x / 2, out[2], n / 2);
+  std::memcpy(r.c2 + x / 2, out[2] + 8, n / 2);
 }
 
 // Pixels [0, end) of a row pair by the body form; end is a multiple of 4:
@@ -88,47 +90,32 @@ inline int vector420(const PairRows& r, int end, bool avx2) {
 
 // ---- single-row vector part: sinks of 4:2:2 and 4:1:1 blocks ----
 
-template <int Group, class U, class W, class Form>
-inline BlockRow<U> blockOf(const WordPair<U>& w) {
-  if constexpr (Group == 4)
-    return block411<U, W, Form>(w);
-  else
-    return block422<U, W, Form>(w);
-}
-
-struct PlanesSink422 {
-  static constexpr int kGroup = 2;
-  PlaneRow row;
-  template <class U>
-  void store(int x, const BlockRow<U>& b) const {
-    U::storeUnits(row.y + x, 16, b.y);
-    U::storeHalves(row.c1 + x / 2, row.c2 + x / 2, b.chroma);
-  }
-  void storeShort(int x, int n, const BlockRow<SseUnit>& b) const {
-    alignas(16) uint8_t y[16], c[16];
-    _mm_store_si128(reinterpret_cast<__m128i*>(y), b.y);
-    _mm_store_si128(reinterpret_cast<__m128i*>(c), b.chroma);
-    std::memcpy(row.y + x, y, n);
-    std::memcpy(row.c1 + x / 2, c, n / 2);
-    std::memcpy(row.c2 + x / 2, c + 8, n / 2);
+// Stack copies of a short block's luma and chroma bytes.
+struct ShortBytes {
+  alignas(16) uint8_t y[16], c[16];
+  ShortBytes(__m128i yv, __m128i cv) {
+    _mm_store_si128(reinterpret_cast<__m128i*>(y), yv);
+    _mm_store_si128(reinterpret_cast<__m128i*>(c), cv);
   }
 };
 
-struct PlanesSink411 {
-  static constexpr int kGroup = 4;
+template <int Group>
+struct PlanesSink {
+  static constexpr int kGroup = Group;
   PlaneRow row;
   template <class U>
-  void store(int x, const BlockRow<U>& b) const {
-    U::storeUnits(row.y + x, 16, b.y);
-    U::storeQuarters(row.c1 + x / 4, row.c2 + x / 4, b.chroma);
+  ZEL_UNPACK_LANE void store(int x, V<U> y, V<U> c) const {
+    U::storeUnits(row.y + x, 16, y);
+    if constexpr (Group == 4)
+      U::storeQuarters(row.c1 + x / 4, row.c2 + x / 4, c);
+    else
+      U::storeHalves(row.c1 + x / 2, row.c2 + x / 2, c);
   }
-  void storeShort(int x, int n, const BlockRow<SseUnit>& b) const {
-    alignas(16) uint8_t y[16], c[16];
-    _mm_store_si128(reinterpret_cast<__m128i*>(y), b.y);
-    _mm_store_si128(reinterpret_cast<__m128i*>(c), b.chroma);
-    std::memcpy(row.y + x, y, n);
-    std::memcpy(row.c1 + x / 4, c, n / 4);
-    std::memcpy(row.c2 + x / 4, c + 8, n / 4);
+  void storeShort(int x, int n, __m128i y, __m128i c) const {
+    const ShortBytes b(y, c);
+    std::memcpy(row.y + x, b.y, n);
+    std::memcpy(row.c1 + x / Group, b.c, n / Group);
+    std::memcpy(row.c2 + x / Group, b.c + 8, n / Group);
   }
 };
 
@@ -136,20 +123,23 @@ struct StreamSink422 {
   static constexpr int kGroup = 2;
   uint8_t* dst;
   template <class U>
-  void store(int x, const BlockRow<U>& b) const {
-    storePairStream<U>(dst + 2 * x, b.y, b.chroma);
+  ZEL_UNPACK_LANE void store(int x, V<U> y, V<U> c) const {
+    storePairStream<U>(dst + 2 * x, y, c);
   }
-  void storeShort(int x, int n, const BlockRow<SseUnit>& b) const {
+  void storeShort(int x, int n, __m128i y, __m128i c) const {
     alignas(16) uint8_t q[32];
-    storePairStream<SseUnit>(q, b.y, b.chroma);
+    storePairStream<SseUnit>(q, y, c);
     std::memcpy(dst + 2 * x, q, 2 * n);
   }
 };
 
 template <class U, class W, class Form, class Sink>
-inline int blocksRow(const uint16_t* s, const Sink& sink, int x, int end) {
-  for (; x + U::kPixels <= end; x += U::kPixels)
-    sink.template store<U>(x, blockOf<Sink::kGroup, U, W, Form>(loadWords<U>(s + x)));
+ZEL_UNPACK_LANE int blocksRow(const uint16_t* s, const Sink& sink, int x, int end) {
+  for (; x + U::kPixels <= end; x += U::kPixels) {
+    V<U> y, c;
+    blockRow<Sink::kGroup, U, W, Form>(loadLanes<U>(s + x), loadLanes<U>(s + x + 8), y, c);
+    sink.template store<U>(x, y, c);
+  }
   return x;
 }
 
@@ -166,7 +156,10 @@ inline int vectorRow(const uint16_t* s, const Sink& sink, int end, bool avx2) {
   x = blocksRow<SseUnit, W, Form>(s, sink, x, end);
   for (int n = 8; n >= 4; n -= 4)
     if (end - x >= n) {
-      sink.storeShort(x, n, blockOf<Sink::kGroup, SseUnit, W, Form>(loadShort(s + x, n)));
+      const __m128i w = loadShort(s + x, n);
+      __m128i y, c;
+      blockRow<Sink::kGroup, SseUnit, W, Form>(w, w, y, c);
+      sink.storeShort(x, n, y, c);
       x += n;
     }
   return x;
@@ -180,10 +173,13 @@ inline int yuv420End(int width) { return (width & ~7) + ((width & 6) >= 4 ? 4 : 
 // ---- words to bytes ----
 
 template <class U>
-inline int wordBytesBlocks(const uint16_t* s, uint8_t* d, int x, int end) {
+ZEL_UNPACK_LANE int wordBytesBlocks(const uint16_t* s, uint8_t* d, int x, int end) {
   const lc::PackedOut3<false> out{d};
-  for (; x + U::kPixels <= end; x += U::kPixels)
-    out.template block<U>(x, byteChannels<U, packed::Layout565>(loadWords<U>(s + x)));
+  for (; x + U::kPixels <= end; x += U::kPixels) {
+    lc::Trio<U> t;
+    byteChannels<U, packed::Layout565>(loadLanes<U>(s + x), loadLanes<U>(s + x + 8), t.c0, t.c1, t.c2);
+    out.template block<U>(x, t);
+  }
   return x;
 }
 
@@ -237,7 +233,7 @@ void studioLumaRow(const uint16_t* src, uint8_t* y, int width) {
 
 template <class W>
 void studio422PlanesRow(const PlaneRow& row, int width, bool avx2) {
-  int x = vectorRow<W, StudioLanes<2>>(row.s, PlanesSink422{row}, studio422End(width), avx2);
+  int x = vectorRow<W, StudioLanes<2>>(row.s, PlanesSink<2>{row}, studio422End(width), avx2);
   using Chroma = StudioChromaTail<2>;
   for (; x + 2 <= width; x += 2) {
     const Rgb a = pixelAt<W>(row.s, x), b = pixelAt<W>(row.s, x + 1);
@@ -272,7 +268,7 @@ void studio422PairsRow(const uint16_t* src, uint8_t* dst, int width, bool avx2) 
 
 template <class W>
 void studio411Row(const PlaneRow& row, int width, bool avx2) {
-  int x = vectorRow<W, StudioLanes<4>>(row.s, PlanesSink411{row}, width & ~3, avx2);
+  int x = vectorRow<W, StudioLanes<4>>(row.s, PlanesSink<4>{row}, width & ~3, avx2);
   for (; x < width; ++x) row.y[x] = studioLumaAt<W>(row.s, x);
 }
 
@@ -311,7 +307,7 @@ void yuvRedLow420Pair(const PairRows& r, int width, bool avx2) {
 }
 
 void yuvRedLow422Row(const PlaneRow& row, int width, bool avx2) {
-  int x = vectorRow<Red565, YuvTwiceLanes<2>>(row.s, PlanesSink422{row}, width & ~15, avx2);
+  int x = vectorRow<Red565, YuvTwiceLanes<2>>(row.s, PlanesSink<2>{row}, width & ~15, avx2);
   for (; x + 2 <= width; x += 2)
     yuvTailGroup<Red565, false, YuvChromaTail2>(row.s, nullptr, row.y, nullptr, row.c1, row.c2, x);
 }
