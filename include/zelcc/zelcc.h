@@ -150,6 +150,48 @@ ZELCC_API Status zeliYCCToRGB_32f_C3R(const float* src, int srcStep, float* dst,
 ZELCC_API Status zeliYCCToRGB_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
 
 /* ---- RGB to and from chroma-subsampled YCbCr and YUV ---- */
+/* RGB or BGR to subsampled video-range YCbCr; 4:2:0 members leave a last odd row and column unwritten. */
+ZELCC_API Status zeliBGRToCbYCr422_709HDTV_8u_AC4C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToCbYCr422_709HDTV_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToCbYCr422_8u_AC4C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr411_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr411_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr420_709CSC_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr420_709CSC_8u_C3P2R(const uint8_t* src, int srcStep, uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr420_709CSC_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr420_709HDTV_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr420_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr420_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr422_8u_AC4C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr422_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr422_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCrCb420_709CSC_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCrCb420_709CSC_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCrCb420_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCrCb420_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToCbYCr422Gamma_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToCbYCr422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr420_8u_C3P2R(const uint8_t* src, int srcStep, uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr420_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr420_8u_C4P2R(const uint8_t* src, int srcStep, uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr422_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr422_8u_P3C2R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCrCb420_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYCrCb422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCrCb422_8u_P3C2R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+/* RGB or BGR to subsampled full-range YUV; the names without steps take tightly packed images. */
+ZELCC_API Status zeliBGRToYUV420_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV420_8u_C3P3(const uint8_t* src, uint8_t* const dstPlanes[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV420_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV420_8u_P3(const uint8_t* const srcPlanes[3], uint8_t* const dstPlanes[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV420_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYUV422_8u_C3P3(const uint8_t* src, uint8_t* const dstPlanes[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV422_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV422_8u_P3(const uint8_t* const srcPlanes[3], uint8_t* const dstPlanes[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV422_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
 
 /* ---- Repacking between subsampled layouts ---- */
 ZELCC_API Status zeliCbYCr422ToYCbCr411_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);

@@ -473,11 +473,15 @@ const Descriptor* findDescriptor(const std::string& name) {
 
 Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offset)
     : d_(d), size_(size), pad_(padBytes) {
+  // Names without steps take tightly packed images.
+  if (!d.region) pad_ = padBytes = 0;
   const int w = std::max(std::max(size.width, 0), d.roomWidth), h = std::max(std::max(size.height, 0), d.roomHeight);
   auto addSide = [&](const Side& side, int sideIndex) {
     for (int p = 0; p < side.planes(); ++p) {
       Buffer b;
       b.geometry = planeGeometry(side, p, w, h);
+      // Their 4:2:0 chroma rows are width >> 1 samples long.
+      if (!d.region && side.chroma == Chroma::S420 && side.isPlanar() && p > 0) b.geometry.rowBytes = w >> 1;
       b.step = b.geometry.rowBytes + padBytes;
       const bool inSamples = d.stepsInSamples && !(sideIndex == 0 && d.srcStepInBytes);
       b.pitch = inSamples ? b.step / b.geometry.sampleBytes * b.geometry.sampleBytes : b.step;

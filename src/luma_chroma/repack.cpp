@@ -165,6 +165,27 @@ void convertChroma(Scheme from, Scheme to, const uint8_t* const* in, uint8_t* co
   }
 }
 
+// Pair streams and two planes unpacked straight into destination planes,
+// for the rules that only keep, drop or repeat whole chroma rows.
+void unpackIntoPlanes(const Member& m, const Side& src, const Side& dst, int width, int height) {
+  const int cw = chromaWidth(m.dst.scheme, width);
+  for (int y = 0; y < height; ++y) {
+    const bool dstHalf = m.dst.scheme == Scheme::S420;
+    const int dstChroma = dstHalf ? ((y & 1) ? -1 : y / 2) : y;
+    const int srcChroma = m.src.scheme == Scheme::S420 ? y / 2 : y;
+    uint8_t* luma = at(dst, 0, y, 0);
+    if (m.src.kind == Kind::Pairs) {
+      if (dstChroma >= 0)
+        splitPairs(at(src, 0, y, 0), m.src.order, luma, at(dst, 1, dstChroma, 0), at(dst, 2, dstChroma, 0), width);
+      else
+        lumaOfPairs(at(src, 0, y, 0), m.src.order, luma, width);
+    } else {
+      std::memcpy(luma, at(src, 0, y, 0), size_t(width));
+      if (dstChroma >= 0) unzip(at(src, 1, srcChroma, 0), at(dst, 1, dstChroma, 0), at(dst, 2, dstChroma, 0), cw);
+    }
+  }
+}
+
 Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
   int width = size.width, height = size.height;
   switch (m.rule) {
@@ -220,6 +241,11 @@ Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
   const bool moveOnly = m.src.scheme == m.dst.scheme ||
                         (m.src.scheme == Scheme::S422 && m.dst.scheme == Scheme::S420) ||
                         (m.src.scheme == Scheme::S420 && m.dst.scheme == Scheme::S422);
+
+  if (moveOnly && m.dst.kind == Kind::Planes && m.src.kind != Kind::Planes) {
+    unpackIntoPlanes(m, src, dst, width, height);
+    return StatusOk;
+  }
 
   Staging st;
   for (int g = 0; g + groupRows <= height; g += groupRows) {
