@@ -73,8 +73,7 @@ Status studio420(const uint16_t* src, int srcStep, uint8_t* const dst[3], const 
 }
 
 template <class W>
-Status studio422Planes(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstSteps[3],
-                       ImageSize size) {
+Status studio422Planes(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstSteps[3], ImageSize size) {
   if (Status s = checkPlanes(src, dst, size, 2, 1); s != StatusOk) return s;
   walkRows(src, srcStep, dst, dstSteps, size, studio422PlanesRow<W>);
   return StatusOk;
@@ -132,8 +131,8 @@ ZEL_PUBLIC Status zeliBGR565ToBGR_16u8u_C3R(const uint16_t* src, int srcStep, ui
 }
 
 // The low field goes to byte 0 whatever the channel order: one code.
-ZEL_PUBLIC Status zeliRGB565ToRGB_16u8u_C3R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep,
-                                            ImageSize size) __attribute__((alias("zeliBGR565ToBGR_16u8u_C3R")));
+ZEL_PUBLIC Status zeliRGB565ToRGB_16u8u_C3R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size)
+    __attribute__((alias("zeliBGR565ToBGR_16u8u_C3R")));
 
 ZEL_PUBLIC Status zeliBGR555ToYCbCr411_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3],
                                                    const int dstStep[3], ImageSize size) {

@@ -24,11 +24,11 @@ inline int16_t lane16(int32_t v) { return static_cast<int16_t>(v); }
 // Luma weights in Q15 (0.25702, 0.504, 0.09802) and 16.5 in Q7.
 inline constexpr int kStudioYR = 8422, kStudioYG = 16515, kStudioYB = 3212, kStudioYAdd = 2112;
 // Chroma weights in Q16: the matrix rows of the full-resolution form.
-inline constexpr int kStudioBlue = lc::kCbB;     // 28770, 0.439 (B in Cb, R in Cr)
-inline constexpr int kStudioCbR = -lc::kCbR;     // 9699
-inline constexpr int kStudioCbG = -lc::kCbG;     // 19071
-inline constexpr int kStudioCrG = -lc::kCrG;     // 24117
-inline constexpr int kStudioCrB = -lc::kCrB;     // 4653
+inline constexpr int kStudioBlue = lc::kCbB;  // 28770, 0.439 (B in Cb, R in Cr)
+inline constexpr int kStudioCbR = -lc::kCbR;  // 9699
+inline constexpr int kStudioCbG = -lc::kCbG;  // 19071
+inline constexpr int kStudioCrG = -lc::kCrG;  // 24117
+inline constexpr int kStudioCrB = -lc::kCrB;  // 4653
 static_assert(lc::kCrR == lc::kCbB, "one weight serves B in Cb and R in Cr");
 
 // Body luma: Y = SaturateU8((H(r) + H(g) + H(b) + 2112) >> 7) with

@@ -78,8 +78,8 @@ ZEL_UNPACK_LANE void expand(V<U> w, V<U>& r, V<U>& g, V<U>& b) {
   using L = typename W::Layout;
   const V<U> lo = U::and_(U::template sll16<8 - L::kLowBits>(w), U::set16(L::kLowMask << (8 - L::kLowBits)));
   g = U::and_(U::template srl16<L::kMidShift - (8 - L::kMidBits)>(w), U::set16(L::kMidMask << (8 - L::kMidBits)));
-  const V<U> top = U::and_(U::template srl16<L::kTopShift - (8 - L::kTopBits)>(w),
-                           U::set16(L::kTopMask << (8 - L::kTopBits)));
+  const V<U> top =
+      U::and_(U::template srl16<L::kTopShift - (8 - L::kTopBits)>(w), U::set16(L::kTopMask << (8 - L::kTopBits)));
   r = W::kRedHigh ? top : lo;
   b = W::kRedHigh ? lo : top;
 }
@@ -104,9 +104,9 @@ template <int Pixels>
 struct StudioLanes {
   template <class U>
   static ZEL_UNPACK_LANE void pixel(V<U> r, V<U> g, V<U> b, V<U>& y, V<U>& q0, V<U>& q1, V<U>& q2) {
-    const V<U> s = U::add16(U::add16(U::add16(highU<U, 8>(r, kStudioYR), highU<U, 8>(g, kStudioYG)),
-                                     highU<U, 8>(b, kStudioYB)),
-                            U::set16(kStudioYAdd));
+    const V<U> s =
+        U::add16(U::add16(U::add16(highU<U, 8>(r, kStudioYR), highU<U, 8>(g, kStudioYG)), highU<U, 8>(b, kStudioYB)),
+                 U::set16(kStudioYAdd));
     y = U::template sra16<7>(s);
     q0 = r;
     q1 = g;
@@ -130,8 +130,8 @@ struct StudioLanes {
 struct YuvLanes {
   template <class U>
   static ZEL_UNPACK_LANE void pixel(V<U> r, V<U> g, V<U> b, V<U>& y, V<U>& q0, V<U>& q1, V<U>& q2) {
-    const V<U> s = U::add16(
-        U::add16(U::add16(highU<U, 8>(r, kYuvYR), highU<U, 8>(g, kYuvYG)), highU<U, 8>(b, kYuvYB)), U::set16(64));
+    const V<U> s = U::add16(U::add16(U::add16(highU<U, 8>(r, kYuvYR), highU<U, 8>(g, kYuvYG)), highU<U, 8>(b, kYuvYB)),
+                            U::set16(64));
     y = U::template sra16<7>(s);
     q0 = y;
     q1 = b;
@@ -215,9 +215,9 @@ ZEL_UNPACK_LANE void block420(V<U> wa0, V<U> wb0, V<U> wa1, V<U> wb1, V<U>& y0, 
   halfBlock<U, W, Form>(wa1, ya, c0, c1, c2);
   halfBlock<U, W, Form>(wb1, yb, d0, d1, d2);
   y1 = U::packU8(ya, yb);
-  chroma = chromaBytes<U, Form>(U::hadd16(U::add16(a0, c0), U::add16(b0, d0)),
-                                U::hadd16(U::add16(a1, c1), U::add16(b1, d1)),
-                                U::hadd16(U::add16(a2, c2), U::add16(b2, d2)));
+  chroma =
+      chromaBytes<U, Form>(U::hadd16(U::add16(a0, c0), U::add16(b0, d0)), U::hadd16(U::add16(a1, c1), U::add16(b1, d1)),
+                           U::hadd16(U::add16(a2, c2), U::add16(b2, d2)));
 }
 
 // A block of one row: luma bytes, chroma of pairs (Group 2) or of groups

@@ -1,13 +1,14 @@
 // Scalar formulas of the packed-word readers: the fixed points of black
 // and white, every form against the colour matrix it approximates over all
 // field combinations, and how often body and tail forms part.
+#include "packed16/packed_read_formulas.h"
+
 #include <gtest/gtest.h>
 
 #include <algorithm>
 #include <cmath>
 
 #include "packed16/packed_fields.h"
-#include "packed16/packed_read_formulas.h"
 
 namespace {
 

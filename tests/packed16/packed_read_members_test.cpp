@@ -93,11 +93,21 @@ std::vector<Plane> expected(const Member& m, const Words& words, ImageSize s) {
   for (int y = 0; y < h; ++y) {
     Rows r;
     switch (m.kind) {
-      case Kind::Bytes: put(0, y, refWordsToBytes(row(y), w)); continue;
-      case Kind::Pairs422: put(0, y, refStudio422Pairs(m.at, row(y), w)); continue;
-      case Kind::Studio422: r = refStudio422(m.at, row(y), w); break;
-      case Kind::Studio411: r = refStudio411(m.at, row(y), w); break;
-      case Kind::RedLow422: r = refYuv(m.at, row(y), nullptr, w, true); break;
+      case Kind::Bytes:
+        put(0, y, refWordsToBytes(row(y), w));
+        continue;
+      case Kind::Pairs422:
+        put(0, y, refStudio422Pairs(m.at, row(y), w));
+        continue;
+      case Kind::Studio422:
+        r = refStudio422(m.at, row(y), w);
+        break;
+      case Kind::Studio411:
+        r = refStudio411(m.at, row(y), w);
+        break;
+      case Kind::RedLow422:
+        r = refYuv(m.at, row(y), nullptr, w, true);
+        break;
       default:
         if (y & 1) continue;
         if (y + 1 == h) {  // a last odd row: luma by the tail form in YCbCr
@@ -136,14 +146,16 @@ struct Call {
   Call(const Member& m, const Words& words, ImageSize s, int srcStep, int srcOffset, int pad, int dstOffset) {
     src.assign(size_t(128 + srcOffset + rowOffset(m.kind, srcStep, s.height) + 2 * s.width), 0x5D);
     for (int y = 0; y < s.height; ++y)
-      std::memcpy(src.data() + 64 + srcOffset + rowOffset(m.kind, srcStep, y), words[size_t(y)].data(), 2 * size_t(s.width));
+      std::memcpy(src.data() + 64 + srcOffset + rowOffset(m.kind, srcStep, y), words[size_t(y)].data(),
+                  2 * size_t(s.width));
     for (auto [bytes, rows] : outputs(m.kind, s)) {
       steps.push_back(bytes + pad);
       dst.emplace_back(size_t(128 + dstOffset + (bytes + pad) * rows), kFill);
       first.push_back(dst.back().data() + 64 + dstOffset);
     }
     const auto* p = reinterpret_cast<const uint16_t*>(src.data() + 64 + srcOffset);
-    status = m.single ? m.single(p, srcStep, first[0], steps[0], s) : m.planar(p, srcStep, first.data(), steps.data(), s);
+    status =
+        m.single ? m.single(p, srcStep, first[0], steps[0], s) : m.planar(p, srcStep, first.data(), steps.data(), s);
   }
   int at(int plane, int x, int y) const { return first[size_t(plane)][y * steps[size_t(plane)] + x]; }
   std::string compare(const std::vector<Plane>& want) const {
@@ -203,7 +215,8 @@ TEST(PackedReaders, OneCodeBehindBothByteOrders) {
 }
 
 Call uniform(const char* name, ImageSize s, uint16_t word) {
-  return Call(member(name), Words(size_t(s.height), std::vector<uint16_t>(size_t(s.width), word)), s, 2 * s.width, 0, 0, 0);
+  return Call(member(name), Words(size_t(s.height), std::vector<uint16_t>(size_t(s.width), word)), s, 2 * s.width, 0, 0,
+              0);
 }
 
 // 4:2:0 at width 24: pixels 16 to 23 take the tail forms; at width 28 the
@@ -225,7 +238,8 @@ TEST(PackedReaders, WidthDecidesTheForms) {
   const Call yuv = uniform("BGR565ToYUV420", {10, 2}, 0x0032);
   for (int j = 0; j < 5; ++j) EXPECT_EQ(yuv.at(1, j, 0), j < 4 ? 190 : 189) << j;
   // White: 231 in 565, 229 in 555, body and tail alike.
-  const Call white565 = uniform("BGR565ToYCbCr422P3", {41, 1}, 0xFFFF), white555 = uniform("BGR555ToYCbCr411", {41, 1}, 0xFFFF);
+  const Call white565 = uniform("BGR565ToYCbCr422P3", {41, 1}, 0xFFFF),
+             white555 = uniform("BGR555ToYCbCr411", {41, 1}, 0xFFFF);
   for (int x : {0, 40}) {
     EXPECT_EQ(white565.at(0, x, 0), 231);
     EXPECT_EQ(white555.at(0, x, 0), 229);

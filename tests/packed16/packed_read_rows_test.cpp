@@ -1,6 +1,8 @@
 // Row kernels of the packed-word readers against their pixel formulas at
 // every width from 1 to 70 and at 129 and 257, rows at odd addresses, the
 // SSE4.1 body alone and with AVX2 blocks first; no other byte changes.
+#include "packed16/packed_read_rows.h"
+
 #include <gtest/gtest.h>
 
 #include <functional>
@@ -9,7 +11,6 @@
 #include "frame/simd.h"
 #include "packed16/packed_read_lanes.h"
 #include "packed16/packed_read_reference.h"
-#include "packed16/packed_read_rows.h"
 #include "support/test_image.h"
 
 namespace {
@@ -28,7 +29,9 @@ struct Kernel {
 
 template <class W, Source At>
 std::vector<Kernel> blueLow(const std::string& n) {
-  auto pairOf = [](const uint16_t* const* s, uint8_t* const* d) { return PairRows{s[0], s[1], d[0], d[3], d[1], d[2]}; };
+  auto pairOf = [](const uint16_t* const* s, uint8_t* const* d) {
+    return PairRows{s[0], s[1], d[0], d[3], d[1], d[2]};
+  };
   auto rowOf = [](const uint16_t* const* s, uint8_t* const* d) { return PlaneRow{s[0], d[0], d[1], d[2]}; };
   return {
       {n + " 4:2:0", true, [=](auto s, auto d, int w, bool a) { studio420Pair<W>(pairOf(s, d), w, a); },
@@ -36,11 +39,15 @@ std::vector<Kernel> blueLow(const std::string& n) {
       {n + " 4:2:2", false, [=](auto s, auto d, int w, bool a) { studio422PlanesRow<W>(rowOf(s, d), w, a); },
        [](auto s, int w) { return refStudio422(At, s[0], w); }},
       {n + " 4:2:2 pairs", false, [](auto s, auto d, int w, bool a) { studio422PairsRow<W>(s[0], d[0], w, a); },
-       [](auto s, int w) { return Rows{refStudio422Pairs(At, s[0], w), {}, {}, {}}; }},
+       [](auto s, int w) {
+         return Rows{refStudio422Pairs(At, s[0], w), {}, {}, {}};
+       }},
       {n + " 4:1:1", false, [=](auto s, auto d, int w, bool a) { studio411Row<W>(rowOf(s, d), w, a); },
        [](auto s, int w) { return refStudio411(At, s[0], w); }},
       {n + " last row", false, [](auto s, auto d, int w, bool) { studioLumaRow<W>(s[0], d[0], w); },
-       [](auto s, int w) { return Rows{refStudio(At, s[0], nullptr, w, 2, 0).y, {}, {}, {}}; }},
+       [](auto s, int w) {
+         return Rows{refStudio(At, s[0], nullptr, w, 2, 0).y, {}, {}, {}};
+       }},
       {n + " YUV 4:2:0", true, [=](auto s, auto d, int w, bool a) { yuv420Pair<W>(pairOf(s, d), w, a); },
        [](auto s, int w) { return refYuv(At, s[0], s[1], w, false); }},
   };
@@ -53,12 +60,18 @@ std::vector<Kernel> kernels() {
   for (const Kernel& x : blueLow<Blue565, pixel<Layout565, true>>("BGR565")) k.push_back(x);
   constexpr Source red = pixel<Layout565, false>;
   k.push_back({"565 to bytes", false, [](auto s, auto d, int w, bool a) { wordsToBytesRow(s[0], d[0], w, a); },
-               [](auto s, int w) { return Rows{refWordsToBytes(s[0], w), {}, {}, {}}; }});
+               [](auto s, int w) {
+                 return Rows{refWordsToBytes(s[0], w), {}, {}, {}};
+               }});
   k.push_back({"RGB565 YUV 4:2:0", true,
-               [](auto s, auto d, int w, bool a) { yuvRedLow420Pair(PairRows{s[0], s[1], d[0], d[3], d[1], d[2]}, w, a); },
+               [](auto s, auto d, int w, bool a) {
+                 yuvRedLow420Pair(PairRows{s[0], s[1], d[0], d[3], d[1], d[2]}, w, a);
+               },
                [=](auto s, int w) { return refYuv(red, s[0], s[1], w, true); }});
   k.push_back({"RGB565 YUV 4:2:2", false,
-               [](auto s, auto d, int w, bool a) { yuvRedLow422Row(PlaneRow{s[0], d[0], d[1], d[2]}, w, a); },
+               [](auto s, auto d, int w, bool a) {
+                 yuvRedLow422Row(PlaneRow{s[0], d[0], d[1], d[2]}, w, a);
+               },
                [=](auto s, int w) { return refYuv(red, s[0], nullptr, w, true); }});
   return k;
 }
