@@ -193,6 +193,52 @@ ZELCC_API Status zeliRGBToYUV422_8u_C3P3R(const uint8_t* src, int srcStep, uint8
 ZELCC_API Status zeliRGBToYUV422_8u_P3(const uint8_t* const srcPlanes[3], uint8_t* const dstPlanes[3], ImageSize size);
 ZELCC_API Status zeliRGBToYUV422_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
 
+/* Subsampled YCbCr and YUV to RGB or BGR with 8-bit channels; 4:2:0 members leave a last odd row and column unwritten and warn, 4:2:2 members give a last odd pixel the chroma of its pair. */
+ZELCC_API Status zeliCbYCr422ToBGR_709HDTV_8u_C2C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliCbYCr422ToBGR_709HDTV_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliCbYCr422ToBGR_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliCbYCr422ToRGB_8u_C2C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr411ToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr411ToBGR_8u_P3C4R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCr420ToBGR_709CSC_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR_709HDTV_8u_P3C4R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCr420ToBGR_8u_P2C3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR_8u_P2C4R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCr420ToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR_8u_P3C4R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCr420ToRGB_8u_P2C3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToRGB_8u_P2C4R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCr420ToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR_8u_C2C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCr422ToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB_8u_C2C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCr422ToRGB_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCrCb420ToBGR_8u_P2C3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCrCb, int srcCrCbStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCrCb420ToBGR_8u_P2C4R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCrCb, int srcCrCbStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCrCb420ToRGB_8u_P2C3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCrCb, int srcCrCbStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCrCb420ToRGB_8u_P2C4R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCrCb, int srcCrCbStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCrCb420ToRGB_8u_P3C4R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCrCb422ToBGR_8u_C2C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCrCb422ToBGR_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCrCb422ToRGB_8u_C2C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCrCb422ToRGB_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCrCb422ToRGB_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB_8u_P3(const uint8_t* const srcPlanes[3], uint8_t* const dstPlanes[3], ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB_8u_P3AC4R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB_8u_P3C3(const uint8_t* const srcPlanes[3], uint8_t* dst, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB_8u_P3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* const dstPlanes[3], int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV422ToRGB_8u_C2C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV422ToRGB_8u_P3(const uint8_t* const srcPlanes[3], uint8_t* const dstPlanes[3], ImageSize size);
+ZELCC_API Status zeliYUV422ToRGB_8u_P3AC4R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV422ToRGB_8u_P3C3(const uint8_t* const srcPlanes[3], uint8_t* dst, ImageSize size);
+ZELCC_API Status zeliYUV422ToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV422ToRGB_8u_P3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* const dstPlanes[3], int dstStep, ImageSize size);
+
 /* ---- Repacking between subsampled layouts ---- */
 ZELCC_API Status zeliCbYCr422ToYCbCr411_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
 ZELCC_API Status zeliCbYCr422ToYCbCr420_8u_C2P2R(const uint8_t* src, int srcStep, uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
