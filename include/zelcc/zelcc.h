@@ -325,6 +325,34 @@ ZELCC_API Status zeliYCrCb420ToBGR_Filter_8u_P3C4R(const uint8_t* const src[3], 
                                                    int dstStep, ImageSize size, uint8_t alpha);
 
 /* ---- 16-bit packed RGB ---- */
+ZELCC_API Status zeliBGR555ToYCbCr411_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                  ImageSize size);
+ZELCC_API Status zeliBGR555ToYCbCr420_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                  ImageSize size);
+ZELCC_API Status zeliBGR555ToYCbCr422_16u8u_C3C2R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGR555ToYCbCr422_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                  ImageSize size);
+ZELCC_API Status zeliBGR555ToYCrCb420_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                  ImageSize size);
+ZELCC_API Status zeliBGR555ToYUV420_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                ImageSize size);
+ZELCC_API Status zeliBGR565ToBGR_16u8u_C3R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGR565ToYCbCr411_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                  ImageSize size);
+ZELCC_API Status zeliBGR565ToYCbCr420_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                  ImageSize size);
+ZELCC_API Status zeliBGR565ToYCbCr422_16u8u_C3C2R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGR565ToYCbCr422_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                  ImageSize size);
+ZELCC_API Status zeliBGR565ToYCrCb420_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                  ImageSize size);
+ZELCC_API Status zeliBGR565ToYUV420_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                ImageSize size);
+ZELCC_API Status zeliRGB565ToRGB_16u8u_C3R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGB565ToYUV420_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                ImageSize size);
+ZELCC_API Status zeliRGB565ToYUV422_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                ImageSize size);
 
 /* ---- YCoCg ---- */
 /* Interleaved BGR (RGB for the byte-plane pair) to and from planes Y, Co, Cg
