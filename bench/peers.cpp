@@ -257,6 +257,45 @@ const std::map<std::string, PeerFactory>& table() {
                              kWidth * 3, kWidth, kHeight);
          });
        }},
+      {"zeliYCbCr420ToBGR_8u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I420ToRGB24", [](YuvFrame& f) {
+           libyuv::I420ToRGB24(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
+                               kWidth * 3, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420ToBGR_8u_P3C4R",
+       [] {
+         return yuvPeer("libyuv I420ToARGB", [](YuvFrame& f) {
+           libyuv::I420ToARGB(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
+                              kWidth * 4, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420ToBGR_8u_P2C4R",
+       [] {
+         return yuvPeer("libyuv NV12ToARGB", [](YuvFrame& f) {
+           libyuv::NV12ToARGB(f.y.data(), kWidth, f.uv.data(), kWidth, f.argb.data(), kWidth * 4, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr422ToBGR_8u_C2C4R",
+       [] {
+         return yuvPeer("libyuv YUY2ToARGB", [](YuvFrame& f) {
+           libyuv::YUY2ToARGB(f.packed.data(), kWidth * 2, f.argb.data(), kWidth * 4, kWidth, kHeight);
+         });
+       }},
+      {"zeliCbYCr422ToBGR_8u_C2C4R",
+       [] {
+         return yuvPeer("libyuv UYVYToARGB", [](YuvFrame& f) {
+           libyuv::UYVYToARGB(f.packed.data(), kWidth * 2, f.argb.data(), kWidth * 4, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr422ToBGR_8u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I422ToRGB24", [](YuvFrame& f) {
+           libyuv::I422ToRGB24(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
+                               kWidth * 3, kWidth, kHeight);
+         });
+       }},
       {"zeliYCbCr422ToYCbCr420_8u_C2P3R",
        [] {
          return yuvPeer("libyuv YUY2ToI420", [](YuvFrame& f) {

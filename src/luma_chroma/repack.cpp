@@ -74,22 +74,25 @@ uint8_t* at(const Side& s, int plane, int row, int offset) { return rowAt(s.p[pl
 
 // Reads luma row `lumaRow` (slot `ly`) and, when `chromaRow` >= 0, chroma
 // row `chromaRow` (slot `cy`) of the columns [x, x + n) into planar rows.
+// A pair stream's luma goes to `lumaTarget` when given (the destination's
+// own luma row), else to staging.
 void readRows(const Layout& l, const Side& s, int lumaRow, int chromaRow, int ly, int cy, int x, int n, Staging& st,
-              Rows& r) {
+              Rows& r, uint8_t* lumaTarget) {
   const int cx = l.scheme == Scheme::S411 ? x / 4 : x / 2;
   const int cn = chromaWidth(l.scheme, n);
   switch (l.kind) {
     case Kind::Pairs: {
       // Luma and chroma share the row of a pair stream.
       const uint8_t* in = at(s, 0, lumaRow, 2 * x);
+      uint8_t* luma = lumaTarget ? lumaTarget : st.y[ly];
       if (chromaRow >= 0) {
-        splitPairs(in, l.order, st.y[ly], st.cb[cy], st.cr[cy], n);
+        splitPairs(in, l.order, luma, st.cb[cy], st.cr[cy], n);
         r.cb[cy] = st.cb[cy];
         r.cr[cy] = st.cr[cy];
       } else {
-        lumaOfPairs(in, l.order, st.y[ly], n);
+        lumaOfPairs(in, l.order, luma, n);
       }
-      r.y[ly] = st.y[ly];
+      r.y[ly] = luma;
       return;
     }
     case Kind::TwoPlanes:
@@ -133,12 +136,12 @@ void writeRow(const Layout& l, const Side& s, int lumaRow, int chromaRow, const 
       mergePairs(y, cb, cr, l.order, at(s, 0, lumaRow, 2 * x), n, nonTemporal);
       return;
     case Kind::TwoPlanes:
-      copyBytes(y, at(s, 0, lumaRow, x), n, nonTemporal || streamLuma);
-      if (chromaRow >= 0) zip(cb, cr, at(s, 1, chromaRow, 2 * cx), cn, nonTemporal);
-      return;
-    case Kind::Planes:
-      copyBytes(y, at(s, 0, lumaRow, x), n, nonTemporal || streamLuma);
-      return;  // chroma was written in place
+    case Kind::Planes: {
+      uint8_t* luma = at(s, 0, lumaRow, x);
+      if (y != luma) copyBytes(y, luma, n, nonTemporal || streamLuma);  // else already unpacked in place
+      if (l.kind == Kind::TwoPlanes && chromaRow >= 0) zip(cb, cr, at(s, 1, chromaRow, 2 * cx), cn, nonTemporal);
+      return;  // planes took their chroma in place
+    }
   }
 }
 
@@ -242,6 +245,13 @@ Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
                         (m.src.scheme == Scheme::S422 && m.dst.scheme == Scheme::S420) ||
                         (m.src.scheme == Scheme::S420 && m.dst.scheme == Scheme::S422);
 
+  if (m.src.kind == Kind::Pairs && m.dst.kind == Kind::Pairs) {
+    // 4:2:2 streams of two byte orders: one byte permutation a row.
+    for (int y = 0; y < height; ++y)
+      reorderPairs(at(src, 0, y, 0), m.src.order, at(dst, 0, y, 0), m.dst.order, width, nonTemporal);
+    if (nonTemporal) _mm_sfence();
+    return StatusOk;
+  }
   if (moveOnly && m.dst.kind == Kind::Planes && m.src.kind != Kind::Planes) {
     unpackIntoPlanes(m, src, dst, width, height);
     return StatusOk;
@@ -254,7 +264,12 @@ Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
       Rows r{};
       for (int k = 0; k < groupRows; ++k) {
         const int chromaRow = k < srcChromaRows ? (srcChromaRows == 1 ? g / groupRows : g + k) : -1;
-        readRows(m.src, src, g + k, chromaRow, k, k, x, n, st, r);
+        // Pair-stream luma lands in the destination's luma row directly,
+        // unless that row is to be streamed.
+        uint8_t* lumaTarget = m.src.kind == Kind::Pairs && m.dst.kind != Kind::Pairs && !nonTemporal && !streamLuma
+                                  ? at(dst, 0, g + k, x)
+                                  : nullptr;
+        readRows(m.src, src, g + k, chromaRow, k, k, x, n, st, r, lumaTarget);
       }
       // Chroma rule, written straight into destination planes or staged
       // for a pair stream or two planes.
