@@ -6,7 +6,7 @@
 
 #include <cstdint>
 
-namespace zel::p16 {
+namespace zel::pack {
 
 // 5-bit fields (and, halved, the 6-bit green of 565).
 inline constexpr int16_t kDitherMatrix5[4][4] = {
@@ -24,4 +24,4 @@ inline constexpr int16_t kDitherMatrix4[4][4] = {
     {4335, 2023, 3757, 1445},
 };
 
-}  // namespace zel::p16
+}  // namespace zel::pack

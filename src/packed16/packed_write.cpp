@@ -5,7 +5,7 @@
 #include "frame/image_layout.h"
 #include "packed16/packed_write_members.h"
 
-using namespace zel::p16;
+using namespace zel::pack;
 
 ZEL_PACKED_SIX(ZEL_PACKED_PLANES, zeliYCbCrTo, _8u16u_P3C3R, Full, false)
 ZEL_PACKED_SIX(ZEL_PACKED_PIXELS, zeliYCbCrTo, _8u16u_C3R, false)

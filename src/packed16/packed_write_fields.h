@@ -10,7 +10,7 @@
 #include "packed16/packed_dither_matrix.h"
 #include "packed16/packed_fields.h"
 
-namespace zel::p16 {
+namespace zel::pack {
 
 enum class Packing { P444, P555, P565 };
 
@@ -83,4 +83,4 @@ struct Dithering {
   }
 };
 
-}  // namespace zel::p16
+}  // namespace zel::pack

@@ -15,7 +15,7 @@
 #include "luma_chroma/yuv_lanes.h"
 #include "packed16/packed_write_fields.h"
 
-namespace zel::p16 {
+namespace zel::pack {
 
 inline Rgb rgbOf(const lc::Rgb8& p) { return {p.r, p.g, p.b}; }
 inline Rgb rgbOf(const lc::Pixel8& p) { return {p.c0, p.c1, p.c2}; }
@@ -63,4 +63,4 @@ inline Rgb yuvLaneForm(int y, int u, int v) {
 // Exact 16.16 on Y << 16, no rounding term.
 inline Rgb yuvWideForm(int y, int u, int v) { return rgbOf(lc::rgbWide(lc::rgbWideA, {0, 0, 0}, y, u, v)); }
 
-}  // namespace zel::p16
+}  // namespace zel::pack

@@ -20,7 +20,7 @@
 #include "packed16/packed_write_fields.h"
 #include "packed16/packed_write_forms.h"
 
-namespace zel::p16 {
+namespace zel::pack {
 
 using lc::Samples3;
 using lc::Trio;
@@ -245,7 +245,7 @@ inline typename U::V assembleLanes(typename U::V low, typename U::V mid, typenam
 }
 
 // The word writer of one row: Truncating or Dithering, for unit U.
-template <class U, class Pack>
+template <class U, class Writer>
 struct RowWords;
 
 template <class U, class L>
@@ -275,37 +275,37 @@ struct RowWords<U, Dithering<L>> {
 
 // Blocks of U::kWords pixels from x while they fit below `end`; returns
 // where it stopped.
-template <class U, class Src, class Form, class Pack>
-inline int wordBlocks(const Src& src, const Form& form, const Pack& pack, int y, uint16_t* dst, int x, int end) {
-  const RowWords<U, Pack> words(pack, y);
+template <class U, class Src, class Form, class Writer>
+inline int wordBlocks(const Src& src, const Form& form, const Writer& writer, int y, uint16_t* dst, int x, int end) {
+  const RowWords<U, Writer> words(writer, y);
   for (; x + U::kWords <= end; x += U::kWords) {
     const Trio<U> c = form.template lanes<U>(src.template block<U>(x));
-    const typename U::V low = pack.redHigh ? c.c2 : c.c0, top = pack.redHigh ? c.c0 : c.c2;
+    const typename U::V low = writer.redHigh ? c.c2 : c.c0, top = writer.redHigh ? c.c0 : c.c2;
     U::storeWords(dst + x, words(low, c.c1, top));
   }
   return x;
 }
 
-template <class Src, class Form, class Pack>
-ZEL_AVX2 __attribute__((flatten)) int wordBlocksAvx(const Src& src, const Form& form, const Pack& pack, int y,
+template <class Src, class Form, class Writer>
+ZEL_AVX2 __attribute__((flatten)) int wordBlocksAvx(const Src& src, const Form& form, const Writer& writer, int y,
                                                     uint16_t* dst, int end) {
-  return wordBlocks<AvxWords>(src, form, pack, y, dst, 0, end);
+  return wordBlocks<AvxWords>(src, form, writer, y, dst, 0, end);
 }
 
 // Pixels [x, end) one at a time through a scalar form.
-template <class Src, class FormFn, class Pack>
-inline void wordPixels(const Src& src, FormFn form, const Pack& pack, int y, uint16_t* dst, int x, int end) {
-  for (; x < end; ++x) dst[x] = pack.word(form(src.pixel(x)), x, y);
+template <class Src, class FormFn, class Writer>
+inline void wordPixels(const Src& src, FormFn form, const Writer& writer, int y, uint16_t* dst, int x, int end) {
+  for (; x < end; ++x) dst[x] = writer.word(form(src.pixel(x)), x, y);
 }
 
 // Pixels [0, end) of row y by one form: AVX2 blocks when `avx2`, SSE4.1
 // blocks, then the last pixels one by one.
-template <class Src, class Form, class Pack>
-inline void formRun(const Src& src, const Form& form, const Pack& pack, int y, uint16_t* dst, int end, bool avx2) {
+template <class Src, class Form, class Writer>
+inline void formRun(const Src& src, const Form& form, const Writer& writer, int y, uint16_t* dst, int end, bool avx2) {
   int x = 0;
-  if (avx2) x = wordBlocksAvx(src, form, pack, y, dst, end);
-  x = wordBlocks<SseWords>(src, form, pack, y, dst, x, end);
-  wordPixels(src, [&](const Samples3& s) { return form.pixel(s); }, pack, y, dst, x, end);
+  if (avx2) x = wordBlocksAvx(src, form, writer, y, dst, end);
+  x = wordBlocks<SseWords>(src, form, writer, y, dst, x, end);
+  wordPixels(src, [&](const Samples3& s) { return form.pixel(s); }, writer, y, dst, x, end);
 }
 
-}  // namespace zel::p16
+}  // namespace zel::pack

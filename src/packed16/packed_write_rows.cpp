@@ -5,7 +5,7 @@
 #include "packed16/packed_write_forms.h"
 #include "packed16/packed_write_lanes.h"
 
-namespace zel::p16 {
+namespace zel::pack {
 
 namespace {
 
@@ -44,18 +44,18 @@ Rgb scalarForm(const Samples3& s) {
 
 void ycbcrPlanesToWords(PlaneChroma chroma, const uint8_t* const planes[3], const int steps[3], WordRows dst,
                         ImageSize size, PackedTarget target, bool dither, bool avx2) {
-  withWords(target, dither, [&](const auto& pack) {
+  withWords(target, dither, [&](const auto& writer) {
     plainWalk(size.height, [&](int y) {
       uint16_t* out = dst.row(y);
       switch (chroma) {
         case PlaneChroma::Full:
-          formRun(planesRow<FullPlanes>(planes, steps, y, y), YCbCrLanes{}, pack, y, out, size.width, avx2);
+          formRun(planesRow<FullPlanes>(planes, steps, y, y), YCbCrLanes{}, writer, y, out, size.width, avx2);
           break;
         case PlaneChroma::Half:
-          formRun(planesRow<HalfPlanes>(planes, steps, y, y), YCbCrLanes{}, pack, y, out, size.width, avx2);
+          formRun(planesRow<HalfPlanes>(planes, steps, y, y), YCbCrLanes{}, writer, y, out, size.width, avx2);
           break;
         case PlaneChroma::HalfBoth:
-          formRun(planesRow<HalfPlanes>(planes, steps, y, y >> 1), YCbCrLanes{}, pack, y, out, size.width, avx2);
+          formRun(planesRow<HalfPlanes>(planes, steps, y, y >> 1), YCbCrLanes{}, writer, y, out, size.width, avx2);
           break;
       }
     });
@@ -65,12 +65,12 @@ void ycbcrPlanesToWords(PlaneChroma chroma, const uint8_t* const planes[3], cons
 void ycbcr411ToWords(const uint8_t* const planes[3], const int steps[3], WordRows dst, ImageSize size,
                      PackedTarget target, bool avx2) {
   const int body = size.width & ~3;
-  withWords(target, false, [&](const auto& pack) {
+  withWords(target, false, [&](const auto& writer) {
     plainWalk(size.height, [&](int y) {
       const QuarterPlanes src = planesRow<QuarterPlanes>(planes, steps, y, y);
       uint16_t* out = dst.row(y);
-      formRun(src, YCbCrLanes{}, pack, y, out, body, avx2);
-      wordPixels(src, scalarForm<ycbcrRoundedForm>, pack, y, out, body, size.width);
+      formRun(src, YCbCrLanes{}, writer, y, out, body, avx2);
+      wordPixels(src, scalarForm<ycbcrRoundedForm>, writer, y, out, body, size.width);
     });
   });
 }
@@ -78,12 +78,12 @@ void ycbcr411ToWords(const uint8_t* const planes[3], const int steps[3], WordRow
 void ycbcrPixelsToWords(const uint8_t* src, int srcStep, WordRows dst, ImageSize size, PackedTarget target,
                         bool dither, bool avx2) {
   const int body = dither ? size.width : size.width & ~7;
-  withWords(target, dither, [&](const auto& pack) {
+  withWords(target, dither, [&](const auto& writer) {
     plainWalk(size.height, [&](int y) {
       const Triples row{rowAt(src, srcStep, y)};
       uint16_t* out = dst.row(y);
-      formRun(row, YCbCrLanes{}, pack, y, out, body, avx2);
-      wordPixels(row, scalarForm<ycbcrTruncatedForm>, pack, y, out, body, size.width);
+      formRun(row, YCbCrLanes{}, writer, y, out, body, avx2);
+      wordPixels(row, scalarForm<ycbcrTruncatedForm>, writer, y, out, body, size.width);
     });
   });
 }
@@ -113,15 +113,15 @@ void ycbcrPairsToWords(const uint8_t* src, int srcStep, WordRows dst, ImageSize 
     oneColumnBytes(src, srcStep, dst, size.height);
     return;
   }
-  withWords(target, dither, [&](const auto& pack) {
+  withWords(target, dither, [&](const auto& writer) {
     plainWalk(size.height, [&](int y) {
       const Pairs row{rowAt(src, srcStep, y)};
       uint16_t* out = dst.row(y);
       if (dither) {
-        formRun(row, YCbCrLanes{}, pack, y, out, even, avx2);
+        formRun(row, YCbCrLanes{}, writer, y, out, even, avx2);
       } else {
-        formRun(row, YCbCrLanes{}, pack, y, out, width & ~7, avx2);
-        wordPixels(row, scalarForm<ycbcrOffsetForm>, pack, y, out, width & ~7, even);
+        formRun(row, YCbCrLanes{}, writer, y, out, width & ~7, avx2);
+        wordPixels(row, scalarForm<ycbcrOffsetForm>, writer, y, out, width & ~7, even);
       }
       if (width & 1) {
         // The lone last pixel: its Y and the byte after it; the plain
@@ -129,7 +129,7 @@ void ycbcrPairsToWords(const uint8_t* src, int srcStep, WordRows dst, ImageSize 
         const int x = width - 1;
         const uint8_t* p = row.p + 2 * x;
         const Rgb c = dither ? ycbcrLaneForm(p[0], p[1], p[1]) : ycbcrTruncatedForm(p[0], p[1], p[-1]);
-        out[x] = pack.word(c, x, y);
+        out[x] = writer.word(c, x, y);
       }
     });
   });
@@ -142,22 +142,22 @@ void yuv420ToWords(const uint8_t* const planes[3], const int steps[3], WordRows 
   // The lane form covers columns below `laneColumns` of rows below
   // `laneRows`; the rest takes the 16.16 form.
   const int laneColumns = dither ? width : width & ~1, laneRows = dither ? height : height & ~1;
-  withWords(target, dither, [&](const auto& pack) {
+  withWords(target, dither, [&](const auto& writer) {
     plainWalk(height, [&](int y) {
       const HalfPlanes row = planesRow<HalfPlanes>(planes, steps, y, y >> 1);
       uint16_t* out = dst.row(y);
       const int lanes = y < laneRows ? laneColumns : 0;
-      formRun(row, YuvLanes{}, pack, y, out, lanes, avx2);
-      wordPixels(row, scalarForm<yuvWideForm>, pack, y, out, lanes, width);
+      formRun(row, YuvLanes{}, writer, y, out, lanes, avx2);
+      wordPixels(row, scalarForm<yuvWideForm>, writer, y, out, lanes, width);
     });
   });
 }
 
 void bytesTo565Words(const uint8_t* src, int srcStep, WordRows dst, ImageSize size, bool avx2) {
-  const Truncating<Layout565> pack{false};
+  const Truncating<Layout565> writer{false};
   plainWalk(size.height, [&](int y) {
-    formRun(Triples{rowAt(src, srcStep, y)}, SameBytes{}, pack, y, dst.row(y), size.width, avx2);
+    formRun(Triples{rowAt(src, srcStep, y)}, SameBytes{}, writer, y, dst.row(y), size.width, avx2);
   });
 }
 
-}  // namespace zel::p16
+}  // namespace zel::pack

@@ -11,7 +11,7 @@
 #include "packed16/packed_write_fields.h"
 #include "zelcc/zelcc.h"
 
-namespace zel::p16 {
+namespace zel::pack {
 
 // Destination rows of packed words, `words` words apart: a public function
 // passes its byte step shifted right by one, so an odd step loses its low
@@ -61,4 +61,4 @@ void yuv420ToWords(const uint8_t* const planes[3], const int steps[3], WordRows 
 // Three bytes a pixel truncated into 565 words, the first byte low.
 void bytesTo565Words(const uint8_t* src, int srcStep, WordRows dst, ImageSize size, bool avx2);
 
-}  // namespace zel::p16
+}  // namespace zel::pack

@@ -9,8 +9,8 @@
 
 namespace {
 
-using namespace zel::p16;
-using namespace zel::p16::test;
+using namespace zel::pack;
+using namespace zel::pack::test;
 
 std::vector<Member> ditheredWriters() {
   std::vector<Member> out;

@@ -11,7 +11,7 @@
 
 namespace {
 
-using namespace zel::p16;
+using namespace zel::pack;
 
 template <class L>
 uint16_t truncated(bool redHigh, int r, int g, int b) {
@@ -82,25 +82,25 @@ TEST(PackedForms, WorkedValues) {
 }
 
 // One block of the given form and reduction in unit U, from 16-bit samples.
-template <class U, class Form, class Pack>
-void blockWords(const Form& form, const Pack& pack, int y, const int16_t* s0, const int16_t* s1, const int16_t* s2,
+template <class U, class Form, class Writer>
+void blockWords(const Form& form, const Writer& writer, int y, const int16_t* s0, const int16_t* s1, const int16_t* s2,
                 uint16_t* out) {
   auto ld = [](const int16_t* p) {
     if constexpr (U::kWords == 8) return zel::load128(p);
     else return zel::load256(p);
   };
   const Trio<U> c = form.template lanes<U>(Trio<U>{ld(s0), ld(s1), ld(s2)});
-  U::storeWords(out, RowWords<U, Pack>(pack, y)(pack.redHigh ? c.c2 : c.c0, c.c1, pack.redHigh ? c.c0 : c.c2));
+  U::storeWords(out, RowWords<U, Writer>(writer, y)(writer.redHigh ? c.c2 : c.c0, c.c1, writer.redHigh ? c.c0 : c.c2));
 }
 
-template <class Form, class Pack>
-ZEL_AVX2 __attribute__((flatten)) void blockWordsAvx(const Form& form, const Pack& pack, int y, const int16_t* s0,
+template <class Form, class Writer>
+ZEL_AVX2 __attribute__((flatten)) void blockWordsAvx(const Form& form, const Writer& writer, int y, const int16_t* s0,
                                                      const int16_t* s1, const int16_t* s2, uint16_t* out) {
-  blockWords<AvxWords>(form, pack, y, s0, s1, s2, out);
+  blockWords<AvxWords>(form, writer, y, s0, s1, s2, out);
 }
 
-template <class Form, class Pack>
-void expectLanesMatch(const Form& form, const Pack& pack, const char* what) {
+template <class Form, class Writer>
+void expectLanesMatch(const Form& form, const Writer& writer, const char* what) {
   std::mt19937 rng(17);
   int16_t s[3][16];
   for (int round = 0; round < 3000; ++round) {
@@ -108,11 +108,11 @@ void expectLanesMatch(const Form& form, const Pack& pack, const char* what) {
       for (int16_t& v : plane) v = int16_t(round < 2 ? (round ? 255 : 0) : rng() & 255);
     const int y = round & 3;
     uint16_t sse[16], avx[16];
-    blockWords<SseWords>(form, pack, y, s[0], s[1], s[2], sse);
-    blockWords<SseWords>(form, pack, y, s[0] + 8, s[1] + 8, s[2] + 8, sse + 8);
-    if (zel::hasAvx2()) blockWordsAvx(form, pack, y, s[0], s[1], s[2], avx);
+    blockWords<SseWords>(form, writer, y, s[0], s[1], s[2], sse);
+    blockWords<SseWords>(form, writer, y, s[0] + 8, s[1] + 8, s[2] + 8, sse + 8);
+    if (zel::hasAvx2()) blockWordsAvx(form, writer, y, s[0], s[1], s[2], avx);
     for (int i = 0; i < 16; ++i) {
-      const uint16_t want = pack.word(form.pixel({s[0][i], s[1][i], s[2][i]}), i, y);
+      const uint16_t want = writer.word(form.pixel({s[0][i], s[1][i], s[2][i]}), i, y);
       ASSERT_EQ(sse[i], want) << what << " lane " << i;
       if (zel::hasAvx2()) ASSERT_EQ(avx[i], want) << what << " AVX2 lane " << i;
     }

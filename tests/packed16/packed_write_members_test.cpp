@@ -11,8 +11,8 @@
 
 namespace {
 
-using namespace zel::p16;
-using namespace zel::p16::test;
+using namespace zel::pack;
+using namespace zel::pack::test;
 
 const Member& member(const std::string& name) {
   static const std::vector<Member> all = writers();

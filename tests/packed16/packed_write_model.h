@@ -14,7 +14,7 @@
 #include "packed16/packed_write_rows.h"
 #include "support/test_image.h"
 
-namespace zel::p16::test {
+namespace zel::pack::test {
 
 using zel::test::TestImage;
 
@@ -175,4 +175,4 @@ struct Call {
   }
 };
 
-}  // namespace zel::p16::test
+}  // namespace zel::pack::test
