@@ -11,6 +11,7 @@
 #include <cstdint>
 
 #include "frame/scalar_ops.h"
+#include "luma_chroma/sub_to_rgb_forms.h"
 #include "luma_chroma/ycbcr_lanes.h"
 #include "luma_chroma/yuv_lanes.h"
 #include "packed16/packed_write_fields.h"
@@ -34,21 +35,11 @@ inline Rgb ycbcrRoundedForm(int y, int cb, int cr) { return rgbOf(lc::wideRounde
 
 // Uncentred chroma with folded offsets (222.912, 135.616, 276.8 in 16.16);
 // the offsets are not the exact equivalents of centring, and stay so.
-inline constexpr int32_t kOffsetRedBias = -14608761, kOffsetGreenBias = 8887730, kOffsetBlueBias = -18140365;
-inline Rgb ycbcrOffsetForm(int y, int cb, int cr) {
-  const int32_t d = y * 76284;
-  return {SaturateU8((d + cr * 104595 + kOffsetRedBias) >> 16),
-          SaturateU8((d - cb * 25690 - cr * 53281 + kOffsetGreenBias) >> 16),
-          SaturateU8((d + cb * 132186 + kOffsetBlueBias) >> 16)};
-}
+inline Rgb ycbcrOffsetForm(int y, int cb, int cr) { return rgbOf(lc::expand::wideRaw(y, cb, cr)); }
 
-// The one-column path of the interleaved 4:2:2 writers: one chroma byte c
-// serves both differences, green with the sum of the two gains.
-inline Rgb ycbcrOneColumnForm(int y, int c) {
-  const int32_t d = y * 76284;
-  return {SaturateU8((d + c * 104595 + kOffsetRedBias) >> 16), SaturateU8((d - c * 78971 + kOffsetGreenBias) >> 16),
-          SaturateU8((d + c * 132186 + kOffsetBlueBias) >> 16)};
-}
+// The one-column path of the interleaved 4:2:2 writers: the one chroma
+// byte c serves as both Cb and Cr of the offset form.
+inline Rgb ycbcrOneColumnForm(int y, int c) { return ycbcrOffsetForm(y, c, c); }
 
 // ---- YUV 4:2:0 ----
 
