@@ -27,7 +27,9 @@ std::vector<uint8_t> frameBytes(size_t n) {
 #ifdef ZELCC_BENCH_OPENCV
 Peer cvtColorPeer(const char* label, int srcType, int dstType, int code) {
   auto src = std::make_shared<cv::Mat>(kHeight, kWidth, srcType);
-  cv::randu(*src, 0, 255);
+  // Float colours live in 0..1, integer ones over their range.
+  const double top = CV_MAT_DEPTH(srcType) == CV_32F ? 1.0 : CV_MAT_DEPTH(srcType) == CV_16U ? 65535.0 : 255.0;
+  cv::randu(*src, 0, top);
   auto dst = std::make_shared<cv::Mat>(kHeight, kWidth, dstType);
   return {label, [src, dst, code] { cv::cvtColor(*src, *dst, code); }};
 }
@@ -294,6 +296,62 @@ const std::map<std::string, PeerFactory>& table() {
          return yuvPeer("libyuv I422ToRGB24", [](YuvFrame& f) {
            libyuv::I422ToRGB24(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
                                kWidth * 3, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420ToBGR565_8u16u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I420ToRGB565", [](YuvFrame& f) {
+           libyuv::I420ToRGB565(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
+                                kWidth * 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420ToBGR565Dither_8u16u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I420ToRGB565Dither", [](YuvFrame& f) {
+           static const uint8_t kDither[16] = {0, 4, 1, 5, 6, 2, 7, 3, 1, 5, 0, 4, 7, 3, 6, 2};
+           libyuv::I420ToRGB565Dither(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2,
+                                      f.argb.data(), kWidth * 2, kDither, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420ToBGR555_8u16u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I420ToARGB1555", [](YuvFrame& f) {
+           libyuv::I420ToARGB1555(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
+                                  kWidth * 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420ToBGR444_8u16u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I420ToARGB4444", [](YuvFrame& f) {
+           libyuv::I420ToARGB4444(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
+                                  kWidth * 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr422ToBGR565_8u16u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I422ToRGB565", [](YuvFrame& f) {
+           libyuv::I422ToRGB565(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
+                                kWidth * 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliBGR565ToYCbCr420_16u8u_C3P3R",
+       [] {
+         return yuvPeer("libyuv RGB565ToI420", [](YuvFrame& f) {
+           libyuv::RGB565ToI420(f.packed.data(), kWidth * 2, f.y2.data(), kWidth, f.u2.data(), kWidth / 2,
+                                f.v2.data(), kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliBGR555ToYCbCr420_16u8u_C3P3R",
+       [] {
+         return yuvPeer("libyuv ARGB1555ToI420", [](YuvFrame& f) {
+           libyuv::ARGB1555ToI420(f.packed.data(), kWidth * 2, f.y2.data(), kWidth, f.u2.data(), kWidth / 2,
+                                  f.v2.data(), kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliBGR565ToBGR_16u8u_C3R",
+       [] {
+         return yuvPeer("libyuv RGB565ToARGB", [](YuvFrame& f) {
+           libyuv::RGB565ToARGB(f.packed.data(), kWidth * 2, f.argb.data(), kWidth * 4, kWidth, kHeight);
          });
        }},
       {"zeliYCbCr422ToYCbCr420_8u_C2P3R",
