@@ -1,5 +1,6 @@
 #include "peers.h"
 
+#include <algorithm>
 #include <cstring>
 #include <map>
 #include <memory>
@@ -26,7 +27,9 @@ std::vector<uint8_t> frameBytes(size_t n) {
 #ifdef ZELCC_BENCH_OPENCV
 Peer cvtColorPeer(const char* label, int srcType, int dstType, int code) {
   auto src = std::make_shared<cv::Mat>(kHeight, kWidth, srcType);
-  cv::randu(*src, 0, 255);
+  // Float colours live in 0..1, integer ones over their range.
+  const double top = CV_MAT_DEPTH(srcType) == CV_32F ? 1.0 : CV_MAT_DEPTH(srcType) == CV_16U ? 65535.0 : 255.0;
+  cv::randu(*src, 0, top);
   auto dst = std::make_shared<cv::Mat>(kHeight, kWidth, dstType);
   return {label, [src, dst, code] { cv::cvtColor(*src, *dst, code); }};
 }
@@ -55,6 +58,80 @@ template <typename Call>
 std::vector<Peer> yuvPeer(const char* label, Call call) {
   auto f = std::make_shared<YuvFrame>();
   return {Peer{label, [f, call] { call(*f); }}};
+}
+#endif
+
+#ifdef ZELCC_BENCH_OPENCV
+// Exports whose nearest peer is one cvtColor call on whole frames.
+struct CvtRow {
+  const char* exportName;
+  const char* label;
+  int srcType, dstType, code;
+};
+const CvtRow kCvtRows[] = {
+    {"zeliRGBToGray_8u_C3C1R", "OpenCV cvtColor RGB2GRAY", CV_8UC3, CV_8UC1, cv::COLOR_RGB2GRAY},
+    {"zeliRGBToGray_8u_AC4C1R", "OpenCV cvtColor RGBA2GRAY", CV_8UC4, CV_8UC1, cv::COLOR_RGBA2GRAY},
+    {"zeliRGBToGray_16u_C3C1R", "OpenCV cvtColor RGB2GRAY 16u", CV_16UC3, CV_16UC1, cv::COLOR_RGB2GRAY},
+    {"zeliRGBToGray_32f_C3C1R", "OpenCV cvtColor RGB2GRAY 32f", CV_32FC3, CV_32FC1, cv::COLOR_RGB2GRAY},
+    {"zeliRGBToHLS_8u_C3R", "OpenCV cvtColor RGB2HLS_FULL", CV_8UC3, CV_8UC3, cv::COLOR_RGB2HLS_FULL},
+    {"zeliHLSToRGB_8u_C3R", "OpenCV cvtColor HLS2RGB_FULL", CV_8UC3, CV_8UC3, cv::COLOR_HLS2RGB_FULL},
+    {"zeliRGBToHLS_32f_C3R", "OpenCV cvtColor RGB2HLS 32f", CV_32FC3, CV_32FC3, cv::COLOR_RGB2HLS},
+    {"zeliHLSToRGB_32f_C3R", "OpenCV cvtColor HLS2RGB 32f", CV_32FC3, CV_32FC3, cv::COLOR_HLS2RGB},
+    {"zeliRGBToHSV_8u_C3R", "OpenCV cvtColor RGB2HSV_FULL", CV_8UC3, CV_8UC3, cv::COLOR_RGB2HSV_FULL},
+    {"zeliHSVToRGB_8u_C3R", "OpenCV cvtColor HSV2RGB_FULL", CV_8UC3, CV_8UC3, cv::COLOR_HSV2RGB_FULL},
+    {"zeliRGBToXYZ_8u_C3R", "OpenCV cvtColor RGB2XYZ", CV_8UC3, CV_8UC3, cv::COLOR_RGB2XYZ},
+    {"zeliXYZToRGB_8u_C3R", "OpenCV cvtColor XYZ2RGB", CV_8UC3, CV_8UC3, cv::COLOR_XYZ2RGB},
+    {"zeliRGBToXYZ_16u_C3R", "OpenCV cvtColor RGB2XYZ 16u", CV_16UC3, CV_16UC3, cv::COLOR_RGB2XYZ},
+    {"zeliRGBToXYZ_32f_C3R", "OpenCV cvtColor RGB2XYZ 32f", CV_32FC3, CV_32FC3, cv::COLOR_RGB2XYZ},
+    {"zeliXYZToRGB_32f_C3R", "OpenCV cvtColor XYZ2RGB 32f", CV_32FC3, CV_32FC3, cv::COLOR_XYZ2RGB},
+    {"zeliBGRToLab_8u_C3R", "OpenCV cvtColor LBGR2Lab", CV_8UC3, CV_8UC3, cv::COLOR_LBGR2Lab},
+    {"zeliLabToBGR_8u_C3R", "OpenCV cvtColor Lab2LBGR", CV_8UC3, CV_8UC3, cv::COLOR_Lab2LBGR},
+    {"zeliBGRToLab_32f_C3R", "OpenCV cvtColor LBGR2Lab 32f", CV_32FC3, CV_32FC3, cv::COLOR_LBGR2Lab},
+    {"zeliLabToBGR_32f_C3R", "OpenCV cvtColor Lab2LBGR 32f", CV_32FC3, CV_32FC3, cv::COLOR_Lab2LBGR},
+    {"zeliRGBToLUV_8u_C3R", "OpenCV cvtColor LRGB2Luv", CV_8UC3, CV_8UC3, cv::COLOR_LRGB2Luv},
+    {"zeliLUVToRGB_8u_C3R", "OpenCV cvtColor Luv2LRGB", CV_8UC3, CV_8UC3, cv::COLOR_Luv2LRGB},
+    {"zeliRGBToLUV_32f_C3R", "OpenCV cvtColor LRGB2Luv 32f", CV_32FC3, CV_32FC3, cv::COLOR_LRGB2Luv},
+    {"zeliLUVToRGB_32f_C3R", "OpenCV cvtColor Luv2LRGB 32f", CV_32FC3, CV_32FC3, cv::COLOR_Luv2LRGB},
+    {"zeliRGBToYUV_8u_C3R", "OpenCV cvtColor RGB2YUV", CV_8UC3, CV_8UC3, cv::COLOR_RGB2YUV},
+    {"zeliYUVToRGB_8u_C3R", "OpenCV cvtColor YUV2RGB", CV_8UC3, CV_8UC3, cv::COLOR_YUV2RGB},
+    {"zeliRGBToYCC_8u_C3R", "OpenCV cvtColor RGB2YCrCb", CV_8UC3, CV_8UC3, cv::COLOR_RGB2YCrCb},
+    {"zeliYCCToRGB_8u_C3R", "OpenCV cvtColor YCrCb2RGB", CV_8UC3, CV_8UC3, cv::COLOR_YCrCb2RGB},
+    {"zeliRGBToYCC_16u_C3R", "OpenCV cvtColor RGB2YCrCb 16u", CV_16UC3, CV_16UC3, cv::COLOR_RGB2YCrCb},
+    {"zeliYCCToRGB_16u_C3R", "OpenCV cvtColor YCrCb2RGB 16u", CV_16UC3, CV_16UC3, cv::COLOR_YCrCb2RGB},
+    {"zeliRGBToYCC_16s_C3R", "OpenCV cvtColor RGB2YCrCb 16u", CV_16UC3, CV_16UC3, cv::COLOR_RGB2YCrCb},
+    {"zeliRGBToYCC_32f_C3R", "OpenCV cvtColor RGB2YCrCb 32f", CV_32FC3, CV_32FC3, cv::COLOR_RGB2YCrCb},
+    {"zeliYCCToRGB_32f_C3R", "OpenCV cvtColor YCrCb2RGB 32f", CV_32FC3, CV_32FC3, cv::COLOR_YCrCb2RGB},
+};
+
+// Gamma of 8-bit samples: one table lookup per sample.
+Peer lutPeer() {
+  auto src = std::make_shared<cv::Mat>(kHeight, kWidth, CV_8UC3);
+  cv::randu(*src, 0, 255);
+  auto dst = std::make_shared<cv::Mat>(kHeight, kWidth, CV_8UC3);
+  auto table = std::make_shared<cv::Mat>(1, 256, CV_8U);
+  for (int i = 0; i < 256; ++i) table->at<uint8_t>(i) = uint8_t(255 - i);
+  return {"OpenCV LUT", [src, dst, table] { cv::LUT(*src, *table, *dst); }};
+}
+
+// A 3x4 matrix on every pixel.
+Peer transformPeer(int type) {
+  auto src = std::make_shared<cv::Mat>(kHeight, kWidth, type);
+  cv::randu(*src, 0, 255);
+  auto dst = std::make_shared<cv::Mat>(kHeight, kWidth, type);
+  auto m = std::make_shared<cv::Mat>(3, 4, CV_32F, cv::Scalar(0.25));
+  return {"OpenCV transform 3x4", [src, dst, m] { cv::transform(*src, *dst, *m); }};
+}
+
+// Maximum, then a scale to 8 bits.
+Peer toneMapPeer() {
+  auto src = std::make_shared<cv::Mat>(kHeight, kWidth, CV_32FC1);
+  cv::randu(*src, 0, 100);
+  auto dst = std::make_shared<cv::Mat>(kHeight, kWidth, CV_8UC1);
+  return {"OpenCV minMaxLoc + convertTo", [src, dst] {
+            double lo, hi;
+            cv::minMaxLoc(*src, &lo, &hi);
+            src->convertTo(*dst, CV_8U, 255.0 / hi);
+          }};
 }
 #endif
 
@@ -139,6 +216,8 @@ const std::map<std::string, PeerFactory>& table() {
        [] { return std::vector<Peer>{cvtColorPeer("OpenCV cvtColor RGB2YCrCb", CV_8UC3, CV_8UC3, cv::COLOR_RGB2YCrCb)}; }},
       {"zeliRGBToYCbCr_8u_AC4R",
        [] { return std::vector<Peer>{cvtColorPeer("OpenCV cvtColor RGBA2YCrCb", CV_8UC4, CV_8UC3, cv::COLOR_RGB2YCrCb)}; }},
+      {"zeliRGBToYUV420_8u_C3P3R",
+       [] { return std::vector<Peer>{cvtColorPeer("OpenCV cvtColor RGB2YUV_I420", CV_8UC3, CV_8UC1, cv::COLOR_RGB2YUV_I420)}; }},
       {"zeliYCbCrToRGB_8u_C3R",
        [] { return std::vector<Peer>{cvtColorPeer("OpenCV cvtColor YCrCb2RGB", CV_8UC3, CV_8UC3, cv::COLOR_YCrCb2RGB)}; }},
       {"zeliYCbCrToRGB_8u_AC4R",
@@ -178,6 +257,101 @@ const std::map<std::string, PeerFactory>& table() {
          return yuvPeer("libyuv I444ToRAW", [](YuvFrame& f) {
            libyuv::I444ToRAW(f.y.data(), kWidth, f.u444.data(), kWidth, f.v444.data(), kWidth, f.argb.data(),
                              kWidth * 3, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420ToBGR_8u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I420ToRGB24", [](YuvFrame& f) {
+           libyuv::I420ToRGB24(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
+                               kWidth * 3, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420ToBGR_8u_P3C4R",
+       [] {
+         return yuvPeer("libyuv I420ToARGB", [](YuvFrame& f) {
+           libyuv::I420ToARGB(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
+                              kWidth * 4, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420ToBGR_8u_P2C4R",
+       [] {
+         return yuvPeer("libyuv NV12ToARGB", [](YuvFrame& f) {
+           libyuv::NV12ToARGB(f.y.data(), kWidth, f.uv.data(), kWidth, f.argb.data(), kWidth * 4, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr422ToBGR_8u_C2C4R",
+       [] {
+         return yuvPeer("libyuv YUY2ToARGB", [](YuvFrame& f) {
+           libyuv::YUY2ToARGB(f.packed.data(), kWidth * 2, f.argb.data(), kWidth * 4, kWidth, kHeight);
+         });
+       }},
+      {"zeliCbYCr422ToBGR_8u_C2C4R",
+       [] {
+         return yuvPeer("libyuv UYVYToARGB", [](YuvFrame& f) {
+           libyuv::UYVYToARGB(f.packed.data(), kWidth * 2, f.argb.data(), kWidth * 4, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr422ToBGR_8u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I422ToRGB24", [](YuvFrame& f) {
+           libyuv::I422ToRGB24(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
+                               kWidth * 3, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420ToBGR565_8u16u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I420ToRGB565", [](YuvFrame& f) {
+           libyuv::I420ToRGB565(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
+                                kWidth * 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420ToBGR565Dither_8u16u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I420ToRGB565Dither", [](YuvFrame& f) {
+           static const uint8_t kDither[16] = {0, 4, 1, 5, 6, 2, 7, 3, 1, 5, 0, 4, 7, 3, 6, 2};
+           libyuv::I420ToRGB565Dither(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2,
+                                      f.argb.data(), kWidth * 2, kDither, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420ToBGR555_8u16u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I420ToARGB1555", [](YuvFrame& f) {
+           libyuv::I420ToARGB1555(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
+                                  kWidth * 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420ToBGR444_8u16u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I420ToARGB4444", [](YuvFrame& f) {
+           libyuv::I420ToARGB4444(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
+                                  kWidth * 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr422ToBGR565_8u16u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I422ToRGB565", [](YuvFrame& f) {
+           libyuv::I422ToRGB565(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
+                                kWidth * 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliBGR565ToYCbCr420_16u8u_C3P3R",
+       [] {
+         return yuvPeer("libyuv RGB565ToI420", [](YuvFrame& f) {
+           libyuv::RGB565ToI420(f.packed.data(), kWidth * 2, f.y2.data(), kWidth, f.u2.data(), kWidth / 2,
+                                f.v2.data(), kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliBGR555ToYCbCr420_16u8u_C3P3R",
+       [] {
+         return yuvPeer("libyuv ARGB1555ToI420", [](YuvFrame& f) {
+           libyuv::ARGB1555ToI420(f.packed.data(), kWidth * 2, f.y2.data(), kWidth, f.u2.data(), kWidth / 2,
+                                  f.v2.data(), kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliBGR565ToBGR_16u8u_C3R",
+       [] {
+         return yuvPeer("libyuv RGB565ToARGB", [](YuvFrame& f) {
+           libyuv::RGB565ToARGB(f.packed.data(), kWidth * 2, f.argb.data(), kWidth * 4, kWidth, kHeight);
          });
        }},
       {"zeliYCbCr422ToYCbCr420_8u_C2P3R",
@@ -243,6 +417,58 @@ const std::map<std::string, PeerFactory>& table() {
                               f.uv2.data(), kWidth, kWidth, kHeight);
          });
        }},
+      // RGB or BGR to subsampled YCbCr: libyuv's RGB24 holds B, G, R bytes,
+      // its RAW R, G, B; ARGB holds B, G, R, A.
+      {"zeliBGRToYCbCr420_8u_C3P3R",
+       [] {
+         return yuvPeer("libyuv RGB24ToI420", [](YuvFrame& f) {
+           libyuv::RGB24ToI420(f.argb.data(), kWidth * 3, f.y2.data(), kWidth, f.u2.data(), kWidth / 2, f.v2.data(),
+                               kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliRGBToYCbCr420_8u_C3P3R",
+       [] {
+         auto p = yuvPeer("libyuv RAWToI420", [](YuvFrame& f) {
+           libyuv::RAWToI420(f.argb.data(), kWidth * 3, f.y2.data(), kWidth, f.u2.data(), kWidth / 2, f.v2.data(),
+                             kWidth / 2, kWidth, kHeight);
+         });
+#ifdef ZELCC_BENCH_OPENCV
+         p.push_back(cvtColorPeer("OpenCV cvtColor RGB2YUV_I420", CV_8UC3, CV_8UC1, cv::COLOR_RGB2YUV_I420));
+#endif
+         return p;
+       }},
+      {"zeliBGRToYCbCr420_8u_AC4P3R",
+       [] {
+         return yuvPeer("libyuv ARGBToI420", [](YuvFrame& f) {
+           libyuv::ARGBToI420(f.argb.data(), kWidth * 4, f.y2.data(), kWidth, f.u2.data(), kWidth / 2, f.v2.data(),
+                              kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliRGBToYCbCr420_8u_C4P2R",
+       [] {
+         return yuvPeer("libyuv ABGRToNV12", [](YuvFrame& f) {
+           libyuv::ABGRToNV12(f.argb.data(), kWidth * 4, f.y2.data(), kWidth, f.uv2.data(), kWidth, kWidth, kHeight);
+         });
+       }},
+      {"zeliBGRToYCbCr422_8u_AC4P3R",
+       [] {
+         return yuvPeer("libyuv ARGBToI422", [](YuvFrame& f) {
+           libyuv::ARGBToI422(f.argb.data(), kWidth * 4, f.y2.data(), kWidth, f.u2.data(), kWidth / 2, f.v2.data(),
+                              kWidth / 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliBGRToYCbCr422_8u_AC4C2R",
+       [] {
+         return yuvPeer("libyuv ARGBToYUY2", [](YuvFrame& f) {
+           libyuv::ARGBToYUY2(f.argb.data(), kWidth * 4, f.packed2.data(), kWidth * 2, kWidth, kHeight);
+         });
+       }},
+      {"zeliBGRToCbYCr422_8u_AC4C2R",
+       [] {
+         return yuvPeer("libyuv ARGBToUYVY", [](YuvFrame& f) {
+           libyuv::ARGBToUYVY(f.argb.data(), kWidth * 4, f.packed2.data(), kWidth * 2, kWidth, kHeight);
+         });
+       }},
       {"zeliYCbCr422ToGray_8u_C2C1R",
        [] {
          return yuvPeer("libyuv YUY2ToY", [](YuvFrame& f) {
@@ -264,12 +490,29 @@ Peer memcpyPeer(size_t bytes) {
 
 std::vector<Peer> peersOf(const std::string& exportName) {
   auto it = table().find(exportName);
-  return it == table().end() ? std::vector<Peer>{} : it->second();
+  std::vector<Peer> out = it == table().end() ? std::vector<Peer>{} : it->second();
+#ifdef ZELCC_BENCH_OPENCV
+  for (const CvtRow& row : kCvtRows)
+    if (exportName == row.exportName) out.push_back(cvtColorPeer(row.label, row.srcType, row.dstType, row.code));
+  if (exportName == "zeliGammaFwd_8u_C3R" || exportName == "zeliGammaInv_8u_C3R") out.push_back(lutPeer());
+  if (exportName == "zeliColorTwist32f_8u_C3R") out.push_back(transformPeer(CV_8UC3));
+  if (exportName == "zeliColorTwist32f_32f_C3R") out.push_back(transformPeer(CV_32FC3));
+  if (exportName == "zeliToneMapLinear_32f8u_C1R") out.push_back(toneMapPeer());
+#endif
+  return out;
 }
 
 std::vector<std::string> exportsWithPeers() {
   std::vector<std::string> out;
   for (const auto& [name, factory] : table()) out.push_back(name);
+#ifdef ZELCC_BENCH_OPENCV
+  for (const CvtRow& row : kCvtRows) out.push_back(row.exportName);
+  for (const char* n : {"zeliGammaFwd_8u_C3R", "zeliGammaInv_8u_C3R", "zeliColorTwist32f_8u_C3R",
+                        "zeliColorTwist32f_32f_C3R", "zeliToneMapLinear_32f8u_C1R"})
+    out.push_back(n);
+#endif
+  std::sort(out.begin(), out.end());
+  out.erase(std::unique(out.begin(), out.end()), out.end());
   return out;
 }
 

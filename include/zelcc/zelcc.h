@@ -150,6 +150,94 @@ ZELCC_API Status zeliYCCToRGB_32f_C3R(const float* src, int srcStep, float* dst,
 ZELCC_API Status zeliYCCToRGB_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size);
 
 /* ---- RGB to and from chroma-subsampled YCbCr and YUV ---- */
+/* RGB or BGR to subsampled video-range YCbCr; 4:2:0 members leave a last odd row and column unwritten. */
+ZELCC_API Status zeliBGRToCbYCr422_709HDTV_8u_AC4C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToCbYCr422_709HDTV_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToCbYCr422_8u_AC4C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr411_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr411_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr420_709CSC_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr420_709CSC_8u_C3P2R(const uint8_t* src, int srcStep, uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr420_709CSC_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr420_709HDTV_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr420_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr420_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr422_8u_AC4C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr422_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGRToYCbCr422_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCrCb420_709CSC_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCrCb420_709CSC_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCrCb420_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliBGRToYCrCb420_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToCbYCr422Gamma_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToCbYCr422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr420_8u_C3P2R(const uint8_t* src, int srcStep, uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr420_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr420_8u_C4P2R(const uint8_t* src, int srcStep, uint8_t* dstY, int dstYStep, uint8_t* dstCbCr, int dstCbCrStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr422_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYCbCr422_8u_P3C2R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCrCb420_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYCrCb422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYCrCb422_8u_P3C2R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+/* RGB or BGR to subsampled full-range YUV; the names without steps take tightly packed images. */
+ZELCC_API Status zeliBGRToYUV420_8u_AC4P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV420_8u_C3P3(const uint8_t* src, uint8_t* const dstPlanes[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV420_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV420_8u_P3(const uint8_t* const srcPlanes[3], uint8_t* const dstPlanes[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV420_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToYUV422_8u_C3P3(const uint8_t* src, uint8_t* const dstPlanes[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV422_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV422_8u_P3(const uint8_t* const srcPlanes[3], uint8_t* const dstPlanes[3], ImageSize size);
+ZELCC_API Status zeliRGBToYUV422_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3], const int dstSteps[3], ImageSize size);
+
+/* Subsampled YCbCr and YUV to RGB or BGR with 8-bit channels; 4:2:0 members leave a last odd row and column unwritten and warn, 4:2:2 members give a last odd pixel the chroma of its pair. */
+ZELCC_API Status zeliCbYCr422ToBGR_709HDTV_8u_C2C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliCbYCr422ToBGR_709HDTV_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliCbYCr422ToBGR_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliCbYCr422ToRGB_8u_C2C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr411ToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr411ToBGR_8u_P3C4R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCr420ToBGR_709CSC_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR_709HDTV_8u_P3C4R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCr420ToBGR_8u_P2C3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR_8u_P2C4R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCr420ToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR_8u_P3C4R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCr420ToRGB_8u_P2C3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToRGB_8u_P2C4R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCr420ToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR_8u_C2C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCr422ToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB_8u_C2C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCbCr422ToRGB_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCrCb420ToBGR_8u_P2C3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCrCb, int srcCrCbStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCrCb420ToBGR_8u_P2C4R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCrCb, int srcCrCbStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCrCb420ToRGB_8u_P2C3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCrCb, int srcCrCbStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCrCb420ToRGB_8u_P2C4R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCrCb, int srcCrCbStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCrCb420ToRGB_8u_P3C4R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCrCb422ToBGR_8u_C2C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCrCb422ToBGR_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCrCb422ToRGB_8u_C2C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCrCb422ToRGB_8u_C2C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size, uint8_t alpha);
+ZELCC_API Status zeliYCrCb422ToRGB_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3], int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToBGR_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB_8u_P3(const uint8_t* const srcPlanes[3], uint8_t* const dstPlanes[3], ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB_8u_P3AC4R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB_8u_P3C3(const uint8_t* const srcPlanes[3], uint8_t* dst, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB_8u_P3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* const dstPlanes[3], int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV422ToRGB_8u_C2C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV422ToRGB_8u_P3(const uint8_t* const srcPlanes[3], uint8_t* const dstPlanes[3], ImageSize size);
+ZELCC_API Status zeliYUV422ToRGB_8u_P3AC4R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV422ToRGB_8u_P3C3(const uint8_t* const srcPlanes[3], uint8_t* dst, ImageSize size);
+ZELCC_API Status zeliYUV422ToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV422ToRGB_8u_P3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint8_t* const dstPlanes[3], int dstStep, ImageSize size);
 
 /* ---- Repacking between subsampled layouts ---- */
 ZELCC_API Status zeliCbYCr422ToYCbCr411_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size);
@@ -237,6 +325,165 @@ ZELCC_API Status zeliYCrCb420ToBGR_Filter_8u_P3C4R(const uint8_t* const src[3], 
                                                    int dstStep, ImageSize size, uint8_t alpha);
 
 /* ---- 16-bit packed RGB ---- */
+ZELCC_API Status zeliBGR555ToYCbCr411_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                  ImageSize size);
+ZELCC_API Status zeliBGR555ToYCbCr420_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                  ImageSize size);
+ZELCC_API Status zeliBGR555ToYCbCr422_16u8u_C3C2R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGR555ToYCbCr422_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                  ImageSize size);
+ZELCC_API Status zeliBGR555ToYCrCb420_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                  ImageSize size);
+ZELCC_API Status zeliBGR555ToYUV420_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                ImageSize size);
+ZELCC_API Status zeliBGR565ToBGR_16u8u_C3R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGR565ToYCbCr411_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                  ImageSize size);
+ZELCC_API Status zeliBGR565ToYCbCr420_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                  ImageSize size);
+ZELCC_API Status zeliBGR565ToYCbCr422_16u8u_C3C2R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliBGR565ToYCbCr422_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                  ImageSize size);
+ZELCC_API Status zeliBGR565ToYCrCb420_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                  ImageSize size);
+ZELCC_API Status zeliBGR565ToYUV420_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                ImageSize size);
+ZELCC_API Status zeliRGB565ToRGB_16u8u_C3R(const uint16_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGB565ToYUV420_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                ImageSize size);
+ZELCC_API Status zeliRGB565ToYUV422_16u8u_C3P3R(const uint16_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],
+                                                ImageSize size);
+
+/* Writers: each colour reduced to its field by truncation or, in the Dither
+ * names, by a 4 x 4 ordered dither counted from the region's corner. The
+ * destination step is taken as whole 16-bit words (an odd step loses its
+ * low bit). Plane sources take one step per plane. */
+ZELCC_API Status zeliBGRToBGR565_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliRGBToRGB565_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr411ToBGR555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr411ToBGR565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR444_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                               int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                               int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                               int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB444_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                               int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                               int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                               int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR444Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                     int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR555Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                     int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR565Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                     int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB444Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                     int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB555Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                     int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB565Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                     int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR444_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR555_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR565_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB444_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB555_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB565_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR444Dither_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR555Dither_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToBGR565Dither_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB444Dither_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB555Dither_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCrToRGB565Dither_8u16u_C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR444_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB444_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR444Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                        int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR555Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                        int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR565Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                        int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB444Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                        int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB555Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                        int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB565Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                        int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR444_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR555_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR565_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB444_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB555_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB565_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR444Dither_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR555Dither_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToBGR565Dither_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB444Dither_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB555Dither_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr422ToRGB565Dither_8u16u_C2C3R(const uint8_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR444_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToRGB444_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToRGB555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToRGB565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                  int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR444Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                        int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR555Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                        int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToBGR565Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                        int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToRGB444Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                        int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToRGB555Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                        int dstStep, ImageSize size);
+ZELCC_API Status zeliYCbCr420ToRGB565Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                        int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToBGR444_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToBGR555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToBGR565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB444_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB555_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB565_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToBGR444Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToBGR555Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToBGR565Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB444Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB555Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                      int dstStep, ImageSize size);
+ZELCC_API Status zeliYUV420ToRGB565Dither_8u16u_P3C3R(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst,
+                                                      int dstStep, ImageSize size);
 
 /* ---- YCoCg ---- */
 /* Interleaved BGR (RGB for the byte-plane pair) to and from planes Y, Co, Cg

@@ -238,6 +238,8 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       // with =dst the source's step stays a byte count.
       d.stepsInSamples = true;
       d.srcStepInBytes = word != "samplesteps";
+    } else if (word == "onecolumnbytes") {
+      d.oneColumnBytes = true;
     } else if (word == "alphawritten") {
       d.writesAlpha = true;
     } else if (word.rfind("planestested=", 0) == 0) {
@@ -391,6 +393,10 @@ bool describe(const std::string& name, const std::string& extras, Descriptor& d,
   }
   describeFormat(srcFormat, d.src);
   describeFormat(dstFormat, d.dst);
+  // Planes converted to or from packed words take a step per plane, at full
+  // resolution too.
+  if (d.dst.packedWord) d.src.planeSteps = true;
+  if (d.src.packedWord) d.dst.planeSteps = true;
 
   if (!parseExtras(extras, d, error)) return false;
 
@@ -525,15 +531,29 @@ void Memory::release() {
 
 Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offset, Fence fence, int stepSign)
     : d_(d), size_(size), pad_(padBytes) {
-  if (!d.region) stepSign = 1;
+  // Names without steps take tightly packed images, rows going down.
+  if (!d.region) {
+    pad_ = padBytes = 0;
+    stepSign = 1;
+  }
+  // Per buffer, what a row step is cut down to: whole samples of this many
+  // bytes, or 0 for half the step (see oneColumnBytes).
+  std::vector<int> stepUnits;
   const int w = std::max(std::max(size.width, 0), d.roomWidth), h = std::max(std::max(size.height, 0), d.roomHeight);
   auto addSide = [&](const Side& side, int sideIndex) {
     for (int p = 0; p < side.planes(); ++p) {
       Buffer b;
       b.geometry = planeGeometry(side, p, w, h);
+      // Their 4:2:0 chroma rows are width >> 1 samples long.
+      if (!d.region && side.chroma == Chroma::S420 && side.isPlanar() && p > 0) b.geometry.rowBytes = w >> 1;
       b.step = b.geometry.rowBytes + padBytes;
       const bool inSamples = d.stepsInSamples && !(sideIndex == 0 && d.srcStepInBytes);
-      b.pitch = inSamples ? b.geometry.sampleBytes : 1;  // the unit of `pitch` until placed
+      int unit = inSamples ? b.geometry.sampleBytes : 1;
+      if (d.oneColumnBytes && sideIndex == 1 && size.width == 1) {
+        b.geometry.rowBytes = 3;
+        unit = 0;
+      }
+      stepUnits.push_back(unit);
       b.side = sideIndex;
       b.plane = p;
       b.isSource = sideIndex != 1;
@@ -551,10 +571,10 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
     // Every byte of the rows belongs to the call; guards lie outside them.
     Buffer b;
     b.step = (w + d.scratchPad) * sampleBytes(d.src.sample) + padBytes;
-    b.pitch = 1;
     b.geometry = PlaneGeometry{b.step, d.scratchRows, 1};
     b.side = 3;
     buffers_.push_back(std::move(b));
+    stepUnits.push_back(1);
   }
   for (const Extra& e : d.extras) {
     // Floats 0.25 behind a pointer; a fenced record is exactly as long as
@@ -568,13 +588,15 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
     }
     extraBuffers_.push_back(std::move(m));
   }
-  for (Buffer& b : buffers_) {
+  for (size_t k = 0; k < buffers_.size(); ++k) {
     // Steps by sign; the rows lie where a member taking them in whole
-    // samples (rounding down) puts them.
-    const int unit = b.pitch;
+    // samples (rounding down) or halved puts them.
+    Buffer& b = buffers_[k];
+    const int unit = stepUnits[k];
     const int sign = b.side == 3 ? 1 : stepSign;
     b.step = sign > 0 ? b.step : sign < 0 ? -b.step : 0;
-    b.pitch = b.step >= 0 ? b.step / unit * unit : -((-b.step + unit - 1) / unit * unit);
+    if (unit == 0) b.pitch = b.step >> 1;
+    else b.pitch = b.step >= 0 ? b.step / unit * unit : -((-b.step + unit - 1) / unit * unit);
     const int rows = std::max(b.geometry.rows, 1);
     const ptrdiff_t last = ptrdiff_t(rows - 1) * b.pitch;
     const ptrdiff_t low = std::min<ptrdiff_t>(0, last);  // lowest row start, from the first row's

@@ -28,10 +28,11 @@ struct Side {
   Sample sample = Sample::U8;
   Chroma chroma = Chroma::Full;
   bool packedWord = false;  // one 16-bit word a pixel
+  bool planeSteps = false;  // full-resolution planes that still take a step each
   int planes() const;
   int channels() const;  // samples a pixel in an interleaved layout
   bool isPlanar() const { return layout == Layout::P2 || layout == Layout::P3 || layout == Layout::P4 || layout == Layout::AP4; }
-  bool stepPerPlane() const { return layout == Layout::P3 && chroma != Chroma::Full; }
+  bool stepPerPlane() const { return layout == Layout::P3 && (chroma != Chroma::Full || planeSteps); }
 };
 
 struct PlaneGeometry {
@@ -112,6 +113,9 @@ struct Descriptor {
   int testedPlanes = 0;       // plane entries tested for null per array; 0: all
   bool stepsInSamples = false;  // byte steps are cut down to whole samples
   bool srcStepInBytes = false;  // ... except the source's
+  // At width 1 the destination takes three bytes a row, rows half the step
+  // apart (the one-column path of the interleaved 4:2:2 packed writers).
+  bool oneColumnBytes = false;
   // The source is a frame given with a region (the whole frame in a
   // workspace); the size argument is the frame's.
   bool frameSource = false;

@@ -129,6 +129,12 @@ struct OutPlanes3 {
 
 bool anyNull3(const void* const* planes) { return !planes[0] || !planes[1] || !planes[2]; }
 
+// A plane set is missing when its array, its steps or any plane is null.
+template <typename T>
+bool missingPlanes(T* const* planes, const int* steps) {
+  return !planes || !steps || anyNull3(reinterpret_cast<const void* const*>(planes));
+}
+
 void copyLuma(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, int width, int height) {
   plainWalk(height, [&](int y) { std::memcpy(rowAt(dst, dstStep, y), rowAt(src, srcStep, y), size_t(width)); });
 }
@@ -261,27 +267,21 @@ using zel::rowAt;
 
 ZEL_PUBLIC Status zeliYCbCr1620To420_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3],
                                             const int dstStep[3], ImageSize size) {
-  if (!src || !srcStep || anyNull3(reinterpret_cast<const void* const*>(src)) || !dst || !dstStep ||
-      anyNull3(reinterpret_cast<const void* const*>(dst)))
-    return StatusNullPointerError;
+  if (missingPlanes(src, srcStep) || missingPlanes(dst, dstStep)) return StatusNullPointerError;
   return grow1620To420({{src[0], src[1], src[2]}, {srcStep[0], srcStep[1], srcStep[2]}},
                        {{dst[0], dst[1], dst[2]}, {dstStep[0], dstStep[1], dstStep[2]}}, size);
 }
 
 ZEL_PUBLIC Status zeliYCbCr420To1620_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3],
                                             const int dstStep[3], ImageSize size) {
-  if (!src || !srcStep || anyNull3(reinterpret_cast<const void* const*>(src)) || !dst || !dstStep ||
-      anyNull3(reinterpret_cast<const void* const*>(dst)))
-    return StatusNullPointerError;
+  if (missingPlanes(src, srcStep) || missingPlanes(dst, dstStep)) return StatusNullPointerError;
   return shrink420To1620({{src[0], src[1], src[2]}, {srcStep[0], srcStep[1], srcStep[2]}},
                          {{dst[0], dst[1], dst[2]}, {dstStep[0], dstStep[1], dstStep[2]}}, size);
 }
 
 ZEL_PUBLIC Status zeliYCbCr422To420_Interlace_8u_P3R(const uint8_t* const src[3], const int srcStep[3],
                                                      uint8_t* const dst[3], const int dstStep[3], ImageSize size) {
-  if (!src || !srcStep || anyNull3(reinterpret_cast<const void* const*>(src)) || !dst || !dstStep ||
-      anyNull3(reinterpret_cast<const void* const*>(dst)))
-    return StatusNullPointerError;
+  if (missingPlanes(src, srcStep) || missingPlanes(dst, dstStep)) return StatusNullPointerError;
   int width, height;
   const Status s = interlaceSize(size, width, height);
   if (s < 0) return s;
@@ -293,7 +293,7 @@ ZEL_PUBLIC Status zeliYCbCr422To420_Interlace_8u_P3R(const uint8_t* const src[3]
 
 ZEL_PUBLIC Status zeliCbYCr422ToYCbCr420_Interlace_8u_C2P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3],
                                                             const int dstStep[3], ImageSize size) {
-  if (!src || !dst || !dstStep || anyNull3(reinterpret_cast<const void* const*>(dst))) return StatusNullPointerError;
+  if (!src || missingPlanes(dst, dstStep)) return StatusNullPointerError;
   int width, height;
   const Status s = interlaceSize(size, width, height);
   if (s < 0) return s;
@@ -316,9 +316,7 @@ ZEL_PUBLIC Status zeliCbYCr422ToYCbCr420_Interlace_8u_C2P3R(const uint8_t* src, 
 
 ZEL_PUBLIC Status zeliYCbCr420To422_Interlace_8u_P3R(const uint8_t* const src[3], const int srcStep[3],
                                                      uint8_t* const dst[3], const int dstStep[3], ImageSize size) {
-  if (!src || !srcStep || anyNull3(reinterpret_cast<const void* const*>(src)) || !dst || !dstStep ||
-      anyNull3(reinterpret_cast<const void* const*>(dst)))
-    return StatusNullPointerError;
+  if (missingPlanes(src, srcStep) || missingPlanes(dst, dstStep)) return StatusNullPointerError;
   int width, height;
   const Status s = interlaceSize(size, width, height);
   if (s < 0) return s;
@@ -338,7 +336,7 @@ ZEL_PUBLIC Status zeliYCbCr420To422_Interlace_8u_P3R(const uint8_t* const src[3]
 
 ZEL_PUBLIC Status zeliYCbCr420ToCbYCr422_Interlace_8u_P3C2R(const uint8_t* const src[3], const int srcStep[3],
                                                             uint8_t* dst, int dstStep, ImageSize size) {
-  if (!src || !srcStep || anyNull3(reinterpret_cast<const void* const*>(src)) || !dst) return StatusNullPointerError;
+  if (missingPlanes(src, srcStep) || !dst) return StatusNullPointerError;
   int width, height;
   const Status s = interlaceSize(size, width, height);
   if (s < 0) return s;
@@ -369,9 +367,7 @@ void halfSampleOut(RowOf rowOf, ImageSize used, uint8_t* const dst[3], const int
 
 Status halfSampleP3(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3], const int dstStep[3],
                     ImageSize size, bool crFirst) {
-  if (!src || !srcStep || anyNull3(reinterpret_cast<const void* const*>(src)) || !dst || !dstStep ||
-      anyNull3(reinterpret_cast<const void* const*>(dst)))
-    return StatusNullPointerError;
+  if (missingPlanes(src, srcStep) || missingPlanes(dst, dstStep)) return StatusNullPointerError;
   int width, height;
   if (halfSampleSize(size, width, height) != StatusOk) return StatusSizeError;
   copyLuma(src[0], srcStep[0], dst[0], dstStep[0], width, height);
@@ -398,8 +394,7 @@ ZEL_PUBLIC Status zeliYCrCb420ToYCbCr422_Filter_8u_P3R(const uint8_t* const src[
 ZEL_PUBLIC Status zeliYCbCr420ToYCbCr422_Filter_8u_P2P3R(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr,
                                                          int srcCbCrStep, uint8_t* const dst[3], const int dstStep[3],
                                                          ImageSize size) {
-  if (!srcY || !srcCbCr || !dst || !dstStep || anyNull3(reinterpret_cast<const void* const*>(dst)))
-    return StatusNullPointerError;
+  if (!srcY || !srcCbCr || missingPlanes(dst, dstStep)) return StatusNullPointerError;
   int width, height;
   if (halfSampleSize(size, width, height) != StatusOk) return StatusSizeError;
   copyLuma(srcY, srcYStep, dst[0], dstStep[0], width, height);

@@ -36,8 +36,8 @@ inline void bgrWide(int y, int cr8, int cb8, uint8_t* bgr) {
 
 // The 16-bit lane form of the body.
 inline void bgrLanes(int y8, int cr8, int cb8, uint8_t* bgr) {
-  const int16_t y = MulHighS16(int16_t((y8 - 16) << 7), kLuma12);
-  const int16_t cr = int16_t((cr8 - 128) << 7), cb = int16_t((cb8 - 128) << 7);
+  const int16_t y = MulHighS16(int16_t((y8 - 16) * 128), kLuma12);
+  const int16_t cr = int16_t((cr8 - 128) * 128), cb = int16_t((cb8 - 128) * 128);
   bgr[2] = SaturateU8(int16_t(y + MulHighS16(cr, kCrToR12)) >> 3);
   bgr[1] = SaturateU8(int16_t(y - MulHighS16(cb, kCbToG12) - MulHighS16(cr, kCrToG12)) >> 3);
   bgr[0] = SaturateU8(int16_t(y + MulHighS16(cb, kCbToB12)) >> 3);

@@ -74,22 +74,25 @@ uint8_t* at(const Side& s, int plane, int row, int offset) { return rowAt(s.p[pl
 
 // Reads luma row `lumaRow` (slot `ly`) and, when `chromaRow` >= 0, chroma
 // row `chromaRow` (slot `cy`) of the columns [x, x + n) into planar rows.
+// A pair stream's luma goes to `lumaTarget` when given (the destination's
+// own luma row), else to staging.
 void readRows(const Layout& l, const Side& s, int lumaRow, int chromaRow, int ly, int cy, int x, int n, Staging& st,
-              Rows& r) {
+              Rows& r, uint8_t* lumaTarget) {
   const int cx = l.scheme == Scheme::S411 ? x / 4 : x / 2;
   const int cn = chromaWidth(l.scheme, n);
   switch (l.kind) {
     case Kind::Pairs: {
       // Luma and chroma share the row of a pair stream.
       const uint8_t* in = at(s, 0, lumaRow, 2 * x);
+      uint8_t* luma = lumaTarget ? lumaTarget : st.y[ly];
       if (chromaRow >= 0) {
-        splitPairs(in, l.order, st.y[ly], st.cb[cy], st.cr[cy], n);
+        splitPairs(in, l.order, luma, st.cb[cy], st.cr[cy], n);
         r.cb[cy] = st.cb[cy];
         r.cr[cy] = st.cr[cy];
       } else {
-        lumaOfPairs(in, l.order, st.y[ly], n);
+        lumaOfPairs(in, l.order, luma, n);
       }
-      r.y[ly] = st.y[ly];
+      r.y[ly] = luma;
       return;
     }
     case Kind::TwoPlanes:
@@ -133,12 +136,12 @@ void writeRow(const Layout& l, const Side& s, int lumaRow, int chromaRow, const 
       mergePairs(y, cb, cr, l.order, at(s, 0, lumaRow, 2 * x), n, nonTemporal);
       return;
     case Kind::TwoPlanes:
-      copyBytes(y, at(s, 0, lumaRow, x), n, nonTemporal || streamLuma);
-      if (chromaRow >= 0) zip(cb, cr, at(s, 1, chromaRow, 2 * cx), cn, nonTemporal);
-      return;
-    case Kind::Planes:
-      copyBytes(y, at(s, 0, lumaRow, x), n, nonTemporal || streamLuma);
-      return;  // chroma was written in place
+    case Kind::Planes: {
+      uint8_t* luma = at(s, 0, lumaRow, x);
+      if (y != luma) copyBytes(y, luma, n, nonTemporal || streamLuma);  // else already unpacked in place
+      if (l.kind == Kind::TwoPlanes && chromaRow >= 0) zip(cb, cr, at(s, 1, chromaRow, 2 * cx), cn, nonTemporal);
+      return;  // planes took their chroma in place
+    }
   }
 }
 
@@ -162,6 +165,27 @@ void convertChroma(Scheme from, Scheme to, const uint8_t* const* in, uint8_t* co
     zip(in[0], in[1], out[0], cn / 2, nonTemporal);  // two rows interleave into one
   } else {                                           // 4:2:0 to 4:1:1, the inverse
     unzip(in[0], out[0], out[1], cn);
+  }
+}
+
+// Pair streams and two planes unpacked straight into destination planes,
+// for the rules that only keep, drop or repeat whole chroma rows.
+void unpackIntoPlanes(const Member& m, const Side& src, const Side& dst, int width, int height) {
+  const int cw = chromaWidth(m.dst.scheme, width);
+  for (int y = 0; y < height; ++y) {
+    const bool dstHalf = m.dst.scheme == Scheme::S420;
+    const int dstChroma = dstHalf ? ((y & 1) ? -1 : y / 2) : y;
+    const int srcChroma = m.src.scheme == Scheme::S420 ? y / 2 : y;
+    uint8_t* luma = at(dst, 0, y, 0);
+    if (m.src.kind == Kind::Pairs) {
+      if (dstChroma >= 0)
+        splitPairs(at(src, 0, y, 0), m.src.order, luma, at(dst, 1, dstChroma, 0), at(dst, 2, dstChroma, 0), width);
+      else
+        lumaOfPairs(at(src, 0, y, 0), m.src.order, luma, width);
+    } else {
+      std::memcpy(luma, at(src, 0, y, 0), size_t(width));
+      if (dstChroma >= 0) unzip(at(src, 1, srcChroma, 0), at(dst, 1, dstChroma, 0), at(dst, 2, dstChroma, 0), cw);
+    }
   }
 }
 
@@ -221,6 +245,18 @@ Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
                         (m.src.scheme == Scheme::S422 && m.dst.scheme == Scheme::S420) ||
                         (m.src.scheme == Scheme::S420 && m.dst.scheme == Scheme::S422);
 
+  if (m.src.kind == Kind::Pairs && m.dst.kind == Kind::Pairs) {
+    // 4:2:2 streams of two byte orders: one byte permutation a row.
+    for (int y = 0; y < height; ++y)
+      reorderPairs(at(src, 0, y, 0), m.src.order, at(dst, 0, y, 0), m.dst.order, width, nonTemporal);
+    if (nonTemporal) _mm_sfence();
+    return StatusOk;
+  }
+  if (moveOnly && m.dst.kind == Kind::Planes && m.src.kind != Kind::Planes) {
+    unpackIntoPlanes(m, src, dst, width, height);
+    return StatusOk;
+  }
+
   Staging st;
   for (int g = 0; g + groupRows <= height; g += groupRows) {
     for (int x = 0; x < width; x += kChunk) {
@@ -228,7 +264,12 @@ Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
       Rows r{};
       for (int k = 0; k < groupRows; ++k) {
         const int chromaRow = k < srcChromaRows ? (srcChromaRows == 1 ? g / groupRows : g + k) : -1;
-        readRows(m.src, src, g + k, chromaRow, k, k, x, n, st, r);
+        // Pair-stream luma lands in the destination's luma row directly,
+        // unless that row is to be streamed.
+        uint8_t* lumaTarget = m.src.kind == Kind::Pairs && m.dst.kind != Kind::Pairs && !nonTemporal && !streamLuma
+                                  ? at(dst, 0, g + k, x)
+                                  : nullptr;
+        readRows(m.src, src, g + k, chromaRow, k, k, x, n, st, r, lumaTarget);
       }
       // Chroma rule, written straight into destination planes or staged
       // for a pair stream or two planes.

@@ -112,7 +112,39 @@ ZEL_AVX2 int unzipAvx(const uint8_t* in, uint8_t* a, uint8_t* b, int n) {
   return k;
 }
 
+// Byte moves of one pair order into another, for 16 bytes (four pairs).
+Mask reorderMask(PairOrder from, PairOrder to) {
+  const PairSlots f = slotsOf(from), t = slotsOf(to);
+  Mask m{};
+  for (int p = 0; p < 4; ++p) {
+    m[4 * p + t.y0] = int8_t(4 * p + f.y0);
+    m[4 * p + t.y1] = int8_t(4 * p + f.y1);
+    m[4 * p + t.cb] = int8_t(4 * p + f.cb);
+    m[4 * p + t.cr] = int8_t(4 * p + f.cr);
+  }
+  return m;
+}
+
+ZEL_AVX2 int reorderPairsAvx(const uint8_t* in, const Mask& mask, uint8_t* out, int pixels, bool nonTemporal) {
+  const __m256i m = _mm256_broadcastsi128_si256(maskOf(mask));
+  int x = 0;
+  for (; x + 16 <= pixels; x += 16) put256(out + 2 * x, _mm256_shuffle_epi8(load256(in + 2 * x), m), nonTemporal);
+  return x;
+}
+
 }  // namespace
+
+void reorderPairs(const uint8_t* in, PairOrder from, uint8_t* out, PairOrder to, int pixels, bool nonTemporal) {
+  const Mask mask = reorderMask(from, to);
+  int x = hasAvx2() ? reorderPairsAvx(in, mask, out, pixels, nonTemporal) : 0;
+  const __m128i m = maskOf(mask);
+  for (; x + 8 <= pixels; x += 8) put(out + 2 * x, _mm_shuffle_epi8(load128(in + 2 * x), m), nonTemporal);
+  for (; x < pixels; x += 2) {
+    uint8_t y[2], cb, cr;
+    splitPair(in + 2 * x, from, y, &cb, &cr);
+    mergePair(y, cb, cr, to, out + 2 * x);
+  }
+}
 
 void splitPairs(const uint8_t* in, PairOrder o, uint8_t* y, uint8_t* cb, uint8_t* cr, int pixels) {
   const __m128i g = maskOf(kGather[int(o)]);

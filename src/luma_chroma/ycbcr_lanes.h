@@ -42,8 +42,8 @@ struct Rgb8 {
 
 // ---- scalar forms ----
 
-inline int16_t lumaLane(int y) { return static_cast<int16_t>((y - 16) << 7); }
-inline int16_t chromaLane(int c) { return static_cast<int16_t>((c - 128) << 7); }
+inline int16_t lumaLane(int y) { return static_cast<int16_t>((y - 16) * 128); }
+inline int16_t chromaLane(int c) { return static_cast<int16_t>((c - 128) * 128); }
 
 // Lane form, added: every term is added with its signed constant, then
 // k (8 or 0) and an arithmetic shift by 4. The sums before SaturateU8.

@@ -193,7 +193,7 @@ namespace yuv_detail {
 // A 16.16 constant c as w * 65536 + f with f a signed 16-bit value:
 // (c x + r) >> 16 = w x + ((f x + r) >> 16), exactly.
 constexpr int32_t wholePart(int32_t c) { return (c + 32768) >> 16; }
-constexpr int32_t fractionPart(int32_t c) { return c - (wholePart(c) << 16); }
+constexpr int32_t fractionPart(int32_t c) { return c - wholePart(c) * 65536; }
 
 }  // namespace yuv_detail
 

@@ -7,23 +7,8 @@
 
 namespace zel::spaces::hsv {
 
-namespace sse {
-using namespace zel::lanes;
-#define ZEL_KERNEL ZEL_LANE
-#define ZEL_KERNEL_LOOP
-#include "spaces/hsv_blocks.inc"
-#undef ZEL_KERNEL
-#undef ZEL_KERNEL_LOOP
-}  // namespace sse
-
-namespace avx2 {
-using namespace zel::lanes;
-#define ZEL_KERNEL ZEL_LANE_AVX2
-#define ZEL_KERNEL_LOOP ZEL_AVX2
-#include "spaces/hsv_blocks.inc"
-#undef ZEL_KERNEL
-#undef ZEL_KERNEL_LOOP
-}  // namespace avx2
+#define ZEL_BLOCKS "spaces/hsv_blocks.inc"
+#include "spaces/both_widths.inc"
 
 template <int Stride>
 int rgbToHsvBlocks8u(Lanes lanes, const uint8_t* src, uint8_t* dst, int n) {

@@ -9,27 +9,9 @@
 
 namespace zel::spaces::lab {
 
-namespace sse {
-using namespace zel::lanes;
-#define ZEL_KERNEL ZEL_LANE
-#define ZEL_KERNEL_LOOP
-#include "spaces/lane_helpers.inc"
-#include "spaces/cube_root_lanes.inc"
-#include "spaces/lab_blocks.inc"
-#undef ZEL_KERNEL
-#undef ZEL_KERNEL_LOOP
-}  // namespace sse
-
-namespace avx2 {
-using namespace zel::lanes;
-#define ZEL_KERNEL ZEL_LANE_AVX2
-#define ZEL_KERNEL_LOOP ZEL_AVX2
-#include "spaces/lane_helpers.inc"
-#include "spaces/cube_root_lanes.inc"
-#include "spaces/lab_blocks.inc"
-#undef ZEL_KERNEL
-#undef ZEL_KERNEL_LOOP
-}  // namespace avx2
+#define ZEL_BLOCKS "spaces/lab_blocks.inc"
+#define ZEL_WITH_CUBE_ROOT
+#include "spaces/both_widths.inc"
 
 template <typename S, typename D, bool Bgr>
 int forwardBlocks(Lanes lanes, const S* src, D* dst, int n) {

@@ -10,27 +10,9 @@
 
 namespace zel::spaces::luv {
 
-namespace sse {
-using namespace zel::lanes;
-#define ZEL_KERNEL ZEL_LANE
-#define ZEL_KERNEL_LOOP
-#include "spaces/lane_helpers.inc"
-#include "spaces/cube_root_lanes.inc"
-#include "spaces/luv_blocks.inc"
-#undef ZEL_KERNEL
-#undef ZEL_KERNEL_LOOP
-}  // namespace sse
-
-namespace avx2 {
-using namespace zel::lanes;
-#define ZEL_KERNEL ZEL_LANE_AVX2
-#define ZEL_KERNEL_LOOP ZEL_AVX2
-#include "spaces/lane_helpers.inc"
-#include "spaces/cube_root_lanes.inc"
-#include "spaces/luv_blocks.inc"
-#undef ZEL_KERNEL
-#undef ZEL_KERNEL_LOOP
-}  // namespace avx2
+#define ZEL_BLOCKS "spaces/luv_blocks.inc"
+#define ZEL_WITH_CUBE_ROOT
+#include "spaces/both_widths.inc"
 
 template <bool Bgr>
 int forwardTableBlocks(Lanes lanes, const uint8_t* src, uint8_t* dst, int n) {

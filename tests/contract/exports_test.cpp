@@ -58,6 +58,11 @@ TEST(Exports, ManifestFollowsTheListInSlotOrder) {
   for (size_t i = 0; i < names.size(); ++i) EXPECT_EQ(ds[i].name, names[i]);
 }
 
+TEST(Exports, EveryNameIsBuilt) {
+  // The manifest is the whole list: every slot, in order.
+  EXPECT_EQ(manifestNames(), readLines(ZELCC_EXPORTS_FILE));
+}
+
 TEST(Exports, DynamicSymbolTableHoldsExactlyTheManifest) {
   const std::string command = std::string("nm -D --defined-only '") + ZELCC_SHARED_LIBRARY + "'";
   FILE* pipe = popen(command.c_str(), "r");

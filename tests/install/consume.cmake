@@ -6,7 +6,7 @@ execute_process(COMMAND ${CMAKE_COMMAND} --install ${BINARY_DIR} --prefix ${pref
 if(NOT rc EQUAL 0)
   message(FATAL_ERROR "install failed")
 endif()
-execute_process(COMMAND ${CMAKE_COMMAND} -S ${SOURCE_DIR}/tests/install/consumer -B ${WORK_DIR}/build
+execute_process(COMMAND ${CMAKE_COMMAND} -S ${SOURCE_DIR}/examples/downstream -B ${WORK_DIR}/build
                         -DCMAKE_PREFIX_PATH=${prefix} RESULT_VARIABLE rc)
 if(NOT rc EQUAL 0)
   message(FATAL_ERROR "configure of the consumer failed")
@@ -15,7 +15,7 @@ execute_process(COMMAND ${CMAKE_COMMAND} --build ${WORK_DIR}/build RESULT_VARIAB
 if(NOT rc EQUAL 0)
   message(FATAL_ERROR "build of the consumer failed")
 endif()
-execute_process(COMMAND ${WORK_DIR}/build/consumer RESULT_VARIABLE rc OUTPUT_VARIABLE out)
+execute_process(COMMAND ${WORK_DIR}/build/downstream RESULT_VARIABLE rc OUTPUT_VARIABLE out)
 if(NOT rc EQUAL 0)
   message(FATAL_ERROR "consumer (find_package) failed: ${out}")
 endif()
@@ -35,12 +35,12 @@ endif()
 separate_arguments(flags UNIX_COMMAND "${flags}")
 string(REGEX MATCH "-L[^ ;]+" ldir "${flags}")
 string(SUBSTRING "${ldir}" 2 -1 ldir)
-execute_process(COMMAND c++ ${SOURCE_DIR}/tests/install/consumer/main.cpp ${flags} -Wl,-rpath,${ldir}
-                        -o ${WORK_DIR}/consumer_pc RESULT_VARIABLE rc)
+execute_process(COMMAND c++ ${SOURCE_DIR}/examples/downstream/main.cpp ${flags} -Wl,-rpath,${ldir}
+                        -o ${WORK_DIR}/downstream_pc RESULT_VARIABLE rc)
 if(NOT rc EQUAL 0)
   message(FATAL_ERROR "build with pkg-config flags failed")
 endif()
-execute_process(COMMAND ${WORK_DIR}/consumer_pc RESULT_VARIABLE rc OUTPUT_VARIABLE out)
+execute_process(COMMAND ${WORK_DIR}/downstream_pc RESULT_VARIABLE rc OUTPUT_VARIABLE out)
 if(NOT rc EQUAL 0)
   message(FATAL_ERROR "consumer (pkg-config) failed: ${out}")
 endif()

@@ -479,7 +479,7 @@ void bgrModel(int Y, int cr, int cb, bool wide, int* bgr) {
     return;
   }
   auto mh = [](int a, int b) { return int16_t((int(int16_t(a)) * b) >> 16); };
-  const int y = mh((Y - 16) << 7, 4769), crs = (cr - 128) << 7, cbs = (cb - 128) << 7;
+  const int y = mh((Y - 16) * 128, 4769), crs = (cr - 128) * 128, cbs = (cb - 128) * 128;
   bgr[2] = sat(int16_t(y + mh(crs, 6537)) >> 3);
   bgr[1] = sat(int16_t(y - mh(cbs, 1605) - mh(crs, 3330)) >> 3);
   bgr[0] = sat(int16_t(y + mh(cbs, 8263)) >> 3);

@@ -315,6 +315,14 @@ TEST(Repack, RowMovesMatchTheirScalarForms) {
       ASSERT_EQ(y, wy);
       ASSERT_EQ(cb, wcb);
       ASSERT_EQ(cr, wcr);
+      for (PairOrder to : {PairOrder::YCbCr, PairOrder::YCrCb, PairOrder::CbYCr}) {
+        zel::test::TestImage<uint8_t> out(2 * n, 1, 1);
+        reorderPairs(in.data(), o, out.data(), to, n, false);
+        std::vector<uint8_t> want(2 * n);
+        for (int x = 0; x < n; x += 2) mergePair(&wy[x], wcb[x / 2], wcr[x / 2], to, &want[2 * x]);
+        for (int x = 0; x < 2 * n; ++x) ASSERT_EQ(out.get(x, 0), want[x]) << n;
+        ASSERT_TRUE(out.guardsIntact());
+      }
       for (bool nt : {false, true}) {
         zel::test::TestImage<uint8_t> out(2 * n, 1, nt ? 0 : 5);
         mergePairs(y.data(), cb.data(), cr.data(), o, out.data(), n, nt);

@@ -38,7 +38,9 @@ TEST(EveryName, FillsAndReadsBackAtOddAndEvenSizes) {
         ASSERT_LE(img.picture.width, w) << name << img.suffix;
         ASSERT_GE(img.picture.height, 1) << name << img.suffix;
         ASSERT_LE(img.picture.height, h) << name << img.suffix;
-        if (out.images.size() == 1) EXPECT_EQ(img.suffix, "") << name;
+        // A planar destination keeps its plane suffixes even when its chroma
+        // planes are empty (one pixel wide without steps).
+        if (out.images.size() == 1 && !d.dst.isPlanar()) EXPECT_EQ(img.suffix, "") << name;
         else EXPECT_EQ(img.suffix[0], '_') << name;
       }
     }
