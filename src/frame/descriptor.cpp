@@ -393,6 +393,7 @@ bool describe(const std::string& name, const std::string& extras, Descriptor& d,
   }
   describeFormat(srcFormat, d.src);
   describeFormat(dstFormat, d.dst);
+  d.srcWholePairs = d.src.layout == Layout::C2 && !d.dst.packedWord && (d.dst.format == "RGB" || d.dst.format == "BGR");
   // Planes converted to or from packed words take a step per plane, at full
   // resolution too.
   if (d.dst.packedWord) d.src.planeSteps = true;
@@ -546,6 +547,7 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
       b.geometry = planeGeometry(side, p, w, h);
       // Their 4:2:0 chroma rows are width >> 1 samples long.
       if (!d.region && side.chroma == Chroma::S420 && side.isPlanar() && p > 0) b.geometry.rowBytes = w >> 1;
+      if (sideIndex == 0 && d.srcWholePairs) b.geometry.rowBytes = (w + 1) / 2 * 4 * b.geometry.sampleBytes;
       b.step = b.geometry.rowBytes + padBytes;
       const bool inSamples = d.stepsInSamples && !(sideIndex == 0 && d.srcStepInBytes);
       int unit = inSamples ? b.geometry.sampleBytes : 1;

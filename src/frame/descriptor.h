@@ -116,6 +116,10 @@ struct Descriptor {
   // At width 1 the destination takes three bytes a row, rows half the step
   // apart (the one-column path of the interleaved 4:2:2 packed writers).
   bool oneColumnBytes = false;
+  // A 4:2:2 stream read as whole pixel pairs: at an odd width the last
+  // pixel takes its chroma at its pair's place, the two bytes (or one) past
+  // the row's pixels. The decoders of such streams to RGB or BGR.
+  bool srcWholePairs = false;
   // The source is a frame given with a region (the whole frame in a
   // workspace); the size argument is the frame's.
   bool frameSource = false;
