@@ -4,6 +4,7 @@
 // caught and told as the buffer, the direction and the distance it hit.
 #include <gtest/gtest.h>
 
+#include <cstring>
 #include <set>
 #include <sstream>
 
@@ -114,6 +115,37 @@ TEST(GuardPageFence, CatchesAReadOneBytePastTheEnd) {
               std::string::npos)
         << out.message;
   }
+}
+
+// Rows lie where the steps put them, whatever their sign, and a byte
+// changed between rows or beside them is told.
+TEST(GuardPageFence, RowsLieWhereTheStepsSay) {
+  const Descriptor* d = findDescriptor("zeliGrayToRGB_16u_C1C3R");
+  ASSERT_NE(d, nullptr);
+  for (Fence fence : {Fence::None, Fence::After, Fence::Before})
+    for (int sign : {1, -1, 0}) {
+      Workspace w(*d, ImageSize{3, 4}, 5, 3, fence, sign);
+      Workspace::Buffer& dst = *w.bufferOf(1, 0);
+      EXPECT_EQ(dst.step, sign * (18 + 5));
+      EXPECT_EQ(dst.pitch, sign * (18 + 5));
+      std::vector<Arg> args = w.arguments();
+      EXPECT_EQ(args[3].i, dst.step);
+      // The rows, and nothing else, are the call's.
+      for (int y = 0; y < 4; ++y) std::memset(dst.first + ptrdiff_t(y) * dst.pitch, 0x11, 18);
+      EXPECT_EQ(w.checkGuards(), "") << int(fence) << " " << sign;
+      if (sign == 0) continue;
+      uint8_t* pad = dst.first + ptrdiff_t(1) * dst.pitch + 18;  // after the second row
+      *pad = 0;
+      EXPECT_NE(w.checkGuards().find("destination plane 0: byte at offset " + std::to_string(pad - dst.first)),
+                std::string::npos)
+          << w.checkGuards();
+      *pad = Workspace::kGuardByte;
+      uint8_t* last = dst.first + ptrdiff_t(3) * dst.pitch;
+      const uint8_t* lowest = sign > 0 ? dst.first : last;
+      if (fence == Fence::Before) EXPECT_EQ(reinterpret_cast<uintptr_t>(lowest) % 4096, 0u);
+      if (fence == Fence::After)
+        EXPECT_EQ(reinterpret_cast<uintptr_t>((sign > 0 ? last : dst.first) + 18) % 4096, 0u);
+    }
 }
 
 }  // namespace
