@@ -1,11 +1,18 @@
 #include "frame/descriptor.h"
 
 #include <algorithm>
+#include <cmath>
 #include <cstring>
 #include <map>
 #include <random>
 #include <regex>
 #include <sstream>
+
+#include <sys/mman.h>
+#include <unistd.h>
+
+#include <cstdlib>
+#include <new>
 
 #include "frame/invoke.h"
 
@@ -386,6 +393,7 @@ bool describe(const std::string& name, const std::string& extras, Descriptor& d,
   }
   describeFormat(srcFormat, d.src);
   describeFormat(dstFormat, d.dst);
+  d.srcWholePairs = d.src.layout == Layout::C2 && !d.dst.packedWord && (d.dst.format == "RGB" || d.dst.format == "BGR");
   // Planes converted to or from packed words take a step per plane, at full
   // resolution too.
   if (d.dst.packedWord) d.src.planeSteps = true;
@@ -475,12 +483,63 @@ const Descriptor* findDescriptor(const std::string& name) {
   return nullptr;
 }
 
+// ---- Memory ----
+
+Memory::Memory(size_t length, uint8_t fill, Fence fence) {
+  if (fence == Fence::None) {
+    base_ = new uint8_t[std::max<size_t>(length, 1)];
+    baseSize_ = length;
+    data_ = base_;
+  } else {
+    const size_t page = size_t(sysconf(_SC_PAGESIZE));
+    const size_t pages = (length + page - 1) / page;
+    void* m = mmap(nullptr, (pages + 1) * page, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+    if (m == MAP_FAILED) throw std::bad_alloc();
+    heap_ = false;
+    base_ = static_cast<uint8_t*>(m);
+    baseSize_ = (pages + 1) * page;
+    uint8_t* fencePage = fence == Fence::After ? base_ + pages * page : base_;
+    if (mprotect(fencePage, page, PROT_NONE) != 0) {
+      munmap(base_, baseSize_);
+      throw std::bad_alloc();
+    }
+    data_ = fence == Fence::After ? fencePage - length : base_ + page;
+  }
+  size_ = length;
+  std::memset(data_, fill, length);
+}
+
+Memory& Memory::operator=(Memory&& other) noexcept {
+  if (this != &other) {
+    release();
+    base_ = std::exchange(other.base_, nullptr);
+    baseSize_ = std::exchange(other.baseSize_, 0);
+    heap_ = std::exchange(other.heap_, true);
+    data_ = std::exchange(other.data_, nullptr);
+    size_ = std::exchange(other.size_, 0);
+  }
+  return *this;
+}
+
+void Memory::release() {
+  if (!base_) return;
+  if (heap_) delete[] base_;
+  else munmap(base_, baseSize_);
+  base_ = nullptr;
+}
+
 // ---- Workspace ----
 
-Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offset)
+Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offset, Fence fence, int stepSign)
     : d_(d), size_(size), pad_(padBytes) {
-  // Names without steps take tightly packed images.
-  if (!d.region) pad_ = padBytes = 0;
+  // Names without steps take tightly packed images, rows going down.
+  if (!d.region) {
+    pad_ = padBytes = 0;
+    stepSign = 1;
+  }
+  // Per buffer, what a row step is cut down to: whole samples of this many
+  // bytes, or 0 for half the step (see oneColumnBytes).
+  std::vector<int> stepUnits;
   const int w = std::max(std::max(size.width, 0), d.roomWidth), h = std::max(std::max(size.height, 0), d.roomHeight);
   auto addSide = [&](const Side& side, int sideIndex) {
     for (int p = 0; p < side.planes(); ++p) {
@@ -488,16 +547,15 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
       b.geometry = planeGeometry(side, p, w, h);
       // Their 4:2:0 chroma rows are width >> 1 samples long.
       if (!d.region && side.chroma == Chroma::S420 && side.isPlanar() && p > 0) b.geometry.rowBytes = w >> 1;
+      if (sideIndex == 0 && d.srcWholePairs) b.geometry.rowBytes = (w + 1) / 2 * 4 * b.geometry.sampleBytes;
       b.step = b.geometry.rowBytes + padBytes;
       const bool inSamples = d.stepsInSamples && !(sideIndex == 0 && d.srcStepInBytes);
-      b.pitch = inSamples ? b.step / b.geometry.sampleBytes * b.geometry.sampleBytes : b.step;
+      int unit = inSamples ? b.geometry.sampleBytes : 1;
       if (d.oneColumnBytes && sideIndex == 1 && size.width == 1) {
         b.geometry.rowBytes = 3;
-        b.pitch = b.step >> 1;
+        unit = 0;
       }
-      const int rows = std::max(b.geometry.rows, 1);
-      const size_t total = size_t(kGuard) * 2 + size_t(offset) + size_t(b.step) * rows + 64;
-      b.bytes.assign(total, kGuardByte);
+      stepUnits.push_back(unit);
       b.side = sideIndex;
       b.plane = p;
       b.isSource = sideIndex != 1;
@@ -515,23 +573,57 @@ Workspace::Workspace(const Descriptor& d, ImageSize size, int padBytes, int offs
     // Every byte of the rows belongs to the call; guards lie outside them.
     Buffer b;
     b.step = (w + d.scratchPad) * sampleBytes(d.src.sample) + padBytes;
-    b.pitch = b.step;
     b.geometry = PlaneGeometry{b.step, d.scratchRows, 1};
-    b.bytes.assign(size_t(kGuard) * 2 + size_t(offset) + size_t(b.step) * d.scratchRows + 64, kGuardByte);
     b.side = 3;
     buffers_.push_back(std::move(b));
+    stepUnits.push_back(1);
   }
   for (const Extra& e : d.extras) {
-    std::vector<float> values;
-    if (e.kind == ArgKind::Pointer) values.assign(size_t(std::max(e.good, 4.0)) / 4 + 1, 0.25f);
-    extraBuffers_.push_back(std::move(values));
+    // Floats 0.25 behind a pointer; a fenced record is exactly as long as
+    // the family reads.
+    Memory m;
+    if (e.kind == ArgKind::Pointer) {
+      const size_t length = fence == Fence::None ? (size_t(std::max(e.good, 4.0)) / 4 + 1) * 4 : size_t(e.good);
+      m = Memory(length, 0, fence);
+      const float quarter = 0.25f;
+      for (size_t at = 0; at + 4 <= length; at += 4) std::memcpy(m.data() + at, &quarter, 4);
+    }
+    extraBuffers_.push_back(std::move(m));
   }
-  for (Buffer& b : buffers_) {
-    // The first row starts `offset` bytes past a 64-byte boundary.
-    uint8_t* base = b.bytes.data() + kGuard;
-    const uintptr_t mis = reinterpret_cast<uintptr_t>(base) & 63u;
-    base += (64 - mis) & 63u;
-    b.first = base + offset;
+  for (size_t k = 0; k < buffers_.size(); ++k) {
+    // Steps by sign; the rows lie where a member taking them in whole
+    // samples (rounding down) or halved puts them.
+    Buffer& b = buffers_[k];
+    const int unit = stepUnits[k];
+    const int sign = b.side == 3 ? 1 : stepSign;
+    b.step = sign > 0 ? b.step : sign < 0 ? -b.step : 0;
+    if (unit == 0) b.pitch = b.step >> 1;
+    else b.pitch = b.step >= 0 ? b.step / unit * unit : -((-b.step + unit - 1) / unit * unit);
+    const int rows = std::max(b.geometry.rows, 1);
+    const ptrdiff_t last = ptrdiff_t(rows - 1) * b.pitch;
+    const ptrdiff_t low = std::min<ptrdiff_t>(0, last);  // lowest row start, from the first row's
+    const size_t span = size_t(std::max<ptrdiff_t>(0, last) - low + b.geometry.rowBytes);
+    uint8_t* lowest = nullptr;
+    switch (fence) {
+      case Fence::None: {
+        // The first row starts `offset` bytes past a 64-byte boundary.
+        const size_t rowsBytes = std::max(span, size_t(std::abs(b.step)) * rows);
+        b.bytes = Memory(size_t(kGuard) * 2 + size_t(offset) + rowsBytes + 64, kGuardByte, fence);
+        uint8_t* base = b.bytes.data() + kGuard;
+        const uintptr_t mis = reinterpret_cast<uintptr_t>(base) & 63u;
+        lowest = base + ((64 - mis) & 63u) + offset;
+        break;
+      }
+      case Fence::After:
+        b.bytes = Memory(size_t(kGuard) + span, kGuardByte, fence);
+        lowest = b.bytes.data() + kGuard;
+        break;
+      case Fence::Before:
+        b.bytes = Memory(span + size_t(kGuard), kGuardByte, fence);
+        lowest = b.bytes.data();
+        break;
+    }
+    b.first = lowest - low;
     if (b.side == 3) continue;
     if (b.side == 0) {
       srcPlanes_.push_back(b.first);
@@ -561,7 +653,7 @@ void Workspace::fillRandom(uint32_t seed) {
   for (Buffer& b : buffers_) {
     if (!b.isSource) continue;
     for (int y = 0; y < b.geometry.rows; ++y) {
-      uint8_t* row = b.first + size_t(y) * b.pitch;
+      uint8_t* row = b.first + ptrdiff_t(y) * b.pitch;
       if (d_.src.sample == Sample::F32) {
         // Floats in 0..1, the range colour functions take.
         std::uniform_real_distribution<float> dist(0.0f, 1.0f);
@@ -579,7 +671,7 @@ void Workspace::fillRandom(uint32_t seed) {
 void Workspace::fillDestinations(uint8_t value) {
   for (Buffer& b : buffers_) {
     if (!b.isDestination || b.isSource) continue;
-    for (int y = 0; y < b.geometry.rows; ++y) std::memset(b.first + size_t(y) * b.pitch, value, b.geometry.rowBytes);
+    for (int y = 0; y < b.geometry.rows; ++y) std::memset(b.first + ptrdiff_t(y) * b.pitch, value, b.geometry.rowBytes);
   }
 }
 
@@ -650,7 +742,7 @@ std::vector<Arg> Workspace::arguments(const std::vector<double>* extraValues) {
         }
         const double v = extraValues ? (*extraValues)[s.extra] : e.good;
         a.f = v;
-        a.i = int64_t(v);
+        a.i = std::isfinite(v) ? int64_t(v) : 0;  // a NaN only a float parameter takes
         args.push_back(a);
         break;
       }
@@ -665,33 +757,28 @@ Status Workspace::call(const std::vector<Arg>& args) const { return d_.invoke(ar
 
 std::string Workspace::checkGuards() const {
   for (const Buffer& b : buffers_) {
-    const uint8_t* lo = b.bytes.data();
-    const uint8_t* hi = lo + b.bytes.size();
-    auto describeAt = [&](const uint8_t* p) {
+    // The bytes of the rows, wherever the steps put them, belong to the call.
+    std::vector<bool> region(b.bytes.size(), false);
+    const ptrdiff_t firstAt = b.first - b.bytes.data();
+    for (int y = 0; y < b.geometry.rows; ++y) {
+      const ptrdiff_t at = firstAt + ptrdiff_t(y) * b.pitch;
+      std::fill(region.begin() + at, region.begin() + at + b.geometry.rowBytes, true);
+    }
+    for (size_t i = 0; i < region.size(); ++i) {
+      if (region[i] || b.bytes.data()[i] == kGuardByte) continue;
       std::ostringstream m;
       m << (b.side == 0 ? "source" : b.side == 1 ? "destination" : b.side == 2 ? "in-place image" : "scratch")
-        << " plane " << b.plane
-        << ": byte at offset " << (p - b.first) << " from the region's start changed";
+        << " plane " << b.plane << ": byte at offset " << (ptrdiff_t(i) - firstAt)
+        << " from the region's start changed";
       return m.str();
-    };
-    const int rows = b.geometry.rows;
-    const uint8_t* regionEnd = b.first + (rows > 0 ? size_t(rows - 1) * b.pitch + b.geometry.rowBytes : 0);
-    for (const uint8_t* p = lo; p < b.first; ++p)
-      if (*p != kGuardByte) return describeAt(p);
-    for (int y = 0; y + 1 < rows; ++y) {
-      const uint8_t* padStart = b.first + size_t(y) * b.pitch + b.geometry.rowBytes;
-      for (const uint8_t* p = padStart; p < b.first + size_t(y + 1) * b.pitch; ++p)
-        if (*p != kGuardByte) return describeAt(p);
     }
-    for (const uint8_t* p = regionEnd; p < hi; ++p)
-      if (*p != kGuardByte) return describeAt(p);
   }
   return "";
 }
 
 std::vector<std::vector<uint8_t>> Workspace::snapshot() const {
   std::vector<std::vector<uint8_t>> out;
-  for (const Buffer& b : buffers_) out.push_back(b.bytes);
+  for (const Buffer& b : buffers_) out.emplace_back(b.bytes.begin(), b.bytes.end());
   return out;
 }
 

@@ -5,8 +5,10 @@
 #pragma once
 
 #include <algorithm>
+#include <cstddef>
 #include <cstdint>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "zelcc/zelcc.h"
@@ -114,6 +116,10 @@ struct Descriptor {
   // At width 1 the destination takes three bytes a row, rows half the step
   // apart (the one-column path of the interleaved 4:2:2 packed writers).
   bool oneColumnBytes = false;
+  // A 4:2:2 stream read as whole pixel pairs: at an odd width the last
+  // pixel takes its chroma at its pair's place, the two bytes (or one) past
+  // the row's pixels. The decoders of such streams to RGB or BGR.
+  bool srcWholePairs = false;
   // The source is a frame given with a region (the whole frame in a
   // workspace); the size argument is the frame's.
   bool frameSource = false;
@@ -145,6 +151,47 @@ bool describe(const std::string& name, const std::string& extras, Descriptor& ou
 const std::vector<Descriptor>& allDescriptors();
 const Descriptor* findDescriptor(const std::string& name);
 
+// Where the bytes of a workspace's buffers lie. None: on the heap, with
+// guard bytes on both sides. After, Before: each buffer in a mapping of its
+// own whose page right after the last byte a call may touch (After) or right
+// before the first (Before) is inaccessible, so that a read or write past
+// that end faults at once.
+enum class Fence { None, After, Before };
+
+// The bytes of one buffer, owned: heap memory or a fenced mapping.
+class Memory {
+ public:
+  Memory() = default;
+  Memory(size_t length, uint8_t fill, Fence fence);
+  Memory(Memory&& other) noexcept { *this = std::move(other); }
+  Memory& operator=(Memory&& other) noexcept;
+  Memory(const Memory&) = delete;
+  Memory& operator=(const Memory&) = delete;
+  ~Memory() { release(); }
+
+  uint8_t* data() { return data_; }
+  const uint8_t* data() const { return data_; }
+  size_t size() const { return size_; }
+  uint8_t* begin() { return data_; }
+  uint8_t* end() { return data_ + size_; }
+  const uint8_t* begin() const { return data_; }
+  const uint8_t* end() const { return data_ + size_; }
+  // The whole mapping, inaccessible page included (the bytes alone on the
+  // heap): tells whose fence a faulting address hit.
+  bool mapped(const void* p) const {
+    auto* q = static_cast<const uint8_t*>(p);
+    return q >= base_ && q < base_ + baseSize_;
+  }
+
+ private:
+  void release();
+  uint8_t* base_ = nullptr;
+  size_t baseSize_ = 0;
+  bool heap_ = true;
+  uint8_t* data_ = nullptr;
+  size_t size_ = 0;
+};
+
 // Image arguments of one call, with guard bytes around every buffer.
 class Workspace {
  public:
@@ -152,14 +199,21 @@ class Workspace {
   static constexpr uint8_t kGuardByte = 0xA7;
 
   // padBytes: bytes between one row's region and the next row; offset: how
-  // far each buffer's first row starts past a 64-byte boundary.
-  Workspace(const Descriptor& d, ImageSize size, int padBytes = 0, int offset = 0);
+  // far each buffer's first row starts past a 64-byte boundary (heap only).
+  // fence: where the buffers lie; the bytes past the fenced end are exactly
+  // those the call may touch (rows of the region, or of the descriptor's
+  // room; the whole rows of a scratch area; the bytes of a record).
+  // stepSign: 1 rows go down in memory; -1 the first row lies highest and
+  // the steps are negative; 0 every row lies in the same place and the
+  // steps are 0. Scratch steps stay positive; names without steps take 1.
+  Workspace(const Descriptor& d, ImageSize size, int padBytes = 0, int offset = 0, Fence fence = Fence::None,
+            int stepSign = 1);
 
   struct Buffer {
-    std::vector<uint8_t> bytes;  // guard + rows + guard
+    Memory bytes;                // guard + rows + guard
     uint8_t* first = nullptr;    // first byte of the region
     int step = 0;   // the step argument
-    int pitch = 0;  // where the rows lie: the step, or its whole samples
+    int pitch = 0;  // where the rows lie: the step, or its whole samples (signed)
     PlaneGeometry geometry{};
     bool isSource = false;
     bool isDestination = false;
@@ -183,6 +237,8 @@ class Workspace {
   // Guard bytes and step padding unchanged; returns a message or "".
   std::string checkGuards() const;
   std::vector<std::vector<uint8_t>> snapshot() const;
+  // The record behind a pointer argument of the family.
+  Memory& record(int extra) { return extraBuffers_[extra]; }
   const Descriptor& descriptor() const { return d_; }
   ImageSize size() const { return size_; }
 
@@ -193,7 +249,7 @@ class Workspace {
   std::vector<Buffer> buffers_;
   std::vector<const void*> srcPlanes_, dstPlanes_, srcDstPlanes_;
   std::vector<int> srcSteps_, dstSteps_;
-  std::vector<std::vector<float>> extraBuffers_;  // behind pointer arguments of the family
+  std::vector<Memory> extraBuffers_;  // behind pointer arguments of the family
 };
 
 }  // namespace zel::meta

@@ -45,7 +45,7 @@ inline __m128i mask(const int8_t* m) { return _mm_load_si128(reinterpret_cast<co
 
 template <typename T, int Channels>
 void scalarPixels(const T* src, T* dst, int from, int to, T alpha) {
-  for (int x = from; x < to; ++x) grayPixel<T, Channels>(src[x], dst + x * Channels, alpha);
+  for (int x = from; x < to; ++x) grayPixel<T, Channels>(src + x, dst + x * Channels, alpha);
 }
 
 // ---- SSE4.1 blocks: each returns the number of pixels it converted. ----

@@ -7,12 +7,13 @@
 
 namespace zel {
 
+// `s` and `d` may lie at any byte address: samples move as bytes.
 template <typename T, int Channels>
-inline void grayPixel(const T& s, T* d, T alpha) {
+inline void grayPixel(const T* s, T* d, T alpha) {
   // Copy through the bytes so float patterns (signalling NaN) stay exact.
-  __builtin_memcpy(d, &s, sizeof(T));
-  __builtin_memcpy(d + 1, &s, sizeof(T));
-  __builtin_memcpy(d + 2, &s, sizeof(T));
+  __builtin_memcpy(d, s, sizeof(T));
+  __builtin_memcpy(d + 1, s, sizeof(T));
+  __builtin_memcpy(d + 2, s, sizeof(T));
   if constexpr (Channels == 4) __builtin_memcpy(d + 3, &alpha, sizeof(T));
 }
 

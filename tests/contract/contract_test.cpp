@@ -3,6 +3,7 @@
 // untouched on success, zero steps accepted where steps are not checked.
 #include <gtest/gtest.h>
 
+#include <cmath>
 #include <cstring>
 #include <functional>
 #include <set>
@@ -127,7 +128,7 @@ std::vector<Failure> failuresOf(const Descriptor& d, const CheckStage& stage) {
         out.push_back({e.name + " = " + std::to_string(b.value), b.status,
                        [index, b](Workspace&, std::vector<Arg>& a, ImageSize&) {
                          a[index].f = b.value;
-                         a[index].i = int64_t(b.value);
+                         a[index].i = std::isfinite(b.value) ? int64_t(b.value) : 0;
                        }});
       break;
     }

@@ -82,11 +82,11 @@ TEST(GrayToRGB, RowKernelsMatchThePixelFormula) {
     src.fillRandom(uint32_t(count));
     std::vector<uint8_t> got(count * 4), want(count * 4);
     zel::grayRowKernel<uint8_t, 4>(src.data(), got.data(), count, 9);
-    for (int x = 0; x < count; ++x) zel::grayPixel<uint8_t, 4>(src.data()[x], &want[x * 4], 9);
+    for (int x = 0; x < count; ++x) zel::grayPixel<uint8_t, 4>(src.data() + x, &want[x * 4], 9);
     ASSERT_EQ(got, want) << count;
     std::vector<uint8_t> got3(count * 3), want3(count * 3);
     zel::grayRowKernel<uint8_t, 3>(src.data(), got3.data(), count, 0);
-    for (int x = 0; x < count; ++x) zel::grayPixel<uint8_t, 3>(src.data()[x], &want3[x * 3], 0);
+    for (int x = 0; x < count; ++x) zel::grayPixel<uint8_t, 3>(src.data() + x, &want3[x * 3], 0);
     ASSERT_EQ(got3, want3) << count;
   }
 }

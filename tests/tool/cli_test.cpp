@@ -126,6 +126,20 @@ TEST_F(Cli, ListInfoHelpAndVersion) {
   EXPECT_NE(r.out.find("8.2.1"), std::string::npos);
 }
 
+TEST_F(Cli, DocWritesTheTableToAFileOrStdout) {
+  const Result printed = run("doc");
+  ASSERT_EQ(printed.code, 0) << printed.err;
+  EXPECT_EQ(printed.out.rfind("# Exports\n", 0), 0u);
+  EXPECT_NE(printed.out.find("| `zeliGrayToRGB_8u_C1C4R` | src, srcStep, dst, dstStep, size, alpha |"),
+            std::string::npos);
+  const Result written = run("doc " + file("exports.md"));
+  ASSERT_EQ(written.code, 0) << written.err;
+  EXPECT_TRUE(written.out.empty());
+  EXPECT_EQ(slurp(file("exports.md")), printed.out);
+  expectFailure("doc a b", "at most one file name", 2);
+  expectFailure("doc " + file("no/such/dir/x.md"), "cannot write");
+}
+
 TEST_F(Cli, MistakesGetOneLineAndAFailingExit) {
   const std::string out = " --out " + file("o");
   expectFailure("run zeliNoSuch_8u_C1R --sample" + out, "unknown export 'zeliNoSuch_8u_C1R'");

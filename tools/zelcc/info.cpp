@@ -1,5 +1,6 @@
 #include "info.h"
 
+#include <algorithm>
 #include <cstring>
 #include <iomanip>
 #include <sstream>
@@ -97,6 +98,8 @@ std::string argumentName(const Descriptor& d, const meta::ArgSlot& s, size_t ind
     case Role::SrcDstPtr: return "srcDst";
     case Role::SrcDstPlanes: return "srcDstPlanes" + planes(src);
     case Role::SrcDstStep: return "srcDstStep";
+    case Role::Scratch: return "tmp";
+    case Role::ScratchStep: return "tmpStep";
     case Role::Size: return "size";
     case Role::Extra: return d.extras[s.extra].name;
     default:
@@ -120,6 +123,8 @@ std::string argumentRole(const Descriptor& d, const meta::ArgSlot& s) {
     case Role::SrcDstStep:
       return d.checksSteps ? "row step in bytes, checked: at least 1" : "row step in bytes, used unchecked";
     case Role::Size: return "width and height in pixels";
+    case Role::Scratch: return "caller's scratch, not checked";
+    case Role::ScratchStep: return "row step of the scratch in bytes, not checked";
     case Role::Extra: {
       const meta::Extra& e = d.extras[s.extra];
       if (e.kind == ArgKind::Pointer) return "family argument, default: " + number(e.good) + " bytes of floats 0.25";
@@ -197,6 +202,97 @@ std::string describeExport(const Descriptor& d) {
   };
   planesOf(d.src, d.inPlace ? "image" : "source");
   if (!d.inPlace) planesOf(d.dst, "destination");
+  return o.str();
+}
+
+namespace {
+
+// One side in a table cell: format (operators have none), layout, sample
+// type, subsampling.
+std::string sideCell(const Descriptor& d, const Side& s) {
+  std::ostringstream o;
+  if (!s.format.empty() && s.format != d.operation) o << s.format << " ";
+  o << meta::layoutName(s.layout) << " " << meta::sampleName(s.sample);
+  switch (s.chroma) {
+    case Chroma::S422: o << " 4:2:2"; break;
+    case Chroma::S420: o << " 4:2:0"; break;
+    case Chroma::S411: o << " 4:1:1"; break;
+    case Chroma::S1620: o << " quarter"; break;
+    default: break;
+  }
+  if (s.packedWord) o << " packed";
+  return o.str();
+}
+
+std::string familyCell(const Descriptor& d) {
+  std::ostringstream o;
+  for (size_t i = 0; i < d.extras.size(); ++i) {
+    const meta::Extra& e = d.extras[i];
+    o << (i ? "; " : "") << "`" << e.name << "` " << argKindName(e.kind) << " ";
+    if (e.kind == ArgKind::Pointer) o << number(e.good) << " bytes" << (e.optional ? ", may be null" : "");
+    else o << number(e.good);
+    if (!e.bad.empty()) {
+      o << " (rejects";
+      for (const meta::BadValue& b : e.bad) o << " " << number(b.value) << ": " << statusName(b.status);
+      o << ")";
+    }
+  }
+  return o.str();
+}
+
+bool hasPlaneArrays(const Descriptor& d) {
+  return std::any_of(d.slots.begin(), d.slots.end(), [](const meta::ArgSlot& s) {
+    return s.role == Role::SrcPlanes || s.role == Role::DstPlanes || s.role == Role::SrcDstPlanes;
+  });
+}
+
+}  // namespace
+
+std::vector<const meta::CheckStage*> shownChecks(const Descriptor& d) {
+  std::vector<const meta::CheckStage*> out;
+  for (const meta::CheckStage& c : d.order)
+    if (c.check != meta::Check::NullPlanes || hasPlaneArrays(d)) out.push_back(&c);
+  return out;
+}
+
+std::string exportsMarkdown() {
+  const auto& all = meta::allDescriptors();
+  int images = 0;
+  for (const Descriptor& d : all) images += d.isImageFunction() ? 1 : 0;
+  std::ostringstream o;
+  o << "# Exports\n\n"
+    << "Generated from the export table by `zelcc doc` (the build writes it to `docs/exports.md` in the build\n"
+    << "tree; `tools/refresh-exports-doc.sh` copies it here). " << all.size() << " exports in table order: "
+    << images << " image functions and the version query.\n\n"
+    << "Arguments are in prototype order. Steps are in bytes: *checked* ones must be at least 1, *unchecked* ones\n"
+    << "may be zero or negative, *none*: whole images with tightly packed rows. Minimum is width x height, and a\n"
+    << "dimension of 0 there is not checked. Checks run in the order listed; the first that fails gives its\n"
+    << "status and nothing is written.\n\n"
+    << "| # | Export | Arguments | Source | Destination | Steps | Minimum | Family arguments | Checks |\n"
+    << "|---|---|---|---|---|---|---|---|---|\n";
+  int slot = 0;
+  for (const Descriptor& d : all) {
+    o << "| " << ++slot << " | `" << d.name << "` | ";
+    if (!d.isImageFunction()) {
+      o << "none | | | | | | returns the version record |\n";
+      continue;
+    }
+    for (size_t i = 0; i < d.slots.size(); ++i) o << (i ? ", " : "") << argumentName(d, d.slots[i], i);
+    const bool sizeChecked = std::any_of(d.order.begin(), d.order.end(), [](const meta::CheckStage& c) {
+      return c.check == meta::Check::Size || c.check == meta::Check::SizePositive;
+    });
+    o << " | " << sideCell(d, d.src) << (d.inPlace ? ", in place" : "") << " | "
+      << (d.inPlace ? "" : sideCell(d, d.dst)) << (d.writesAlpha ? ", alpha written" : "") << " | "
+      << (!d.region ? "none" : d.checksSteps ? "checked" : "unchecked") << " | ";
+    if (sizeChecked) o << d.minWidth << "x" << d.minHeight;
+    else o << "not checked";
+    if (d.multWidth > 1 || d.multHeight > 1) o << ", multiples of " << d.multWidth << "x" << d.multHeight;
+    if (d.warnsOdd) o << ", odd sizes warn";
+    o << " | " << familyCell(d) << " | ";
+    const auto checks = shownChecks(d);
+    for (size_t i = 0; i < checks.size(); ++i) o << (i ? ", " : "") << checkText(d, *checks[i]);
+    o << " |\n";
+  }
   return o.str();
 }
 

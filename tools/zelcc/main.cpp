@@ -1,7 +1,9 @@
-// zelcc: lists the library's exports, tells what each takes, and runs one on
-// a picture or the built-in test card, writing the results as PNG.
+// zelcc: lists the library's exports, tells what each takes, writes the
+// table of them all, and runs one on a picture or the built-in test card,
+// writing the results as PNG.
 #include <chrono>
 #include <cstdio>
+#include <fstream>
 #include <iostream>
 #include <new>
 
@@ -86,6 +88,19 @@ int runExport(const RunOptions& o) {
   return 0;
 }
 
+int writeDoc(const std::string& path) {
+  const std::string text = exportsMarkdown();
+  if (path.empty()) {
+    std::cout << text;
+    return 0;
+  }
+  std::ofstream out(path, std::ios::binary);
+  out << text;
+  out.close();
+  if (!out) throw ToolError("cannot write " + path);
+  return 0;
+}
+
 int run(const std::vector<std::string>& args) {
   const CommandLine c = parseCommandLine(args);
   switch (c.command) {
@@ -94,6 +109,7 @@ int run(const std::vector<std::string>& args) {
     case Command::Version: std::fputs(describeVersion().c_str() + 2, stdout); return 0;
     case Command::List: return listExports(c.pattern);
     case Command::Info: std::cout << describeExport(exportNamed(c.name)); return 0;
+    case Command::Doc: return writeDoc(c.docFile);
     case Command::Run: return runExport(c.run);
   }
   return 2;

@@ -15,6 +15,7 @@ using meta::ArgKind;
 const char* const kUsage =
     "usage: zelcc list [PATTERN]\n"
     "       zelcc info NAME\n"
+    "       zelcc doc [FILE]\n"
     "       zelcc run NAME [--in FILE | --sample] --out PREFIX [--size WxH] [--arg NAME=VALUE ...]\n"
     "       zelcc --version | --help\n"
     "\n"
@@ -22,6 +23,7 @@ const char* const kUsage =
     "         or else a part of the name; case is ignored)\n"
     "  info   an export's arguments, layouts, sample types, chroma subsampling, steps,\n"
     "         family arguments with their defaults, and size minima\n"
+    "  doc    every export as one Markdown table (docs/exports.md), to FILE or stdout\n"
     "  run    converts a picture through the export and writes every destination image\n"
     "         or plane as PNG: PREFIX.png for one interleaved image, PREFIX_<plane>.png\n"
     "         for planes; prints the status and the time the call took\n"
@@ -144,6 +146,11 @@ CommandLine parseCommandLine(const std::vector<std::string>& args) {
     if (args.size() != 2) throw UsageError("info takes one export name");
     c.command = Command::Info;
     c.name = args[1];
+    return c;
+  } else if (first == "doc") {
+    if (args.size() > 2) throw UsageError("doc takes at most one file name");
+    c.command = Command::Doc;
+    if (args.size() == 2) c.docFile = args[1];
     return c;
   } else if (first == "run") {
     c.command = Command::Run;

@@ -29,12 +29,13 @@ struct RunOptions {
   std::vector<std::pair<std::string, std::string>> args;  // --arg NAME=VALUE, in order
 };
 
-enum class Command { Usage, Help, Version, List, Info, Run };
+enum class Command { Usage, Help, Version, List, Info, Doc, Run };
 
 struct CommandLine {
   Command command = Command::Usage;
   std::string pattern;  // list
   std::string name;     // info
+  std::string docFile;  // doc: where the table goes (empty: stdout)
   RunOptions run;
 };
 
