@@ -27,7 +27,8 @@ fi
 cmake --build "$BUILD" -j"${JOBS:-2}" --target zelcc_fuzz_exports
 FUZZER="$BUILD/tests/zelcc_fuzz_exports"
 
-export UBSAN_OPTIONS=${UBSAN_OPTIONS:-halt_on_error=1:print_stacktrace=1}
+# Known family reports stand in .ci/ubsan.supp, as in the sanitizer pass of CI.
+export UBSAN_OPTIONS=${UBSAN_OPTIONS:-halt_on_error=1:print_stacktrace=1:suppressions=$PWD/.ci/ubsan.supp}
 export ASAN_OPTIONS=${ASAN_OPTIONS:-detect_leaks=1}
 
 if [ "${1:-}" = replay ]; then
