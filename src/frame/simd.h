@@ -9,6 +9,12 @@
 
 #define ZEL_AVX2 __attribute__((target("avx2")))
 
+// Generic helpers that take or return vector values of a unit type chosen by
+// template parameter: always inlined, so that a 256-bit value never crosses a
+// call between a function built for AVX2 and one that is not (the two pass
+// such values differently). Without it an unoptimised build breaks.
+#define ZEL_INLINE __attribute__((always_inline)) inline
+
 namespace zel {
 
 inline bool hasAvx2() { return __builtin_cpu_supports("avx2"); }
