@@ -196,16 +196,23 @@ ZEL_INLINE typename U::V lumaLanesV(const MatrixSet& s, typename U::V r, typenam
   return U::template srl16<7>(sum);
 }
 
+// chromaLanes on block sums already shifted left by the shape's kInShift.
 template <const MatrixSet& S, int Pixels, class U>
-ZEL_INLINE void chromaLanesV(typename U::V sr, typename U::V sg, typename U::V sb, typename U::V& c1, typename U::V& c2) {
+ZEL_INLINE void chromaLanesShiftedV(typename U::V xr, typename U::V xg, typename U::V xb, typename U::V& c1,
+                                    typename U::V& c2) {
   using V = typename U::V;
   using Shape = ChromaLaneShape<S, Pixels>;
-  const V xr = U::template sll16<Shape::kInShift>(sr), xg = U::template sll16<Shape::kInShift>(sg),
-          xb = U::template sll16<Shape::kInShift>(sb);
   auto g = [](V x, int c) ZEL_LAMBDA_INLINE { return U::mulHighU16(x, U::set16(c)); };
   const V add = U::set16(Shape::kAddend);
   c1 = U::template sra16<Shape::kOutShift>(U::add16(U::sub16(g(xb, S.cbB), U::add16(g(xr, S.cbR), g(xg, S.cbG))), add));
   c2 = U::template sra16<Shape::kOutShift>(U::add16(U::sub16(g(xr, S.crR), U::add16(g(xg, S.crG), g(xb, S.crB))), add));
+}
+
+template <const MatrixSet& S, int Pixels, class U>
+ZEL_INLINE void chromaLanesV(typename U::V sr, typename U::V sg, typename U::V sb, typename U::V& c1, typename U::V& c2) {
+  constexpr int kIn = ChromaLaneShape<S, Pixels>::kInShift;
+  chromaLanesShiftedV<S, Pixels, U>(U::template sll16<kIn>(sr), U::template sll16<kIn>(sg), U::template sll16<kIn>(sb),
+                                    c1, c2);
 }
 
 // ---- body forms ----
@@ -216,6 +223,25 @@ template <const MatrixSet& S, int Pixels>
 struct LanesBody {
   static constexpr bool kTerm = false;
   static constexpr bool kNarrow = S.narrow;
+  // The luma in quads (rgb_to_sub_rows.h): a channel shifted left by 8 to
+  // its term, and the sum of a pixel's terms to its luma before the pack.
+  static constexpr bool kQuads = Pixels == 4;
+  static constexpr int kLumaR = S.lumaR, kLumaG = S.lumaG, kLumaB = S.lumaB;
+  template <class U>
+  ZEL_INLINE typename U::V quadTerm(typename U::V x8, typename U::V c) const {
+    return U::mulHighU16(x8, c);
+  }
+  template <class U>
+  ZEL_INLINE typename U::V quadLuma(typename U::V sum) const {
+    return U::template srl16<7>(U::add16(sum, U::set16(S.k)));
+  }
+  // chroma on four-pixel sums already shifted left by 5.
+  template <class U>
+  ZEL_INLINE void chromaOf32(typename U::V xr, typename U::V xg, typename U::V xb, typename U::V& c1,
+                             typename U::V& c2) const {
+    static_assert(ChromaLaneShape<S, Pixels>::kInShift == 5);
+    chromaLanesShiftedV<S, Pixels, U>(xr, xg, xb, c1, c2);
+  }
   uint8_t luma(const Rgb& p, int) const { return lumaLanes<S>(p); }
   Chroma2 chroma(const Rgb* px, int n) const { return chromaLanes<S, Pixels>(sumsOf(px, n)); }
   template <class U>
@@ -236,6 +262,16 @@ template <bool After>
 struct RoundedBody {
   static constexpr bool kTerm = false;
   static constexpr bool kNarrow = false;
+  static constexpr bool kQuads = !After;
+  static constexpr int kLumaR = 4211, kLumaG = 8258, kLumaB = 1606;
+  template <class U>
+  ZEL_INLINE typename U::V quadTerm(typename U::V x8, typename U::V c) const {
+    return U::mulHighRound(U::template srl16<1>(x8), c);
+  }
+  template <class U>
+  ZEL_INLINE typename U::V quadLuma(typename U::V sum) const {
+    return U::template sra16<6>(U::add16(sum, U::set16(1026)));
+  }
   uint8_t luma(const Rgb& p, int) const { return After ? lumaRounded411(p) : lc::ycbcrRounded(p.r, p.g, p.b).y; }
   Chroma2 chroma(const Rgb* px, int n) const { return chromaRounded<After>(sumsOf(px, n)); }
   template <class U>
@@ -249,10 +285,15 @@ struct RoundedBody {
   template <class U>
   ZEL_INLINE void chroma(typename U::V sr, typename U::V sg, typename U::V sb, typename U::V, typename U::V& c1,
               typename U::V& c2) const {
+    chromaOf32<U>(U::template sll16<5>(sr), U::template sll16<5>(sg), U::template sll16<5>(sb), c1, c2);
+  }
+  template <class U>
+  ZEL_INLINE void chromaOf32(typename U::V xr, typename U::V xg, typename U::V xb, typename U::V& c1,
+                             typename U::V& c2) const {
     using V = typename U::V;
-    auto m = [](V s, int c) ZEL_LAMBDA_INLINE { return U::mulHighRound(U::template sll16<5>(s), U::set16(c)); };
-    const V cb = U::sub16(U::sub16(m(sb, 7193), m(sg, 4768)), m(sr, 2425));
-    const V cr = U::sub16(U::sub16(m(sr, 7193), m(sg, 6029)), m(sb, 1163));
+    auto m = [](V x, int c) ZEL_LAMBDA_INLINE { return U::mulHighRound(x, U::set16(c)); };
+    const V cb = U::sub16(U::sub16(m(xb, 7193), m(xg, 4768)), m(xr, 2425));
+    const V cr = U::sub16(U::sub16(m(xr, 7193), m(xg, 6029)), m(xb, 1163));
     if constexpr (After) {
       c1 = U::add16(U::template sra16<6>(cb), U::set16(128));
       c2 = U::add16(U::template sra16<6>(cr), U::set16(128));

@@ -10,6 +10,7 @@
 #pragma once
 
 #include <cstdint>
+#include <type_traits>
 
 #include "frame/simd.h"
 #include "luma_chroma/pixel_rows.h"
@@ -155,6 +156,141 @@ struct TwoPlane420Out {
   }
 };
 
+// ---- pixels as four-byte quads ----
+//
+// The 4:2:0 bodies of interleaved sources also run on pixels taken as
+// four-byte quads, four pixels to a 16-byte vector (a three-byte row is
+// spread into quads by byte shuffles), without splitting a block into
+// channel planes. Luma: 16-bit lanes hold channels 0 and 2 of a pixel, or
+// channel 1 and nothing, each shifted left by 8; the body's product of each
+// lane with its channel's constant is summed over the two lanes of a pixel
+// and then over the two vectors. Chroma: byte shuffles put the same channel
+// of neighbouring pixels side by side and a multiply-add by 32 sums them,
+// already shifted left by 5 as the chroma forms take them.
+// Every sum is a 16-bit lane sum, which wraps alike in any order, so the
+// bytes are those of the plane form.
+
+template <class B, class = void>
+struct TakesQuads : std::false_type {};
+template <class B>
+struct TakesQuads<B, std::void_t<decltype(B::kQuads)>> : std::bool_constant<B::kQuads> {};
+
+// Bytes of a quad vector for the chroma sums: channel c of pixels 0, 1 and
+// of pixels 2, 3 side by side, for c = 0, 1, 2; the pixels of a quad start
+// at byte `at` of a source vector and lie `size` bytes apart.
+constexpr Shuffle16 quadPairBytes(int at, int size) {
+  Shuffle16 p{};
+  for (int i = 0; i < 16; ++i) p.b[i] = -1;
+  for (int c = 0; c < 3; ++c)
+    for (int i = 0; i < 4; ++i) p.b[4 * c + i] = static_cast<int8_t>(at + size * i + c);
+  return p;
+}
+// Channel c0 and c2 of each pixel (Second: channel 1 alone) in the high
+// bytes of 16-bit lanes.
+constexpr Shuffle16 quadLumaBytes(int at, bool second) {
+  Shuffle16 p{};
+  for (int i = 0; i < 16; ++i) p.b[i] = -1;
+  for (int i = 0; i < 4; ++i) {
+    p.b[4 * i + 1] = static_cast<int8_t>(at + 3 * i + (second ? 1 : 0));
+    if (!second) p.b[4 * i + 3] = static_cast<int8_t>(at + 3 * i + 2);
+  }
+  return p;
+}
+inline constexpr Shuffle16 kQuadPairs4 = quadPairBytes(0, 4);
+inline constexpr Shuffle16 kQuadPairs3[2] = {quadPairBytes(0, 3), quadPairBytes(4, 3)};
+inline constexpr Shuffle16 kQuadLuma3[2][2] = {{quadLumaBytes(0, false), quadLumaBytes(0, true)},
+                                               {quadLumaBytes(4, false), quadLumaBytes(4, true)}};
+
+// The quads of a block of 16 pixels a unit: luma lanes (lo: channels 0, 2;
+// hi: channel 1) and the sums of neighbouring pixels' channels.
+template <class U>
+struct Quads {
+  typename U::V lo[4], hi[4], pairs[4];
+};
+
+template <class U>
+ZEL_INLINE Quads<U> quadsOf(const PackedIn<4>& in, int x) {
+  using V = typename U::V;
+  using M = More<U>;
+  Quads<U> q;
+  const V high = U::set16(0xFF00), pairs = U::shuffleOf(kQuadPairs4);
+  for (int k = 0; k < 4; ++k) {
+    const V c = U::loadUnits(in.p + 4 * x + 16 * k, 64);
+    q.lo[k] = U::template sll16<8>(c);
+    q.hi[k] = M::and_(c, high);
+    q.pairs[k] = M::pairSums32(U::shuffle8(c, pairs));
+  }
+  return q;
+}
+
+template <class U>
+ZEL_INLINE Quads<U> quadsOf(const PackedIn<3>& in, int x) {
+  using V = typename U::V;
+  using M = More<U>;
+  const uint8_t* p = in.p + 3 * x;
+  const V a = U::loadUnits(p, 48), b = U::loadUnits(p + 16, 48), c = U::loadUnits(p + 32, 48);
+  // Quads 0..3 start at bytes 0, 12, 24, 36: at byte 0 of a, of b:a from
+  // 12, of c:b from 8, and at byte 4 of c.
+  const V src[4] = {a, M::template alignr<12>(b, a), M::template alignr<8>(c, b), c};
+  Quads<U> q;
+  for (int k = 0; k < 4; ++k) {
+    const int at = k == 3 ? 1 : 0;
+    q.lo[k] = U::shuffle8(src[k], U::shuffleOf(kQuadLuma3[at][0]));
+    q.hi[k] = U::shuffle8(src[k], U::shuffleOf(kQuadLuma3[at][1]));
+    q.pairs[k] = M::pairSums32(U::shuffle8(src[k], U::shuffleOf(kQuadPairs3[at])));
+  }
+  return q;
+}
+
+// Luma bytes of the 16 pixels of a unit from their quads.
+template <class U, bool Bgr, class Body>
+ZEL_INLINE typename U::V quadLuma(const Quads<U>& q, const Body& body) {
+  using V = typename U::V;
+  using M = More<U>;
+  const int c0 = Bgr ? Body::kLumaB : Body::kLumaR, c2 = Bgr ? Body::kLumaR : Body::kLumaB;
+  const V kLo = M::pair16(c0, c2), kHi = M::pair16(Body::kLumaG, 0);
+  V t[4];
+  for (int k = 0; k < 4; ++k)
+    t[k] = U::add16(body.template quadTerm<U>(q.lo[k], kLo), body.template quadTerm<U>(q.hi[k], kHi));
+  return U::packU8(body.template quadLuma<U>(M::hadd16(t[0], t[1])), body.template quadLuma<U>(M::hadd16(t[2], t[3])));
+}
+
+template <class U, bool Bgr, int Stride, class Body, class Out>
+ZEL_INLINE int quadPairBlocks(const PackedIn<Stride>& top, const PackedIn<Stride>& bottom, const Out& out, int x,
+                              int end, const Body& body) {
+  using V = typename U::V;
+  using M = More<U>;
+  for (; x + U::kPixels <= end; x += U::kPixels) {
+    const Quads<U> q0 = quadsOf<U>(top, x);
+    V y0 = quadLuma<U, Bgr>(q0, body);
+    const Quads<U> q1 = quadsOf<U>(bottom, x);
+    V y1 = quadLuma<U, Bgr>(q1, body);
+    V s[4];
+    for (int k = 0; k < 4; ++k) s[k] = U::add16(q0.pairs[k], q1.pairs[k]);
+    // s[k]: channel 0 of blocks 2k, 2k + 1, channel 1 of them, channel 2.
+    const V a = M::unpackLo32(s[0], s[1]), b = M::unpackHi32(s[0], s[1]);
+    const V c = M::unpackLo32(s[2], s[3]), d = M::unpackHi32(s[2], s[3]);
+    const V ch0 = M::unpackLo64(a, c), ch1 = M::unpackHi64(a, c), ch2 = M::unpackLo64(b, d);
+    V c1, c2;
+    body.template chromaOf32<U>(Bgr ? ch2 : ch0, ch1, Bgr ? ch0 : ch2, c1, c2);
+    V cc = U::packU8(c1, c2);
+    if constexpr (Body::kNarrow) {
+      y0 = M::clampNarrow(y0);
+      y1 = M::clampNarrow(y1);
+      cc = M::clampNarrow(cc);
+    }
+    out.template block<U>(x, y0, y1, cc);
+  }
+  return x;
+}
+
+template <class Src>
+struct QuadSource : std::false_type {};
+template <int Stride, bool Bgr>
+struct QuadSource<RgbSource<PackedIn<Stride>, Bgr>> : std::true_type {
+  static constexpr bool kBgr = Bgr;
+};
+
 // ---- vector blocks ----
 
 // One row, `Ratio` pixels (2 or 4) to a chroma sample.
@@ -193,6 +329,8 @@ template <class U, class Body, class Src, class Out>
 ZEL_INLINE int pairBlocks(const Src& top, const Src& bottom, const Out& out, int x, int end, const Body& body) {
   using V = typename U::V;
   using M = More<U>;
+  if constexpr (QuadSource<Src>::value && TakesQuads<Body>::value)
+    return quadPairBlocks<U, QuadSource<Src>::kBgr>(top.in, bottom.in, out, x, end, body);
   for (; x + U::kPixels <= end; x += U::kPixels) {
     const Trio<U> s0 = top.template block<U>(x), s1 = bottom.template block<U>(x);
     V y[2], st = U::zero();

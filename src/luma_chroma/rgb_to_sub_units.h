@@ -22,6 +22,8 @@ struct More<Sse> {
   using V = __m128i;
   // Bytes to the sums of neighbouring pixel pairs in 16-bit lanes.
   static V pairSums(V bytes) { return _mm_maddubs_epi16(bytes, _mm_set1_epi8(1)); }
+  // The same sums times 32 (at most 16320: no saturation).
+  static V pairSums32(V bytes) { return _mm_maddubs_epi16(bytes, _mm_set1_epi8(32)); }
   // Sums of neighbouring lanes: a's pairs, then b's.
   static V hadd16(V a, V b) { return _mm_hadd_epi16(a, b); }
   static V clampNarrow(V bytes) { return _mm_min_epu8(_mm_max_epu8(bytes, _mm_set1_epi8(1)), _mm_set1_epi8(-2)); }
@@ -41,12 +43,21 @@ struct More<Sse> {
     __builtin_memcpy(lo, &a, 4);
     __builtin_memcpy(hi, &b, 4);
   }
+  static V and_(V a, V b) { return _mm_and_si128(a, b); }
+  static V unpackLo32(V a, V b) { return _mm_unpacklo_epi32(a, b); }
+  static V unpackHi32(V a, V b) { return _mm_unpackhi_epi32(a, b); }
+  static V unpackLo64(V a, V b) { return _mm_unpacklo_epi64(a, b); }
+  static V unpackHi64(V a, V b) { return _mm_unpackhi_epi64(a, b); }
+  // Bytes N.. of the 32 bytes lo, hi (hi after lo).
+  template <int N>
+  static V alignr(V hi, V lo) { return _mm_alignr_epi8(hi, lo, N); }
 };
 
 template <>
 struct More<Avx> {
   using V = __m256i;
   ZEL_AVX2 static V pairSums(V bytes) { return _mm256_maddubs_epi16(bytes, _mm256_set1_epi8(1)); }
+  ZEL_AVX2 static V pairSums32(V bytes) { return _mm256_maddubs_epi16(bytes, _mm256_set1_epi8(32)); }
   ZEL_AVX2 static V hadd16(V a, V b) { return _mm256_hadd_epi16(a, b); }
   ZEL_AVX2 static V clampNarrow(V bytes) {
     return _mm256_min_epu8(_mm256_max_epu8(bytes, _mm256_set1_epi8(1)), _mm256_set1_epi8(-2));
@@ -62,6 +73,13 @@ struct More<Avx> {
     More<Sse>::storeQuarters(lo, hi, 0, _mm256_castsi256_si128(v));
     More<Sse>::storeQuarters(lo + unitStride, hi + unitStride, 0, _mm256_extracti128_si256(v, 1));
   }
+  ZEL_AVX2 static V and_(V a, V b) { return _mm256_and_si256(a, b); }
+  ZEL_AVX2 static V unpackLo32(V a, V b) { return _mm256_unpacklo_epi32(a, b); }
+  ZEL_AVX2 static V unpackHi32(V a, V b) { return _mm256_unpackhi_epi32(a, b); }
+  ZEL_AVX2 static V unpackLo64(V a, V b) { return _mm256_unpacklo_epi64(a, b); }
+  ZEL_AVX2 static V unpackHi64(V a, V b) { return _mm256_unpackhi_epi64(a, b); }
+  template <int N>
+  ZEL_AVX2 static V alignr(V hi, V lo) { return _mm256_alignr_epi8(hi, lo, N); }
 };
 
 // Exact 32-bit a * ca + b * cb + c * cc + addend, arithmetic shift by
