@@ -133,6 +133,12 @@ struct Planes420Out {
     U::storeUnits(y1 + x, 16, bottom);
     More<U>::storeHalves(c1 + x / 2, c2 + x / 2, 8, cc);
   }
+  // The quad form (see quadPairBlocks): luma of row 0 or 1 in pixel order,
+  // chroma as QuadOrder leaves it.
+  void quadLuma(int x, int row, __m128i y) const { store128((row ? y1 : y0) + x, y); }
+  ZEL_AVX2 void quadLuma(int x, int row, __m256i y) const { store256((row ? y1 : y0) + x, y); }
+  void quadChroma(int x, __m128i cc) const { More<Sse>::storeHalves(c1 + x / 2, c2 + x / 2, 8, cc); }
+  ZEL_AVX2 void quadChroma(int x, __m256i cc) const;
 };
 
 // 4:2:0 as a luma plane and a plane of interleaved Cb, Cr pairs.
@@ -154,6 +160,10 @@ struct TwoPlane420Out {
     U::storeUnits(y1 + x, 16, bottom);
     U::storeUnits(cbcr + x, 16, U::shuffle8(cc, U::shuffleOf(kZipHalves)));
   }
+  void quadLuma(int x, int row, __m128i y) const { store128((row ? y1 : y0) + x, y); }
+  ZEL_AVX2 void quadLuma(int x, int row, __m256i y) const { store256((row ? y1 : y0) + x, y); }
+  void quadChroma(int x, __m128i cc) const { store128(cbcr + x, _mm_shuffle_epi8(cc, load128(kZipHalves.b))); }
+  ZEL_AVX2 void quadChroma(int x, __m256i cc) const;
 };
 
 // ---- pixels as four-byte quads ----
@@ -201,12 +211,61 @@ inline constexpr Shuffle16 kQuadPairs3[2] = {quadPairBytes(0, 3), quadPairBytes(
 inline constexpr Shuffle16 kQuadLuma3[2][2] = {{quadLumaBytes(0, false), quadLumaBytes(0, true)},
                                                {quadLumaBytes(4, false), quadLumaBytes(4, true)}};
 
-// The quads of a block of 16 pixels a unit: luma lanes (lo: channels 0, 2;
-// hi: channel 1) and the sums of neighbouring pixels' channels.
+// The quads of a block: luma lanes (lo: channels 0, 2; hi: channel 1) and
+// the sums of neighbouring pixels' channels.
+//
+// With SSE4.1 a block is 16 pixels and quad k holds pixels 4k..4k+3. With
+// AVX2 a block is 32 contiguous pixels and quad k holds pixels 8k..8k+3 in
+// its low lane and 8k+4..8k+7 in its high lane: the lane-wise arithmetic
+// then leaves the pixels in a known order, which QuadOrder restores with
+// one cross-lane permutation before the stores.
 template <class U>
 struct Quads {
   typename U::V lo[4], hi[4], pairs[4];
 };
+
+template <class U>
+struct QuadOrder;
+
+template <>
+struct QuadOrder<Sse> {
+  static __m128i chunk4(const uint8_t* p, int k) { return load128(p + 16 * k); }
+  // Three-byte pixels: quad k of the 48 bytes at p, its first pixel at
+  // byte 0 of the vector (or at byte 4 for the last quad), see quadsOf.
+  static __m128i lumaBytes(__m128i v) { return v; }
+};
+
+template <>
+struct QuadOrder<Avx> {
+  ZEL_AVX2 static __m256i chunk4(const uint8_t* p, int k) { return load256(p + 32 * k); }
+  // Luma bytes in the order [0-3, 8-11, 16-19, 24-27 | 4-7, 12-15, ...]
+  // back to pixels 0..31.
+  ZEL_AVX2 static __m256i lumaBytes(__m256i v) {
+    return _mm256_permutevar8x32_epi32(v, _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7));
+  }
+  // Chroma bytes [c1 of blocks 0 1 4 5 8 9 12 13, c2 of them | c1 of 2 3
+  // 6 7 10 11 14 15, c2 of them] to [c1 of blocks 0..15 | c2 of 0..15].
+  ZEL_AVX2 static __m256i chromaPlanes(__m256i v) {
+    const __m256i q = _mm256_permute4x64_epi64(v, 0xD8);
+    return _mm256_shuffle_epi8(q, _mm256_broadcastsi128_si256(
+                                      _mm_setr_epi8(0, 1, 8, 9, 2, 3, 10, 11, 4, 5, 12, 13, 6, 7, 14, 15)));
+  }
+  // The same chroma bytes to c1, c2 pairs of blocks 0..15.
+  ZEL_AVX2 static __m256i chromaPairs(__m256i v) {
+    const __m256i zip = _mm256_shuffle_epi8(
+        v, _mm256_broadcastsi128_si256(_mm_setr_epi8(0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15)));
+    return _mm256_permutevar8x32_epi32(zip, _mm256_setr_epi32(0, 4, 1, 5, 2, 6, 3, 7));
+  }
+};
+
+ZEL_AVX2 inline void Planes420Out::quadChroma(int x, __m256i cc) const {
+  const __m256i planes = QuadOrder<Avx>::chromaPlanes(cc);
+  store128(c1 + x / 2, _mm256_castsi256_si128(planes));
+  store128(c2 + x / 2, _mm256_extracti128_si256(planes, 1));
+}
+ZEL_AVX2 inline void TwoPlane420Out::quadChroma(int x, __m256i cc) const {
+  store256(cbcr + x, QuadOrder<Avx>::chromaPairs(cc));
+}
 
 template <class U>
 ZEL_INLINE Quads<U> quadsOf(const PackedIn<4>& in, int x) {
@@ -215,7 +274,7 @@ ZEL_INLINE Quads<U> quadsOf(const PackedIn<4>& in, int x) {
   Quads<U> q;
   const V high = U::set16(0xFF00), pairs = U::shuffleOf(kQuadPairs4);
   for (int k = 0; k < 4; ++k) {
-    const V c = U::loadUnits(in.p + 4 * x + 16 * k, 64);
+    const V c = QuadOrder<U>::chunk4(in.p + 4 * x, k);
     q.lo[k] = U::template sll16<8>(c);
     q.hi[k] = M::and_(c, high);
     q.pairs[k] = M::pairSums32(U::shuffle8(c, pairs));
@@ -223,23 +282,52 @@ ZEL_INLINE Quads<U> quadsOf(const PackedIn<4>& in, int x) {
   return q;
 }
 
+// Three-byte pixels: each quad is shuffled out of a vector holding its
+// first pixel at byte 0 (`at` 0) or at byte 4 (`at` 1).
 template <class U>
-ZEL_INLINE Quads<U> quadsOf(const PackedIn<3>& in, int x) {
-  using V = typename U::V;
-  using M = More<U>;
-  const uint8_t* p = in.p + 3 * x;
-  const V a = U::loadUnits(p, 48), b = U::loadUnits(p + 16, 48), c = U::loadUnits(p + 32, 48);
+ZEL_INLINE void quadFrom3(Quads<U>& q, int k, typename U::V src, typename U::V luma0, typename U::V luma1,
+                          typename U::V pairs) {
+  q.lo[k] = U::shuffle8(src, luma0);
+  q.hi[k] = U::shuffle8(src, luma1);
+  q.pairs[k] = More<U>::pairSums32(U::shuffle8(src, pairs));
+}
+
+ZEL_INLINE Quads<Sse> quadsOf3(const uint8_t* p, Sse) {
+  using M = More<Sse>;
+  const __m128i a = load128(p), b = load128(p + 16), c = load128(p + 32);
   // Quads 0..3 start at bytes 0, 12, 24, 36: at byte 0 of a, of b:a from
   // 12, of c:b from 8, and at byte 4 of c.
-  const V src[4] = {a, M::template alignr<12>(b, a), M::template alignr<8>(c, b), c};
-  Quads<U> q;
+  const __m128i src[4] = {a, M::alignr<12>(b, a), M::alignr<8>(c, b), c};
+  Quads<Sse> q;
   for (int k = 0; k < 4; ++k) {
     const int at = k == 3 ? 1 : 0;
-    q.lo[k] = U::shuffle8(src[k], U::shuffleOf(kQuadLuma3[at][0]));
-    q.hi[k] = U::shuffle8(src[k], U::shuffleOf(kQuadLuma3[at][1]));
-    q.pairs[k] = M::pairSums32(U::shuffle8(src[k], U::shuffleOf(kQuadPairs3[at])));
+    quadFrom3<Sse>(q, k, src[k], load128(kQuadLuma3[at][0].b), load128(kQuadLuma3[at][1].b),
+                   load128(kQuadPairs3[at].b));
   }
   return q;
+}
+
+// A pattern for each lane.
+ZEL_AVX2 inline __m256i both(const Shuffle16& lo, const Shuffle16& hi) {
+  return _mm256_inserti128_si256(_mm256_castsi128_si256(load128(lo.b)), load128(hi.b), 1);
+}
+
+ZEL_AVX2 inline Quads<Avx> quadsOf3(const uint8_t* p, Avx) {
+  // Quad k: pixels 8k..8k+3 from byte 24k in the low lane, 8k+4..8k+7 from
+  // byte 24k + 12, that is byte 4 of the high lane after the qwords of
+  // 24k.. are spread as 0, 1 | 1, 2. The last quad loads from byte 64 (the
+  // block ends at 96) and spreads qwords 1, 2 | 2, 3.
+  const __m256i l0 = both(kQuadLuma3[0][0], kQuadLuma3[1][0]), l1 = both(kQuadLuma3[0][1], kQuadLuma3[1][1]),
+                pr = both(kQuadPairs3[0], kQuadPairs3[1]);
+  Quads<Avx> q;
+  for (int k = 0; k < 3; ++k) quadFrom3<Avx>(q, k, _mm256_permute4x64_epi64(load256(p + 24 * k), 0x94), l0, l1, pr);
+  quadFrom3<Avx>(q, 3, _mm256_permute4x64_epi64(load256(p + 64), 0xE9), l0, l1, pr);
+  return q;
+}
+
+template <class U>
+ZEL_INLINE Quads<U> quadsOf(const PackedIn<3>& in, int x) {
+  return quadsOf3(in.p + 3 * x, U{});
 }
 
 // Luma bytes of the 16 pixels of a unit from their quads.
@@ -252,21 +340,28 @@ ZEL_INLINE typename U::V quadLuma(const Quads<U>& q, const Body& body) {
   V t[4];
   for (int k = 0; k < 4; ++k)
     t[k] = U::add16(body.template quadTerm<U>(q.lo[k], kLo), body.template quadTerm<U>(q.hi[k], kHi));
-  return U::packU8(body.template quadLuma<U>(M::hadd16(t[0], t[1])), body.template quadLuma<U>(M::hadd16(t[2], t[3])));
+  return QuadOrder<U>::lumaBytes(U::packU8(body.template quadLuma<U>(M::hadd16(t[0], t[1])),
+                                          body.template quadLuma<U>(M::hadd16(t[2], t[3]))));
 }
 
 template <class U, bool Bgr, int Stride, class Body, class Out>
-ZEL_INLINE int quadPairBlocks(const PackedIn<Stride>& top, const PackedIn<Stride>& bottom, const Out& out, int x,
+ZEL_INLINE int quadPairBlocks(const PackedIn<Stride>& topIn, const PackedIn<Stride>& bottomIn, const Out& outIn, int x,
                               int end, const Body& body) {
   using V = typename U::V;
   using M = More<U>;
+  // Local copies: the byte stores cannot alias them, so the row pointers
+  // stay in registers.
+  const PackedIn<Stride> rows[2] = {topIn, bottomIn};
+  const Out out = outIn;
   for (; x + U::kPixels <= end; x += U::kPixels) {
-    const Quads<U> q0 = quadsOf<U>(top, x);
-    V y0 = quadLuma<U, Bgr>(q0, body);
-    const Quads<U> q1 = quadsOf<U>(bottom, x);
-    V y1 = quadLuma<U, Bgr>(q1, body);
     V s[4];
-    for (int k = 0; k < 4; ++k) s[k] = U::add16(q0.pairs[k], q1.pairs[k]);
+    for (int r = 0; r < 2; ++r) {
+      const Quads<U> q = quadsOf<U>(rows[r], x);
+      V y = quadLuma<U, Bgr>(q, body);
+      if constexpr (Body::kNarrow) y = M::clampNarrow(y);
+      out.quadLuma(x, r, y);
+      for (int k = 0; k < 4; ++k) s[k] = r ? U::add16(s[k], q.pairs[k]) : q.pairs[k];
+    }
     // s[k]: channel 0 of blocks 2k, 2k + 1, channel 1 of them, channel 2.
     const V a = M::unpackLo32(s[0], s[1]), b = M::unpackHi32(s[0], s[1]);
     const V c = M::unpackLo32(s[2], s[3]), d = M::unpackHi32(s[2], s[3]);
@@ -274,12 +369,8 @@ ZEL_INLINE int quadPairBlocks(const PackedIn<Stride>& top, const PackedIn<Stride
     V c1, c2;
     body.template chromaOf32<U>(Bgr ? ch2 : ch0, ch1, Bgr ? ch0 : ch2, c1, c2);
     V cc = U::packU8(c1, c2);
-    if constexpr (Body::kNarrow) {
-      y0 = M::clampNarrow(y0);
-      y1 = M::clampNarrow(y1);
-      cc = M::clampNarrow(cc);
-    }
-    out.template block<U>(x, y0, y1, cc);
+    if constexpr (Body::kNarrow) cc = M::clampNarrow(cc);
+    out.quadChroma(x, cc);
   }
   return x;
 }

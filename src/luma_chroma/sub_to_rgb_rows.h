@@ -191,7 +191,11 @@ ZEL_INLINE Spread<U> spread(const Trio<U>& t) {
 }
 
 template <class U, int Rows, class Luma, class Chroma, class Out, class Form>
-ZEL_INLINE int expandBlocks(const RowSet<Rows, Luma, Chroma, Out>& rows, int x, int end, const Form& form) {
+ZEL_INLINE int expandBlocks(const RowSet<Rows, Luma, Chroma, Out>& rowSet, int x, int end, const Form& formIn) {
+  // Local copies: the destination's byte stores cannot alias them, so the
+  // row pointers and the constants stay in registers across the loop.
+  const RowSet<Rows, Luma, Chroma, Out> rows = rowSet;
+  const Form form = formIn;
   for (; x + U::kPixels <= end; x += U::kPixels) {
     const ChromaLanes<U> c = rows.chroma.template chromaBlock<U>(x);
     const Spread<U> t = spread<Chroma::kSpread, U>(form.template chroma<U>(c.u, c.v));
