@@ -103,6 +103,35 @@ const CvtRow kCvtRows[] = {
     {"zeliYCCToRGB_32f_C3R", "OpenCV cvtColor YCrCb2RGB 32f", CV_32FC3, CV_32FC3, cv::COLOR_YCrCb2RGB},
 };
 
+// Subsampled frames: a 4:2:0 frame is one plane of height times 3 / 2 rows
+// (luma, then the two chroma planes), a 4:2:2 stream has two channels.
+struct SubCvtRow {
+  const char* exportName;
+  const char* label;
+  bool i420Source;
+  int srcType, dstType, code;
+};
+const SubCvtRow kSubCvtRows[] = {
+    {"zeliBGRToYCbCr420_8u_C3P3R", "OpenCV cvtColor BGR2YUV_I420", false, CV_8UC3, CV_8UC1, cv::COLOR_BGR2YUV_I420},
+    {"zeliBGRToYCbCr420_8u_AC4P3R", "OpenCV cvtColor BGRA2YUV_I420", false, CV_8UC4, CV_8UC1,
+     cv::COLOR_BGRA2YUV_I420},
+    {"zeliYCbCr420ToRGB_8u_P3C3R", "OpenCV cvtColor YUV2RGB_I420", true, CV_8UC1, CV_8UC3, cv::COLOR_YUV2RGB_I420},
+    {"zeliYCbCr420ToBGR_8u_P3C3R", "OpenCV cvtColor YUV2BGR_I420", true, CV_8UC1, CV_8UC3, cv::COLOR_YUV2BGR_I420},
+    {"zeliYCbCr420ToBGR_8u_P3C4R", "OpenCV cvtColor YUV2BGRA_I420", true, CV_8UC1, CV_8UC4, cv::COLOR_YUV2BGRA_I420},
+    {"zeliYCbCr422ToRGB_8u_C2C3R", "OpenCV cvtColor YUV2RGB_YUY2", false, CV_8UC2, CV_8UC3, cv::COLOR_YUV2RGB_YUY2},
+    {"zeliYCbCr422ToBGR_8u_C2C4R", "OpenCV cvtColor YUV2BGRA_YUY2", false, CV_8UC2, CV_8UC4,
+     cv::COLOR_YUV2BGRA_YUY2},
+};
+
+Peer subCvtPeer(const SubCvtRow& row) {
+  auto src = std::make_shared<cv::Mat>(row.i420Source ? kHeight * 3 / 2 : kHeight, kWidth, row.srcType);
+  cv::randu(*src, 0, 255);
+  auto dst = std::make_shared<cv::Mat>();
+  const int code = row.code;
+  cv::cvtColor(*src, *dst, code);  // sizes the destination once
+  return {row.label, [src, dst, code] { cv::cvtColor(*src, *dst, code); }};
+}
+
 // Gamma of 8-bit samples: one table lookup per sample.
 Peer lutPeer() {
   auto src = std::make_shared<cv::Mat>(kHeight, kWidth, CV_8UC3);
@@ -264,6 +293,20 @@ const std::map<std::string, PeerFactory>& table() {
          return yuvPeer("libyuv I420ToRGB24", [](YuvFrame& f) {
            libyuv::I420ToRGB24(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
                                kWidth * 3, kWidth, kHeight);
+         });
+       }},
+      {"zeliYCbCr420ToRGB_8u_P3C3R",
+       [] {
+         return yuvPeer("libyuv I420ToRAW", [](YuvFrame& f) {
+           libyuv::I420ToRAW(f.y.data(), kWidth, f.u.data(), kWidth / 2, f.v.data(), kWidth / 2, f.argb.data(),
+                             kWidth * 3, kWidth, kHeight);
+         });
+       }},
+      // No three-byte peer of a 4:2:2 stream: the four-byte one writes more.
+      {"zeliYCbCr422ToRGB_8u_C2C3R",
+       [] {
+         return yuvPeer("libyuv YUY2ToARGB", [](YuvFrame& f) {
+           libyuv::YUY2ToARGB(f.packed.data(), kWidth * 2, f.argb.data(), kWidth * 4, kWidth, kHeight);
          });
        }},
       {"zeliYCbCr420ToBGR_8u_P3C4R",
@@ -494,6 +537,8 @@ std::vector<Peer> peersOf(const std::string& exportName) {
 #ifdef ZELCC_BENCH_OPENCV
   for (const CvtRow& row : kCvtRows)
     if (exportName == row.exportName) out.push_back(cvtColorPeer(row.label, row.srcType, row.dstType, row.code));
+  for (const SubCvtRow& row : kSubCvtRows)
+    if (exportName == row.exportName) out.push_back(subCvtPeer(row));
   if (exportName == "zeliGammaFwd_8u_C3R" || exportName == "zeliGammaInv_8u_C3R") out.push_back(lutPeer());
   if (exportName == "zeliColorTwist32f_8u_C3R") out.push_back(transformPeer(CV_8UC3));
   if (exportName == "zeliColorTwist32f_32f_C3R") out.push_back(transformPeer(CV_32FC3));
@@ -507,6 +552,7 @@ std::vector<std::string> exportsWithPeers() {
   for (const auto& [name, factory] : table()) out.push_back(name);
 #ifdef ZELCC_BENCH_OPENCV
   for (const CvtRow& row : kCvtRows) out.push_back(row.exportName);
+  for (const SubCvtRow& row : kSubCvtRows) out.push_back(row.exportName);
   for (const char* n : {"zeliGammaFwd_8u_C3R", "zeliGammaInv_8u_C3R", "zeliColorTwist32f_8u_C3R",
                         "zeliColorTwist32f_32f_C3R", "zeliToneMapLinear_32f8u_C1R"})
     out.push_back(n);
