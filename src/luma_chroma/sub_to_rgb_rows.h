@@ -14,6 +14,7 @@
 #pragma once
 
 #include <cstdint>
+#include <type_traits>
 
 #include "frame/simd.h"
 #include "luma_chroma/pixel_rows.h"
@@ -109,6 +110,8 @@ struct ChromaPairs {
 // (from the first 16 bytes) or 4..7 (from the second).
 struct StreamPatterns {
   Shuffle16 luma, cbLow, cbHigh, crLow, crHigh;
+  // The 4 Cb samples of 16 bytes into lanes 0..3, the 4 Cr into 4..7.
+  Shuffle16 chroma;
 };
 constexpr StreamPatterns makeStreamPatterns(repack::PairOrder order) {
   const repack::PairSlots s = repack::slotsOf(order);
@@ -123,6 +126,10 @@ constexpr StreamPatterns makeStreamPatterns(repack::PairOrder order) {
     p.crLow.b[2 * j] = static_cast<int8_t>(4 * j + s.cr);
     p.cbHigh.b[8 + 2 * j] = static_cast<int8_t>(4 * j + s.cb);
     p.crHigh.b[8 + 2 * j] = static_cast<int8_t>(4 * j + s.cr);
+    p.chroma.b[2 * j] = static_cast<int8_t>(4 * j + s.cb);
+    p.chroma.b[2 * j + 1] = -1;
+    p.chroma.b[8 + 2 * j] = static_cast<int8_t>(4 * j + s.cr);
+    p.chroma.b[8 + 2 * j + 1] = -1;
   }
   return p;
 }
@@ -190,12 +197,130 @@ ZEL_INLINE Spread<U> spread(const Trio<U>& t) {
   }
 }
 
+// ---- pair streams in one pass ----
+//
+// A pair stream is read once for its luma and its chroma. With AVX2 and a
+// four-byte destination a block is 32 contiguous pixels whose 64 source
+// bytes are loaded as two vectors with their qwords spread 0, 2 | 1, 3: the
+// low lanes then hold pixels 0-3, 8-11, 16-19, 24-27 and the high lanes
+// 4-7, 12-15, 20-23, 28-31, and the merged pixels come out in memory order,
+// 8 to a register. Otherwise the units are those of the other blocks.
+
+template <class U, bool Flat>
+struct StreamLoad;
+
+template <>
+struct StreamLoad<Sse, false> {
+  static __m128i first(const uint8_t* q) { return load128(q); }
+  static __m128i second(const uint8_t* q) { return load128(q + 16); }
+  static __m128i lowHalves(__m128i a, __m128i b) { return _mm_unpacklo_epi64(a, b); }
+  static __m128i highHalves(__m128i a, __m128i b) { return _mm_unpackhi_epi64(a, b); }
+};
+
+template <>
+struct StreamLoad<Avx, false> {
+  ZEL_AVX2 static __m256i first(const uint8_t* q) { return Avx::loadUnits(q, 32); }
+  ZEL_AVX2 static __m256i second(const uint8_t* q) { return Avx::loadUnits(q + 16, 32); }
+  ZEL_AVX2 static __m256i lowHalves(__m256i a, __m256i b) { return _mm256_unpacklo_epi64(a, b); }
+  ZEL_AVX2 static __m256i highHalves(__m256i a, __m256i b) { return _mm256_unpackhi_epi64(a, b); }
+};
+
+template <>
+struct StreamLoad<Avx, true> : StreamLoad<Avx, false> {
+  ZEL_AVX2 static __m256i first(const uint8_t* q) { return _mm256_permute4x64_epi64(load256(q), 0xD8); }
+  ZEL_AVX2 static __m256i second(const uint8_t* q) { return _mm256_permute4x64_epi64(load256(q + 32), 0xD8); }
+};
+
+// Four-byte pixels of a flat block: registers of 8 pixels in memory order.
+template <bool Reverse>
+ZEL_AVX2 inline void storeFlat(const PackedOutAlpha<Reverse>& out, int x, const Trio<Avx>& v) {
+  const __m256i first = Reverse ? v.c2 : v.c0, third = Reverse ? v.c0 : v.c2;
+  const __m256i a = _mm256_set1_epi8(static_cast<char>(out.alpha));
+  const __m256i lo01 = _mm256_unpacklo_epi8(first, v.c1), hi01 = _mm256_unpackhi_epi8(first, v.c1);
+  const __m256i lo23 = _mm256_unpacklo_epi8(third, a), hi23 = _mm256_unpackhi_epi8(third, a);
+  uint8_t* q = out.p + 4 * x;
+  store256(q, _mm256_unpacklo_epi16(lo01, lo23));
+  store256(q + 32, _mm256_unpackhi_epi16(lo01, lo23));
+  store256(q + 64, _mm256_unpacklo_epi16(hi01, hi23));
+  store256(q + 96, _mm256_unpackhi_epi16(hi01, hi23));
+}
+
+template <class Out>
+struct FlatOut : std::false_type {};
+template <bool Reverse>
+struct FlatOut<PackedOutAlpha<Reverse>> : std::true_type {};
+
+template <class U, bool Flat, repack::PairOrder Order, class Out, class Form>
+ZEL_INLINE int streamBlocks(const PairStream<Order>& in, const Out& out, int x, int end, const Form& form) {
+  using V = typename U::V;
+  using L = StreamLoad<U, Flat>;
+  const StreamPatterns& k = kStreamPatterns<Order>;
+  const V luma = U::shuffleOf(k.luma), chroma = U::shuffleOf(k.chroma);
+  for (; x + U::kPixels <= end; x += U::kPixels) {
+    const uint8_t* q = in.p + 2 * x;
+    const V a = L::first(q), b = L::second(q);
+    const V ca = U::shuffle8(a, chroma), cb = U::shuffle8(b, chroma);
+    const Spread<U> t = spread<2, U>(form.template chroma<U>(L::lowHalves(ca, cb), L::highHalves(ca, cb)));
+    const Trio<U> lo = form.template combine<U>(U::shuffle8(a, luma), t.lo);
+    const Trio<U> hi = form.template combine<U>(U::shuffle8(b, luma), t.hi);
+    const Trio<U> bytes{U::packU8(lo.c0, hi.c0), U::packU8(lo.c1, hi.c1), U::packU8(lo.c2, hi.c2)};
+    if constexpr (Flat)
+      storeFlat(out, x, bytes);
+    else
+      out.template block<U>(x, bytes);
+  }
+  return x;
+}
+
+// Luma rows and 4:2:0 or 4:2:2 chroma planes into four-byte pixels, with
+// AVX2: blocks of 32 contiguous pixels laid out as the flat stream blocks
+// (dwords 0, 2, 4, 6 of the luma in the low lane, 1, 3, 5, 7 in the high
+// one), the chroma samples of each lane picked from 16 bytes of each plane.
+template <int Rows, class Out, class Form>
+ZEL_AVX2 inline int planesFlatBlocks(const RowSet<Rows, LumaRow, ChromaPlanes<2>, Out>& rows, int x, int end,
+                                     const Form& form) {
+  const __m256i dwords = _mm256_setr_epi32(0, 2, 4, 6, 1, 3, 5, 7);
+  const __m256i pick = _mm256_setr_epi8(0, -1, 1, -1, 4, -1, 5, -1, 8, -1, 9, -1, 12, -1, 13, -1,  //
+                                        2, -1, 3, -1, 6, -1, 7, -1, 10, -1, 11, -1, 14, -1, 15, -1);
+  const __m256i z = _mm256_setzero_si256();
+  for (; x + 32 <= end; x += 32) {
+    const __m256i u = _mm256_shuffle_epi8(_mm256_broadcastsi128_si256(load128(rows.chroma.cb + x / 2)), pick);
+    const __m256i v = _mm256_shuffle_epi8(_mm256_broadcastsi128_si256(load128(rows.chroma.cr + x / 2)), pick);
+    const Spread<Avx> t = spread<2, Avx>(form.template chroma<Avx>(u, v));
+    for (int r = 0; r < Rows; ++r) {
+      const __m256i y = _mm256_permutevar8x32_epi32(load256(rows.luma[r].p + x), dwords);
+      const Trio<Avx> lo = form.template combine<Avx>(_mm256_unpacklo_epi8(y, z), t.lo);
+      const Trio<Avx> hi = form.template combine<Avx>(_mm256_unpackhi_epi8(y, z), t.hi);
+      storeFlat(rows.out[r], x,
+                Trio<Avx>{_mm256_packus_epi16(lo.c0, hi.c0), _mm256_packus_epi16(lo.c1, hi.c1),
+                          _mm256_packus_epi16(lo.c2, hi.c2)});
+    }
+  }
+  return x;
+}
+
+template <class Set>
+struct PlanesFlatSet : std::false_type {};
+template <int Rows, bool Reverse>
+struct PlanesFlatSet<RowSet<Rows, LumaRow, ChromaPlanes<2>, PackedOutAlpha<Reverse>>> : std::true_type {};
+
+template <class Set>
+struct StreamSet : std::false_type {};
+template <repack::PairOrder Order, class Out>
+struct StreamSet<RowSet<1, PairStream<Order>, PairStream<Order>, Out>> : std::true_type {};
+
 template <class U, int Rows, class Luma, class Chroma, class Out, class Form>
 ZEL_INLINE int expandBlocks(const RowSet<Rows, Luma, Chroma, Out>& rowSet, int x, int end, const Form& formIn) {
   // Local copies: the destination's byte stores cannot alias them, so the
   // row pointers and the constants stay in registers across the loop.
   const RowSet<Rows, Luma, Chroma, Out> rows = rowSet;
   const Form form = formIn;
+  if constexpr (StreamSet<RowSet<Rows, Luma, Chroma, Out>>::value) {
+    constexpr bool kFlat = std::is_same_v<U, Avx> && FlatOut<Out>::value;
+    return streamBlocks<U, kFlat>(rows.chroma, rows.out[0], x, end, form);
+  }
+  if constexpr (std::is_same_v<U, Avx> && PlanesFlatSet<RowSet<Rows, Luma, Chroma, Out>>::value)
+    return planesFlatBlocks(rows, x, end, form);
   for (; x + U::kPixels <= end; x += U::kPixels) {
     const ChromaLanes<U> c = rows.chroma.template chromaBlock<U>(x);
     const Spread<U> t = spread<Chroma::kSpread, U>(form.template chroma<U>(c.u, c.v));
