@@ -15,6 +15,7 @@
 
 #include <cstdint>
 #include <cstring>
+#include <type_traits>
 
 #include "frame/simd.h"
 
@@ -296,10 +297,17 @@ ZEL_LANE_AVX2 I8 iselect(I8 mask, I8 a, I8 b) { return {_mm256_blendv_epi8(b.v, 
 ZEL_LANE_AVX2 I8 iselect(F8 mask, I8 a, I8 b) { return iselect(asInt(mask), a, b); }
 ZEL_LANE_AVX2 I8 multiplyAddPairs(I8 a, I8 b) { return {_mm256_madd_epi16(a.v, b.v)}; }
 
+// Eight pairs, each one 64-bit read: cheaper than two gathers of floats.
 ZEL_LANE_AVX2 void gatherPairs(const float (*table)[2], I8 index, F8& c, F8& w) {
-  const __m256i at = _mm256_slli_epi32(index.v, 1);
-  c.v = _mm256_i32gather_ps(&table[0][0], at, 4);
-  w.v = _mm256_i32gather_ps(&table[0][1], at, 4);
+  alignas(32) int32_t at[8];
+  _mm256_store_si256(reinterpret_cast<__m256i*>(at), index.v);
+  auto pair = [&](int k) { return _mm_castpd_ps(_mm_load_sd(reinterpret_cast<const double*>(table[at[k]]))); };
+  auto high = [&](__m128 lo, int k) { return _mm_loadh_pi(lo, reinterpret_cast<const __m64*>(table[at[k]])); };
+  // [c0 w0 c1 w1 | c4 w4 c5 w5] and [c2 w2 c3 w3 | c6 w6 c7 w7].
+  const __m256 a = _mm256_insertf128_ps(_mm256_castps128_ps256(high(pair(0), 1)), high(pair(4), 5), 1);
+  const __m256 b = _mm256_insertf128_ps(_mm256_castps128_ps256(high(pair(2), 3)), high(pair(6), 7), 1);
+  c.v = _mm256_shuffle_ps(a, b, _MM_SHUFFLE(2, 0, 2, 0));
+  w.v = _mm256_shuffle_ps(a, b, _MM_SHUFFLE(3, 1, 3, 1));
 }
 
 // Eight pixels are two blocks of four.
@@ -315,8 +323,35 @@ ZEL_LANE_AVX2 void loadRaw(const T* p, I8& c0, I8& c1, I8& c2) {
   c0 = join(a0, b0), c1 = join(a1, b1), c2 = join(a2, b2);
 }
 
+// Eight float pixels of three samples are three whole vectors: each
+// channel is picked from the three by two blends (its samples sit at
+// distinct places of the three) and put in pixel order by one permute.
+// Storing is the same the other way round.
+ZEL_LANE_AVX2 void loadFloat3(const float* p, F8& c0, F8& c1, F8& c2) {
+  const __m256 v0 = _mm256_loadu_ps(p), v1 = _mm256_loadu_ps(p + 8), v2 = _mm256_loadu_ps(p + 16);
+  const __m256 a = _mm256_blend_ps(_mm256_blend_ps(v0, v1, 0x92), v2, 0x24);
+  const __m256 b = _mm256_blend_ps(_mm256_blend_ps(v0, v1, 0x24), v2, 0x49);
+  const __m256 c = _mm256_blend_ps(_mm256_blend_ps(v0, v1, 0x49), v2, 0x92);
+  c0.v = _mm256_permutevar8x32_ps(a, _mm256_setr_epi32(0, 3, 6, 1, 4, 7, 2, 5));
+  c1.v = _mm256_permutevar8x32_ps(b, _mm256_setr_epi32(1, 4, 7, 2, 5, 0, 3, 6));
+  c2.v = _mm256_permutevar8x32_ps(c, _mm256_setr_epi32(2, 5, 0, 3, 6, 1, 4, 7));
+}
+
+ZEL_LANE_AVX2 void storeFloat3(float* p, F8 c0, F8 c1, F8 c2) {
+  const __m256 a = _mm256_permutevar8x32_ps(c0.v, _mm256_setr_epi32(0, 3, 6, 1, 4, 7, 2, 5));
+  const __m256 b = _mm256_permutevar8x32_ps(c1.v, _mm256_setr_epi32(5, 0, 3, 6, 1, 4, 7, 2));
+  const __m256 c = _mm256_permutevar8x32_ps(c2.v, _mm256_setr_epi32(2, 5, 0, 3, 6, 1, 4, 7));
+  _mm256_storeu_ps(p, _mm256_blend_ps(_mm256_blend_ps(a, b, 0x92), c, 0x24));
+  _mm256_storeu_ps(p + 8, _mm256_blend_ps(_mm256_blend_ps(c, a, 0x92), b, 0x24));
+  _mm256_storeu_ps(p + 16, _mm256_blend_ps(_mm256_blend_ps(b, c, 0x92), a, 0x24));
+}
+
 template <int Stride, bool Bias16, typename T>
 ZEL_LANE_AVX2 void loadPixels(const T* p, F8& c0, F8& c1, F8& c2) {
+  if constexpr (std::is_same_v<T, float> && Stride == 3) {
+    loadFloat3(p, c0, c1, c2);
+    return;
+  }
   I8 r0, r1, r2;
   loadRaw<Stride, Bias16>(p, r0, r1, r2);
   if constexpr (sizeof(T) == 4) {
@@ -334,7 +369,8 @@ ZEL_LANE_AVX2 void storeRaw(T* p, I8 c0, I8 c1, I8 c2) {
 
 template <int Stride>
 ZEL_LANE_AVX2 void storePixels(float* p, F8 c0, F8 c1, F8 c2) {
-  storeRaw<Stride, false>(p, asInt(c0), asInt(c1), asInt(c2));
+  if constexpr (Stride == 3) storeFloat3(p, c0, c1, c2);
+  else storeRaw<Stride, false>(p, asInt(c0), asInt(c1), asInt(c2));
 }
 
 // Integer results clamped to the range of a sample: SaturateU8 (also after
