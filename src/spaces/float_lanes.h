@@ -315,8 +315,43 @@ ZEL_LANE_AVX2 I8 join(I4 lo, I4 hi) { return {_mm256_inserti128_si256(_mm256_cas
 ZEL_LANE_AVX2 I4 lowHalf(I8 a) { return {_mm256_castsi256_si128(a.v)}; }
 ZEL_LANE_AVX2 I4 highHalf(I8 a) { return {_mm256_extracti128_si256(a.v, 1)}; }
 
+// Eight byte pixels of three samples, 24 bytes: the first four pixels in
+// the low half of a vector, the last four in the high half at the same
+// places, so one byte shuffle a channel serves both halves.
+ZEL_LANE_AVX2 void loadBytes3(const uint8_t* p, I8& c0, I8& c1, I8& c2) {
+  const __m128i lo = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
+  const __m128i hi = _mm_alignr_epi8(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(p + 16)), lo, 12);
+  const __m256i v = _mm256_inserti128_si256(_mm256_castsi128_si256(lo), hi, 1);
+  c0.v = _mm256_shuffle_epi8(v, _mm256_setr_epi8(0, -1, -1, -1, 3, -1, -1, -1, 6, -1, -1, -1, 9, -1, -1, -1, 0, -1, -1,
+                                                 -1, 3, -1, -1, -1, 6, -1, -1, -1, 9, -1, -1, -1));
+  c1.v = _mm256_shuffle_epi8(v, _mm256_setr_epi8(1, -1, -1, -1, 4, -1, -1, -1, 7, -1, -1, -1, 10, -1, -1, -1, 1, -1,
+                                                 -1, -1, 4, -1, -1, -1, 7, -1, -1, -1, 10, -1, -1, -1));
+  c2.v = _mm256_shuffle_epi8(v, _mm256_setr_epi8(2, -1, -1, -1, 5, -1, -1, -1, 8, -1, -1, -1, 11, -1, -1, -1, 2, -1,
+                                                 -1, -1, 5, -1, -1, -1, 8, -1, -1, -1, 11, -1, -1, -1));
+}
+
+// The low byte of each lane back to its place; 24 bytes written.
+ZEL_LANE_AVX2 void storeBytes3(uint8_t* p, I8 c0, I8 c1, I8 c2) {
+  const __m256i v = _mm256_or_si256(
+      _mm256_or_si256(_mm256_shuffle_epi8(c0.v, _mm256_setr_epi8(0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1, -1,
+                                                                 -1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1,
+                                                                 -1, -1, -1)),
+                      _mm256_shuffle_epi8(c1.v, _mm256_setr_epi8(-1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1,
+                                                                 -1, -1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1,
+                                                                 -1, -1, -1))),
+      _mm256_shuffle_epi8(c2.v, _mm256_setr_epi8(-1, -1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1, -1, -1, 0,
+                                                 -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1)));
+  const __m128i lo = _mm256_castsi256_si128(v), hi = _mm256_extracti128_si256(v, 1);
+  _mm_storeu_si128(reinterpret_cast<__m128i*>(p), _mm_or_si128(lo, _mm_slli_si128(hi, 12)));
+  _mm_storel_epi64(reinterpret_cast<__m128i*>(p + 16), _mm_srli_si128(hi, 4));
+}
+
 template <int Stride, bool Bias16, typename T>
 ZEL_LANE_AVX2 void loadRaw(const T* p, I8& c0, I8& c1, I8& c2) {
+  if constexpr (Stride == 3 && sizeof(T) == 1) {
+    loadBytes3(p, c0, c1, c2);
+    return;
+  }
   I4 a0, a1, a2, b0, b1, b2;
   loadRaw<Stride, Bias16>(p, a0, a1, a2);
   loadRaw<Stride, Bias16>(p + 4 * Stride, b0, b1, b2);
@@ -363,6 +398,10 @@ ZEL_LANE_AVX2 void loadPixels(const T* p, F8& c0, F8& c1, F8& c2) {
 
 template <int Stride, bool Bias16, typename T>
 ZEL_LANE_AVX2 void storeRaw(T* p, I8 c0, I8 c1, I8 c2) {
+  if constexpr (Stride == 3 && sizeof(T) == 1) {
+    storeBytes3(p, c0, c1, c2);
+    return;
+  }
   storeRaw<Stride, Bias16>(p, lowHalf(c0), lowHalf(c1), lowHalf(c2));
   storeRaw<Stride, Bias16>(p + 4 * Stride, highHalf(c0), highHalf(c1), highHalf(c2));
 }
