@@ -412,11 +412,40 @@ ZEL_LANE_AVX2 void storePixels(float* p, F8 c0, F8 c1, F8 c2) {
   else storeRaw<Stride, false>(p, asInt(c0), asInt(c1), asInt(c2));
 }
 
+// Integer lanes stored as bytes saturated to 0..255 (SaturateS16 then
+// SaturateU8, which together clamp any int32 to 0..255). Eight pixels of
+// three bytes pack with saturation and take one shuffle; other shapes clamp
+// and store the low bytes.
+template <int Stride>
+ZEL_LANE void storeClampedBytes(uint8_t* p, I4 c0, I4 c1, I4 c2);
+template <int Stride>
+ZEL_LANE_AVX2 void storeClampedBytes(uint8_t* p, I8 c0, I8 c1, I8 c2);
+
 // Integer results clamped to the range of a sample: SaturateU8 (also after
 // SaturateS16, which it absorbs) and SaturateU16.
 ZEL_LANE I4 clampToByte(I4 x) { return imax(imin(x, I4::splat(255)), I4::splat(0)); }
 ZEL_LANE I4 clampToWord(I4 x) { return imax(imin(x, I4::splat(65535)), I4::splat(0)); }
 ZEL_LANE_AVX2 I8 clampToByte(I8 x) { return imax(imin(x, I8::splat(255)), I8::splat(0)); }
 ZEL_LANE_AVX2 I8 clampToWord(I8 x) { return imax(imin(x, I8::splat(65535)), I8::splat(0)); }
+
+template <int Stride>
+ZEL_LANE void storeClampedBytes(uint8_t* p, I4 c0, I4 c1, I4 c2) {
+  storeRaw<Stride, false>(p, clampToByte(c0), clampToByte(c1), clampToByte(c2));
+}
+template <int Stride>
+ZEL_LANE_AVX2 void storeClampedBytes(uint8_t* p, I8 c0, I8 c1, I8 c2) {
+  if constexpr (Stride == 3) {
+    // Per half: c0 of four pixels, c1, c2, c2 again, as saturated bytes.
+    const __m256i words01 = _mm256_packs_epi32(c0.v, c1.v), words22 = _mm256_packs_epi32(c2.v, c2.v);
+    const __m256i bytes = _mm256_packus_epi16(words01, words22);
+    const __m256i v = _mm256_shuffle_epi8(bytes, _mm256_setr_epi8(0, 4, 8, 1, 5, 9, 2, 6, 10, 3, 7, 11, -1, -1, -1, -1, 0,
+                                                                  4, 8, 1, 5, 9, 2, 6, 10, 3, 7, 11, -1, -1, -1, -1));
+    const __m128i lo = _mm256_castsi256_si128(v), hi = _mm256_extracti128_si256(v, 1);
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(p), _mm_or_si128(lo, _mm_slli_si128(hi, 12)));
+    _mm_storel_epi64(reinterpret_cast<__m128i*>(p + 16), _mm_srli_si128(hi, 4));
+  } else {
+    storeRaw<Stride, false>(p, clampToByte(c0), clampToByte(c1), clampToByte(c2));
+  }
+}
 
 }  // namespace zel::lanes
