@@ -45,6 +45,8 @@ struct Sse {
   static constexpr bool kWholeFloat3 = false;
   static void loadFloat3(const float*, F*) {}
   static void storeFloat3(float*, const F*) {}
+  static void loadBytes3(const uint8_t*, F*) {}
+  static void storeBytes3(uint8_t*, const I*) {}
 };
 
 namespace sse41 {
@@ -90,6 +92,14 @@ struct Avx {
     c[0] = c0.v, c[1] = c1.v, c[2] = c2.v;
   }
   static void storeFloat3(float* p, const F* c) { lanes::storeFloat3(p, {c[0]}, {c[1]}, {c[2]}); }
+  // Eight pixels of three bytes as float lanes, and integer lanes (already
+  // clamped) back to their low bytes.
+  static void loadBytes3(const uint8_t* p, F* c) {
+    lanes::I8 c0, c1, c2;
+    lanes::loadBytes3(p, c0, c1, c2);
+    c[0] = _mm256_cvtepi32_ps(c0.v), c[1] = _mm256_cvtepi32_ps(c1.v), c[2] = _mm256_cvtepi32_ps(c2.v);
+  }
+  static void storeBytes3(uint8_t* p, const I* c) { lanes::storeBytes3(p, {c[0]}, {c[1]}, {c[2]}); }
 };
 
 namespace avx2 {

@@ -52,6 +52,19 @@ inline int forwardGroups(const typename M::In& in, const typename M::Out& out, i
   using F = typename V::F;
   using I = typename V::I;
   constexpr int kStep = 4 * V::kGroups;
+  if constexpr (V::kWholeFloat3 && std::is_same_v<typename M::In, Packed<uint8_t, 3>> &&
+                std::is_same_v<typename M::Out, Packed<uint8_t, 3>>) {
+    // Eight pixels of three bytes: one load and one shuffle a channel, the
+    // clamped results back the same way.
+    for (; x + kStep <= end; x += kStep) {
+      F colour[3];
+      I hls[3];
+      V::loadBytes3(in.pixel(x), colour);
+      forwardLanes<V, typename M::BodyRecipe>(colour[M::kRedAt], colour[1], colour[2 - M::kRedAt], hls);
+      V::storeBytes3(out.pixel(x), hls);
+    }
+    return x;
+  }
   const __m128i bias = _mm_set1_epi32(0x8000);
   for (; x + kStep <= end; x += kStep) {
     __m128i raw[V::kGroups][4];
