@@ -53,22 +53,33 @@ void streamAgrees(const char* name, const Form& form) {
     expandPixels(streamRow<Order>(s, PackedOutAlpha<true>{p, 200}), 0, end, form);
     uint8_t* b3 = b + 4 * w;
     uint8_t* p3 = p + 4 * w;
-    expandRow(streamRow<Order>(s, PackedOut3<false>{b3}), end, end, form, form, avx2);
-    expandPixels(streamRow<Order>(s, PackedOut3<false>{p3}), 0, end, form);
+    constexpr bool kReverse = Order != PairOrder::YCbCr;
+    expandRow(streamRow<Order>(s, PackedOut3<kReverse>{b3}), end, end, form, form, avx2);
+    expandPixels(streamRow<Order>(s, PackedOut3<kReverse>{p3}), 0, end, form);
   });
 }
 
-// Two luma rows of `w` bytes and two chroma planes of (w + 1) / 2 bytes.
+// Two luma rows of `w` bytes and two chroma planes of (w + 1) / 2 bytes,
+// into four-byte pixels and into three-byte ones.
+template <class Out, class Form>
+void planePairInto(const uint8_t* s, const Out& b0, const Out& b1, const Out& p0, const Out& p1, int w, bool avx2,
+                   const Form& form) {
+  using Set = RowSet<2, LumaRow, ChromaPlanes<2>, Out>;
+  const int end = w & ~1, half = (w + 1) / 2;
+  const ChromaPlanes<2> chroma{s + 2 * w, s + 2 * w + half};
+  expandRow(Set{{LumaRow{s}, LumaRow{s + w}}, chroma, {b0, b1}}, end, end, form, form, avx2);
+  expandPixels(Set{{LumaRow{s}, LumaRow{s + w}}, chroma, {p0, p1}}, 0, end, form);
+}
+
 template <class Form>
 void planePairAgrees(const char* name, const Form& form) {
   agree(name, [&](const uint8_t* s, uint8_t* b, uint8_t* p, int w, bool avx2) {
-    using Set = RowSet<2, LumaRow, ChromaPlanes<2>, PackedOutAlpha<false>>;
-    const int end = w & ~1, half = (w + 1) / 2;
-    const ChromaPlanes<2> chroma{s + 2 * w, s + 2 * w + half};
-    const Set blocked{{LumaRow{s}, LumaRow{s + w}}, chroma, {PackedOutAlpha<false>{b, 9}, PackedOutAlpha<false>{b + 4 * w, 9}}};
-    const Set plain{{LumaRow{s}, LumaRow{s + w}}, chroma, {PackedOutAlpha<false>{p, 9}, PackedOutAlpha<false>{p + 4 * w, 9}}};
-    expandRow(blocked, end, end, form, form, avx2);
-    expandPixels(plain, 0, end, form);
+    planePairInto(s, PackedOutAlpha<false>{b, 9}, PackedOutAlpha<false>{b + 4 * w, 9}, PackedOutAlpha<false>{p, 9},
+                  PackedOutAlpha<false>{p + 4 * w, 9}, w, avx2, form);
+  });
+  agree(name, [&](const uint8_t* s, uint8_t* b, uint8_t* p, int w, bool avx2) {
+    planePairInto(s, PackedOut3<true>{b}, PackedOut3<true>{b + 3 * w}, PackedOut3<true>{p},
+                  PackedOut3<true>{p + 3 * w}, w, avx2, form);
   });
 }
 
