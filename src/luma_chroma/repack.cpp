@@ -55,6 +55,9 @@ struct Side {
 
 int chromaWidth(Scheme s, int width) { return s == Scheme::S411 ? width / 4 : width / 2; }
 
+// Gapless rows are joined into one only while its byte count stays an int.
+constexpr int64_t kLongestRow = (int64_t(1) << 30);
+
 uint8_t* at(const Side& s, int plane, int row, int offset) { return rowAt(s.p[plane], s.step[plane], row) + offset; }
 
 // A pair stream into planes or two planes: one pass a row writes luma and,
@@ -110,9 +113,9 @@ void packPairs(const Member& m, const Side& src, const Side& dst, int width, int
 void moveChroma(const Member& m, const Side& src, const Side& dst, int width, int height) {
   const Scheme from = m.src.scheme, to = m.dst.scheme;
   const bool srcPlanes = m.src.kind == Kind::Planes, dstPlanes = m.dst.kind == Kind::Planes;
-  // One chroma row in the same scheme (or a row kept or repeated whole).
-  auto sameRow = [&](int s, int d) {
-    const int cw = chromaWidth(to, width);
+  // One chroma row in the same scheme (or a row kept or repeated whole);
+  // `cw` samples of each plane.
+  auto sameRow = [&](int s, int d, int cw) {
     if (srcPlanes && dstPlanes) {
       copyBytes(at(src, 1, s, 0), at(dst, 1, d, 0), cw, false);
       copyBytes(at(src, 2, s, 0), at(dst, 2, d, 0), cw, false);
@@ -124,13 +127,23 @@ void moveChroma(const Member& m, const Side& src, const Side& dst, int width, in
       copyBytes(at(src, 1, s, 0), at(dst, 1, d, 0), 2 * cw, false);
     }
   };
+  const int rowSamples = chromaWidth(to, width);
   if (from == to) {
     const int rows = from == Scheme::S420 ? height / 2 : height;
-    for (int r = 0; r < rows; ++r) sameRow(r, r);
+    // Rows that follow each other without a gap in every plane go as one.
+    const int srcBytes = srcPlanes ? rowSamples : 2 * rowSamples, dstBytes = dstPlanes ? rowSamples : 2 * rowSamples;
+    const bool gapless = src.step[1] == srcBytes && dst.step[1] == dstBytes &&
+                         (!srcPlanes || src.step[2] == srcBytes) && (!dstPlanes || dst.step[2] == dstBytes) &&
+                         int64_t(rowSamples) * rows <= kLongestRow;
+    if (gapless) {
+      sameRow(0, 0, rowSamples * rows);
+    } else {
+      for (int r = 0; r < rows; ++r) sameRow(r, r, rowSamples);
+    }
   } else if (from == Scheme::S422 && to == Scheme::S420) {
-    for (int r = 0; r < height / 2; ++r) sameRow(2 * r, r);  // even rows kept
+    for (int r = 0; r < height / 2; ++r) sameRow(2 * r, r, rowSamples);  // even rows kept
   } else if (from == Scheme::S420 && to == Scheme::S422) {
-    for (int r = 0; r < height; ++r) sameRow(r / 2, r);  // each row twice
+    for (int r = 0; r < height; ++r) sameRow(r / 2, r, rowSamples);  // each row twice
   } else if (from == Scheme::S422 && to == Scheme::S411) {
     const int cw = width / 4;  // even samples kept
     for (int r = 0; r < height; ++r) {
@@ -236,8 +249,13 @@ Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
   } else if (m.dst.kind == Kind::Pairs) {
     packPairs(m, src, dst, width, height, nonTemporal);
   } else {
-    // Planar both sides: luma rows copied, then the chroma rule.
-    for (int y = 0; y < height; ++y) copyBytes(at(src, 0, y, 0), at(dst, 0, y, 0), width, nonTemporal || streamLuma);
+    // Planar both sides: luma rows copied (as one when no gap lies between
+    // them), then the chroma rule.
+    if (src.step[0] == width && dst.step[0] == width && int64_t(width) * height <= kLongestRow)
+      copyBytes(src.p[0], dst.p[0], width * height, nonTemporal || streamLuma);
+    else
+      for (int y = 0; y < height; ++y)
+        copyBytes(at(src, 0, y, 0), at(dst, 0, y, 0), width, nonTemporal || streamLuma);
     moveChroma(m, src, dst, width, height);
   }
   if (nonTemporal || streamLuma) _mm_sfence();
