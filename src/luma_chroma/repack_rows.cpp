@@ -89,11 +89,14 @@ ZEL_AVX2 int mergePairsAvx(const uint8_t* y, const uint8_t* cb, const uint8_t* c
 
 ZEL_AVX2 int zipAvx(const uint8_t* a, const uint8_t* b, uint8_t* out, int n, bool nonTemporal) {
   int k = 0;
+  // Samples widened to 16 bits, the second moved to the high byte.
   for (; k + 32 <= n; k += 32) {
-    const __m256i va = load256(a + k), vb = load256(b + k);
-    const __m256i lo = _mm256_unpacklo_epi8(va, vb), hi = _mm256_unpackhi_epi8(va, vb);
-    put256(out + 2 * k, _mm256_permute2x128_si256(lo, hi, 0x20), nonTemporal);
-    put256(out + 2 * k + 32, _mm256_permute2x128_si256(lo, hi, 0x31), nonTemporal);
+    const __m256i lo = _mm256_or_si256(_mm256_cvtepu8_epi16(load128(a + k)),
+                                       _mm256_slli_epi16(_mm256_cvtepu8_epi16(load128(b + k)), 8));
+    const __m256i hi = _mm256_or_si256(_mm256_cvtepu8_epi16(load128(a + k + 16)),
+                                       _mm256_slli_epi16(_mm256_cvtepu8_epi16(load128(b + k + 16)), 8));
+    put256(out + 2 * k, lo, nonTemporal);
+    put256(out + 2 * k + 32, hi, nonTemporal);
   }
   return k;
 }
@@ -630,9 +633,19 @@ void unzip4(const uint8_t* in, uint8_t* a, uint8_t* b, uint8_t* c, uint8_t* d, i
   }
 }
 
+// From this many bytes an ordinary copy goes by the string move.
+constexpr int kLongCopy = 1 << 16;
+
 void copyBytes(const uint8_t* in, uint8_t* out, int n, bool nonTemporal) {
   if (!nonTemporal) {
-    std::memcpy(out, in, size_t(n));
+    if (n >= kLongCopy) {
+      // A whole plane at once: the string move keeps its stores in the
+      // cache where a library copy of this length may bypass it.
+      size_t count = size_t(n);
+      asm volatile("rep movsb" : "+D"(out), "+S"(in), "+c"(count) : : "memory");
+    } else {
+      std::memcpy(out, in, size_t(n));
+    }
     return;
   }
   int k = 0;
