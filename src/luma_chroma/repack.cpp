@@ -60,6 +60,14 @@ constexpr int64_t kLongestRow = (int64_t(1) << 30);
 
 uint8_t* at(const Side& s, int plane, int row, int offset) { return rowAt(s.p[plane], s.step[plane], row) + offset; }
 
+// Luma rows copied, as one row when no gap lies between them.
+void copyLuma(const Side& src, const Side& dst, int width, int height, bool nonTemporal) {
+  if (src.step[0] == width && dst.step[0] == width && int64_t(width) * height <= kLongestRow)
+    copyBytes(src.p[0], dst.p[0], width * height, nonTemporal);
+  else
+    for (int y = 0; y < height; ++y) copyBytes(at(src, 0, y, 0), at(dst, 0, y, 0), width, nonTemporal);
+}
+
 // A pair stream into planes or two planes: one pass a row writes luma and,
 // on rows that keep chroma, the chroma in the target's scheme and layout.
 void unpackPairs(const Member& m, const Side& src, const Side& dst, int width, int height, bool nonTemporal) {
@@ -249,13 +257,8 @@ Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
   } else if (m.dst.kind == Kind::Pairs) {
     packPairs(m, src, dst, width, height, nonTemporal);
   } else {
-    // Planar both sides: luma rows copied (as one when no gap lies between
-    // them), then the chroma rule.
-    if (src.step[0] == width && dst.step[0] == width && int64_t(width) * height <= kLongestRow)
-      copyBytes(src.p[0], dst.p[0], width * height, nonTemporal || streamLuma);
-    else
-      for (int y = 0; y < height; ++y)
-        copyBytes(at(src, 0, y, 0), at(dst, 0, y, 0), width, nonTemporal || streamLuma);
+    // Planar both sides: luma rows copied, then the chroma rule.
+    copyLuma(src, dst, width, height, nonTemporal || streamLuma);
     moveChroma(m, src, dst, width, height);
   }
   if (nonTemporal || streamLuma) _mm_sfence();
@@ -264,12 +267,28 @@ Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
 
 // ---- filtered members ----
 
+// Samples and the rounded means of their right neighbours, 32 a step.
+ZEL_AVX2 void meansBetweenAvx(const uint8_t* c, uint8_t* o, int size) {
+  for (int j = 0; j < size; j += 32) {
+    const __m256i a = load256(c + j), m = _mm256_avg_epu8(a, load256(c + j + 1));
+    const __m256i lo = _mm256_unpacklo_epi8(a, m), hi = _mm256_unpackhi_epi8(a, m);
+    store256(o + 2 * j, _mm256_permute2x128_si256(lo, hi, 0x20));
+    store256(o + 2 * j + 32, _mm256_permute2x128_si256(lo, hi, 0x31));
+  }
+}
+
 // 4:1:1 to 4:2:0 from the even source rows, the new odd columns the
 // average of their neighbours: rounded in blocks of 64 and 16 while more
 // than that many samples remain, truncated for single samples.
 void filter411To420Row(const uint8_t* c, uint8_t* o, int n) {
   int k = 0;
+  const bool avx2 = hasAvx2();
   auto block = [&](int size) {
+    if (avx2 && size == 64) {
+      meansBetweenAvx(c + k, o + 2 * k, size);
+      k += size;
+      return;
+    }
     for (int j = 0; j < size; j += 16) {
       const __m128i a = load128(c + k + j), b = load128(c + k + j + 1);
       const __m128i m = _mm_avg_epu8(a, b);
@@ -286,15 +305,35 @@ void filter411To420Row(const uint8_t* c, uint8_t* o, int n) {
   }
 }
 
+// The 32 even samples of 64 bytes.
+ZEL_AVX2 ZEL_INLINE __m256i evens256(const uint8_t* p, __m256i m) {
+  const __m256i lo = _mm256_shuffle_epi8(load256(p), m), hi = _mm256_shuffle_epi8(load256(p + 32), m);
+  return _mm256_permute4x64_epi64(_mm256_unpacklo_epi64(lo, hi), _MM_SHUFFLE(3, 1, 2, 0));
+}
+
+// Even samples and their rounded means with the row below, 32 a step.
+ZEL_AVX2 int evenMeansAvx(const uint8_t* c, const uint8_t* below, uint8_t* even, uint8_t* odd, int n) {
+  const __m256i m = _mm256_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, -1, -1, -1, -1, -1, -1, -1, -1, 0, 2, 4, 6, 8, 10,
+                                     12, 14, -1, -1, -1, -1, -1, -1, -1, -1);
+  int k = 0;
+  for (; n - k >= 32; k += 32) {
+    const __m256i a = evens256(c + 2 * k, m);
+    store256(even + k, a);
+    store256(odd + k, below ? _mm256_avg_epu8(a, evens256(below + 2 * k, m)) : a);
+  }
+  return k;
+}
+
 // 4:2:0 to 4:1:1 from the even columns, the new odd rows the average of
 // the rows above and below: rounded in blocks of 32 while 32 remain,
 // truncated after that; the last source row is copied.
+
 void filter420To411Rows(const uint8_t* c, const uint8_t* below, uint8_t* even, uint8_t* odd, int n) {
   const __m128i m = _mm_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, -1, -1, -1, -1, -1, -1, -1, -1);
   auto evens = [&](const uint8_t* p) {
     return _mm_unpacklo_epi64(_mm_shuffle_epi8(load128(p), m), _mm_shuffle_epi8(load128(p + 16), m));
   };
-  int k = 0;
+  int k = hasAvx2() ? evenMeansAvx(c, below, even, odd, n) : 0;
   for (; n - k >= 32; k += 32)
     for (int j = 0; j < 32; j += 16) {
       const __m128i a = evens(c + 2 * (k + j));
@@ -310,7 +349,7 @@ void filter420To411Rows(const uint8_t* c, const uint8_t* below, uint8_t* even, u
 Status filter411To420(const Side& src, const Side& dst, ImageSize size) {
   if (size.width < 4 || size.height < 4 || (size.width & 3) || (size.height & 3)) return StatusSizeError;
   const int n = size.width / 4;
-  for (int y = 0; y < size.height; ++y) copyBytes(at(src, 0, y, 0), at(dst, 0, y, 0), size.width, false);
+  copyLuma(src, dst, size.width, size.height, false);
   for (int i = 0; i < size.height / 2; ++i)
     for (int p = 1; p <= 2; ++p) filter411To420Row(at(src, p, 2 * i, 0), at(dst, p, i, 0), n);
   return StatusOk;
@@ -320,7 +359,7 @@ Status filter420To411(const Side& src, const Side& dst, ImageSize size) {
   if (size.width < 4 || size.height < 2 || (size.width & 3) || (size.height & 1)) return StatusSizeError;
   const int n = size.width / 4;
   const int rows = size.height / 2;
-  for (int y = 0; y < size.height; ++y) copyBytes(at(src, 0, y, 0), at(dst, 0, y, 0), size.width, false);
+  copyLuma(src, dst, size.width, size.height, false);
   for (int i = 0; i < rows; ++i)
     for (int p = 1; p <= 2; ++p)
       filter420To411Rows(at(src, p, i, 0), i + 1 < rows ? at(src, p, i + 1, 0) : nullptr, at(dst, p, 2 * i, 0),
