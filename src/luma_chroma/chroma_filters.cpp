@@ -51,10 +51,33 @@ void weightedRows(const uint8_t* a, int wa, const uint8_t* b, int wb, int shift,
 }
 
 // The -1 9 9 -1 half-sample tap over four rows.
+ZEL_AVX2 ZEL_INLINE __m256i halfSampleLanes(__m256i u, __m256i p, __m256i q, __m256i d) {
+  const __m256i nine = _mm256_set1_epi16(9), eight = _mm256_set1_epi16(8);
+  return _mm256_srai_epi16(
+      _mm256_add_epi16(_mm256_sub_epi16(_mm256_mullo_epi16(_mm256_add_epi16(p, q), nine), _mm256_add_epi16(u, d)),
+                       eight),
+      4);
+}
+
+ZEL_AVX2 int halfSampleRowsAvx(const uint8_t* above, const uint8_t* a, const uint8_t* b, const uint8_t* below,
+                               uint8_t* out, int n) {
+  const __m256i zero = _mm256_setzero_si256();
+  int x = 0;
+  for (; x + 32 <= n; x += 32) {
+    const __m256i u = load256(above + x), p = load256(a + x), q = load256(b + x), d = load256(below + x);
+    const __m256i lo = halfSampleLanes(_mm256_unpacklo_epi8(u, zero), _mm256_unpacklo_epi8(p, zero),
+                                       _mm256_unpacklo_epi8(q, zero), _mm256_unpacklo_epi8(d, zero));
+    const __m256i hi = halfSampleLanes(_mm256_unpackhi_epi8(u, zero), _mm256_unpackhi_epi8(p, zero),
+                                       _mm256_unpackhi_epi8(q, zero), _mm256_unpackhi_epi8(d, zero));
+    store256(out + x, _mm256_packus_epi16(lo, hi));
+  }
+  return x;
+}
+
 void halfSampleRows(const uint8_t* above, const uint8_t* a, const uint8_t* b, const uint8_t* below, uint8_t* out,
                     int n) {
   const __m128i zero = _mm_setzero_si128(), nine = _mm_set1_epi16(9), eight = _mm_set1_epi16(8);
-  int x = 0;
+  int x = hasAvx2() ? halfSampleRowsAvx(above, a, b, below, out, n) : 0;
   for (; x + 16 <= n; x += 16) {
     const __m128i u = load128(above + x), p = load128(a + x), q = load128(b + x), d = load128(below + x);
     auto side = [&](auto unpack) {
@@ -322,14 +345,16 @@ ZEL_PUBLIC Status zeliYCbCr420To422_Interlace_8u_P3R(const uint8_t* const src[3]
   if (s < 0) return s;
   copyLuma(src[0], srcStep[0], dst[0], dstStep[0], width, height);
   const int cw = width / 2;
-  alignas(16) uint8_t scratch[kChunk];
   for (int plane = 1; plane <= 2; ++plane)
     for (int x = 0; x < cw; x += kChunk) {
       const int n = std::min(kChunk, cw - x);
       auto sourceRow = [&](int r) { return rowAt(src[plane], srcStep[plane], r) + x; };
-      for (int row = 0; row < height; ++row)
-        std::memcpy(rowAt(dst[plane], dstStep[plane], row) + x, fieldUpRow(sourceRow, height, row, n, scratch),
-                    size_t(n));
+      for (int row = 0; row < height; ++row) {
+        // Tapped rows land in place; copied rows are copied.
+        uint8_t* out = rowAt(dst[plane], dstStep[plane], row) + x;
+        const uint8_t* got = fieldUpRow(sourceRow, height, row, n, out);
+        if (got != out) std::memcpy(out, got, size_t(n));
+      }
     }
   return s;
 }
