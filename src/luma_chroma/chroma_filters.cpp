@@ -158,8 +158,13 @@ bool missingPlanes(T* const* planes, const int* steps) {
   return !planes || !steps || anyNull3(reinterpret_cast<const void* const*>(planes));
 }
 
+// Luma rows copied, as one row when no gap lies between them.
 void copyLuma(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, int width, int height) {
-  plainWalk(height, [&](int y) { std::memcpy(rowAt(dst, dstStep, y), rowAt(src, srcStep, y), size_t(width)); });
+  if (srcStep == width && dstStep == width && int64_t(width) * height <= (int64_t(1) << 30)) {
+    repack::copyBytes(src, dst, width * height, false);
+    return;
+  }
+  plainWalk(height, [&](int y) { repack::copyBytes(rowAt(src, srcStep, y), rowAt(dst, dstStep, y), width, false); });
 }
 
 Status grow1620To420(const Planes3& s, const OutPlanes3& d, ImageSize size) {
