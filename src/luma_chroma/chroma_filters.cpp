@@ -242,6 +242,47 @@ Status halfSampleSize(ImageSize size, int& width, int& height) {
 
 // ---- 4:2:0 to BGR with horizontal interpolation ----
 
+// The 16-bit form for 16 pixels: luma and chroma bytes widened, B G R
+// alpha written.
+ZEL_AVX2 ZEL_INLINE void bgrLanes16(__m128i luma, __m128i crPix, __m128i cbPix, __m256i alphaBytes, uint8_t* o) {
+  const __m256i c16 = _mm256_set1_epi16(16), c128 = _mm256_set1_epi16(128);
+  const __m256i y8 = _mm256_cvtepu8_epi16(luma), r8 = _mm256_cvtepu8_epi16(crPix), b8 = _mm256_cvtepu8_epi16(cbPix);
+  const __m256i yy = _mm256_mulhi_epi16(_mm256_slli_epi16(_mm256_sub_epi16(y8, c16), 7), _mm256_set1_epi16(kLuma12));
+  const __m256i crs = _mm256_slli_epi16(_mm256_sub_epi16(r8, c128), 7);
+  const __m256i cbs = _mm256_slli_epi16(_mm256_sub_epi16(b8, c128), 7);
+  const __m256i r = _mm256_srai_epi16(_mm256_add_epi16(yy, _mm256_mulhi_epi16(crs, _mm256_set1_epi16(kCrToR12))), 3);
+  const __m256i g = _mm256_srai_epi16(
+      _mm256_sub_epi16(_mm256_sub_epi16(yy, _mm256_mulhi_epi16(cbs, _mm256_set1_epi16(kCbToG12))),
+                       _mm256_mulhi_epi16(crs, _mm256_set1_epi16(kCrToG12))),
+      3);
+  const __m256i b = _mm256_srai_epi16(_mm256_add_epi16(yy, _mm256_mulhi_epi16(cbs, _mm256_set1_epi16(kCbToB12))), 3);
+  // Per lane: pixels 0-7 | 8-15.
+  const __m256i bg = _mm256_unpacklo_epi8(_mm256_packus_epi16(b, b), _mm256_packus_epi16(g, g));
+  const __m256i ra = _mm256_unpacklo_epi8(_mm256_packus_epi16(r, r), _mm256_setzero_si256());
+  const __m256i lo = _mm256_or_si256(_mm256_unpacklo_epi16(bg, ra), alphaBytes);  // 0-3 | 8-11
+  const __m256i hi = _mm256_or_si256(_mm256_unpackhi_epi16(bg, ra), alphaBytes);  // 4-7 | 12-15
+  store256(o, _mm256_permute2x128_si256(lo, hi, 0x20));
+  store256(o + 32, _mm256_permute2x128_si256(lo, hi, 0x31));
+}
+
+// Sixteen chroma samples (32 pixels) a step, while a whole step stays
+// below `bodyPairs`.
+ZEL_AVX2 int bgrFilterBodyAvx(const uint8_t* y, const uint8_t* cr, const uint8_t* cb, uint8_t* out, int bodyPairs,
+                              uint8_t alpha) {
+  const __m256i alphaBytes = _mm256_set1_epi32(int32_t(uint32_t(alpha) << 24));
+  int k = 0;
+  for (; k + 16 <= bodyPairs; k += 16) {
+    const __m128i crv = load128(cr + k), cbv = load128(cb + k);
+    const __m128i crOdd = _mm_avg_epu8(crv, load128(cr + k + 1));
+    const __m128i cbOdd = _mm_avg_epu8(cbv, load128(cb + k + 1));
+    bgrLanes16(load128(y + 2 * k), _mm_unpacklo_epi8(crv, crOdd), _mm_unpacklo_epi8(cbv, cbOdd), alphaBytes,
+               out + 8 * k);
+    bgrLanes16(load128(y + 2 * k + 16), _mm_unpackhi_epi8(crv, crOdd), _mm_unpackhi_epi8(cbv, cbOdd), alphaBytes,
+               out + 8 * k + 64);
+  }
+  return k;
+}
+
 // Pixel pairs [0, pairs) of one row; pairs below `bodyPairs` take the
 // 16-bit form, eight chroma samples a block.
 void bgrFilterRow(const uint8_t* y, const uint8_t* cr, const uint8_t* cb, uint8_t* out, int pairs, uint8_t alpha) {
@@ -251,7 +292,7 @@ void bgrFilterRow(const uint8_t* y, const uint8_t* cr, const uint8_t* cb, uint8_
   const __m128i wy = _mm_set1_epi16(kLuma12), wcrR = _mm_set1_epi16(kCrToR12), wcrG = _mm_set1_epi16(kCrToG12),
                 wcbG = _mm_set1_epi16(kCbToG12), wcbB = _mm_set1_epi16(kCbToB12);
   const __m128i alphaBytes = _mm_set1_epi32(int32_t(uint32_t(alpha) << 24));
-  int k = 0;
+  int k = hasAvx2() ? bgrFilterBodyAvx(y, cr, cb, out, bodyPairs, alpha) : 0;
   for (; k < bodyPairs; k += 8) {
     // Chroma of even pixels and the rounded means for odd pixels.
     const __m128i crv = load64(cr + k), cbv = load64(cb + k);
