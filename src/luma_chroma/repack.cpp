@@ -551,6 +551,11 @@ ZEL_PUBLIC Status zeliYCbCr422ToGray_8u_C2C1R(const uint8_t* src, int srcStep, u
                                               ImageSize size) {
   if (!src || !dst) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
+  // Luma sits at every second byte, so gapless rows read as one long row.
+  if (srcStep == 2 * size.width && dstStep == size.width && int64_t(size.width) * size.height <= kLongestRow) {
+    lumaOfPairs(src, PairOrder::YCbCr, dst, size.width * size.height);
+    return StatusOk;
+  }
   zel::plainWalk(size.height, [&](int y) {
     lumaOfPairs(zel::rowAt(src, srcStep, y), PairOrder::YCbCr, zel::rowAt(dst, dstStep, y), size.width);
   });

@@ -44,11 +44,17 @@ inline void put(void* p, __m128i v, bool nonTemporal) {
     store128(p, v);
 }
 
+// A target on a 16-byte boundary streams its 32 bytes as two halves.
 ZEL_AVX2 inline void put256(void* p, __m256i v, bool nonTemporal) {
-  if (nonTemporal && (reinterpret_cast<uintptr_t>(p) & 31u) == 0)
+  const uintptr_t a = reinterpret_cast<uintptr_t>(p);
+  if (nonTemporal && (a & 31u) == 0) {
     _mm256_stream_si256(static_cast<__m256i*>(p), v);
-  else
+  } else if (nonTemporal && (a & 15u) == 0) {
+    storeStream128(p, _mm256_castsi256_si128(v));
+    storeStream128(static_cast<uint8_t*>(p) + 16, _mm256_extracti128_si256(v, 1));
+  } else {
     store256(p, v);
+  }
 }
 
 // AVX2 bodies: 32 pixels a step, each 128-bit lane doing what one SSE
@@ -648,8 +654,18 @@ void copyBytes(const uint8_t* in, uint8_t* out, int n, bool nonTemporal) {
     }
     return;
   }
+  // Streamed: a first ordinary store up to a 16-byte boundary, then 64-byte
+  // blocks of stream stores, the rest ordinary.
   int k = 0;
-  for (; k + 16 <= n; k += 16) put(out + k, load128(in + k), true);
+  if (n >= 64) {
+    const int skew = int(reinterpret_cast<uintptr_t>(out) & 15u);
+    if (skew) {
+      store128(out, load128(in));
+      k = 16 - skew;
+    }
+    for (; k + 64 <= n; k += 64)
+      for (int j = 0; j < 64; j += 16) storeStream128(out + k + j, load128(in + k + j));
+  }
   std::memcpy(out + k, in + k, size_t(n - k));
 }
 
