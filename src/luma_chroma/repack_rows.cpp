@@ -201,12 +201,17 @@ ZEL_AVX2 ZEL_INLINE LaneGather gatherLanes(const uint8_t* in, __m256i g) {
           _mm256_shuffle_epi8(_mm256_permute2x128_si256(v0, v1, 0x31), g)};
 }
 
+// Luma is the low byte of every 16-bit word (the high byte for CbYCr):
+// words narrowed, then the lanes put in order.
 ZEL_AVX2 int lumaOfPairsAvx(const uint8_t* in, PairOrder o, uint8_t* y, int pixels) {
-  const __m256i g = _mm256_broadcastsi128_si256(maskOf(kGather[int(o)]));
+  const __m256i low = _mm256_set1_epi16(0x00FF);
+  const bool high = o == PairOrder::CbYCr;
   int x = 0;
   for (; x + 32 <= pixels; x += 32) {
-    const LaneGather v = gatherLanes(in + 2 * x, g);
-    store256(y + x, _mm256_unpacklo_epi64(v.a, v.b));
+    __m256i a = load256(in + 2 * x), b = load256(in + 2 * x + 32);
+    a = high ? _mm256_srli_epi16(a, 8) : _mm256_and_si256(a, low);
+    b = high ? _mm256_srli_epi16(b, 8) : _mm256_and_si256(b, low);
+    store256(y + x, _mm256_permute4x64_epi64(_mm256_packus_epi16(a, b), _MM_SHUFFLE(3, 1, 2, 0)));
   }
   return x;
 }
