@@ -55,10 +55,21 @@ struct Side {
 
 int chromaWidth(Scheme s, int width) { return s == Scheme::S411 ? width / 4 : width / 2; }
 
-// Gapless rows are joined into one only while its byte count stays an int.
-constexpr int64_t kLongestRow = (int64_t(1) << 30);
+// Gapless rows are joined into one only while every offset within it,
+// counted in the bytes of a pair stream, stays well inside an int.
+constexpr int64_t kLongestRow = int64_t(1) << 28;
 
 uint8_t* at(const Side& s, int plane, int row, int offset) { return rowAt(s.p[plane], s.step[plane], row) + offset; }
+
+// Whether each plane's step is exactly the bytes of its row.
+bool gapless(const Layout& l, const Side& s, int width) {
+  const int chroma = chromaWidth(l.scheme, width);
+  for (int i = 0; i < s.count; ++i) {
+    const int bytes = l.kind == Kind::Pairs ? 2 * width : i == 0 ? width : l.kind == Kind::TwoPlanes ? 2 * chroma : chroma;
+    if (s.step[i] != bytes) return false;
+  }
+  return true;
+}
 
 // Luma rows copied, as one row when no gap lies between them.
 void copyLuma(const Side& src, const Side& dst, int width, int height, bool nonTemporal) {
@@ -247,6 +258,14 @@ Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
     nonTemporal = aligned && steps * height >= 524289;
   }
   const bool streamLuma = m.streamedLuma && int64_t(width) * height >= 348603;
+
+  // Without 4:2:0 every row stands alone; when no plane has a gap between
+  // rows, the image is one long row.
+  if (m.src.scheme != Scheme::S420 && m.dst.scheme != Scheme::S420 && gapless(m.src, src, width) &&
+      gapless(m.dst, dst, width) && int64_t(width) * height <= kLongestRow) {
+    width *= height;
+    height = 1;
+  }
 
   if (m.src.kind == Kind::Pairs && m.dst.kind == Kind::Pairs) {
     // 4:2:2 streams of two byte orders: one byte permutation a row.
