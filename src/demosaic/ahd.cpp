@@ -191,25 +191,12 @@ class AhdRows {
     }
   }
 
-  // The running choice starts with H at each row of the tile; a non-zero
-  // window sum decides, a zero sum repeats the last decision.
+  // The running choice starts with H at each row of the tile.
   void outputRow(int y, T* out) {
-    int32_t sums[kChunk];
-    uint8_t takeV[kChunk];
-    int t = 1;
-    const T* h[3] = {red(kH, y), green(kH, y), blue(kH, y)};
-    const T* v[3] = {red(kV, y), green(kV, y), blue(kV, y)};
-    for (int a = t_.x; a < t_.x + t_.width; a += kChunk) {
-      const int n = std::min(kChunk, t_.x + t_.width - a);
-      windowSumRow(homDiff(y - 1) + a, homDiff(y) + a, homDiff(y + 1) + a, n, sums, level_);
-      for (int i = 0; i < n; ++i) {
-        if (sums[i] != 0) t = sums[i];
-        takeV[i] = t < 0 ? 0xFF : 0;
-      }
-      const T* hc[3] = {h[0] + a, h[1] + a, h[2] + a};
-      const T* vc[3] = {v[0] + a, v[1] + a, v[2] + a};
-      chooseRow(hc, vc, takeV, n, out + 3 * (a - t_.x), level_);
-    }
+    const T* h[3] = {red(kH, y) + t_.x, green(kH, y) + t_.x, blue(kH, y) + t_.x};
+    const T* v[3] = {red(kV, y) + t_.x, green(kV, y) + t_.x, blue(kV, y) + t_.x};
+    const T* hom[3] = {homDiff(y - 1) + t_.x, homDiff(y) + t_.x, homDiff(y + 1) + t_.x};
+    choiceRow(h, v, hom, t_.width, out, level_);
   }
 
   const CfaFrame<T>& f_;

@@ -27,8 +27,6 @@ constexpr int kLanes = 4;
 inline Vec loadLanes(const uint8_t* p) { return _mm_cvtepu8_epi32(load32(p)); }
 inline Vec loadLanes(const uint16_t* p) { return _mm_cvtepu16_epi32(load64(p)); }
 inline Vec loadLanes(const int32_t* p) { return load128(p); }
-inline Vec loadSignedLanes(const uint8_t* p) { return _mm_cvtepi8_epi32(load32(p)); }
-inline Vec loadSignedLanes(const uint16_t* p) { return _mm_cvtepi16_epi32(load64(p)); }
 // Samples keep the low bits of each lane, as a cast to the sample type.
 inline void storeLanes(uint8_t* p, Vec v) {
   const int32_t w = _mm_cvtsi128_si32(
@@ -76,8 +74,6 @@ constexpr int kLanes = 8;
 ZEL_AVX2 inline Vec loadLanes(const uint8_t* p) { return _mm256_cvtepu8_epi32(load64(p)); }
 ZEL_AVX2 inline Vec loadLanes(const uint16_t* p) { return _mm256_cvtepu16_epi32(load128(p)); }
 ZEL_AVX2 inline Vec loadLanes(const int32_t* p) { return load256(p); }
-ZEL_AVX2 inline Vec loadSignedLanes(const uint8_t* p) { return _mm256_cvtepi8_epi32(load64(p)); }
-ZEL_AVX2 inline Vec loadSignedLanes(const uint16_t* p) { return _mm256_cvtepi16_epi32(load128(p)); }
 ZEL_AVX2 inline void storeLanes(uint8_t* p, Vec v) {
   const __m256i bytes =
       _mm256_shuffle_epi8(v, _mm256_setr_epi8(0, 4, 8, 12, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, -1, 0, 4, 8, 12,
@@ -191,29 +187,71 @@ void homogeneityRow(const LumaChromaView h[3], const LumaChromaView v[3], int co
   homogeneityRowScalar(hs, vs, count - done, out + done);
 }
 
-template <typename T>
-void windowSumRow(const T* up, const T* mid, const T* down, int count, int32_t* sums, VectorLevel level) {
-  const int done = vectorBlocks(
-      level, count, [&](int i, int n) { return avx2::windowSumBlocks(up + i, mid + i, down + i, n, sums + i); },
-      [&](int i, int n) { return sse::windowSumBlocks(up + i, mid + i, down + i, n, sums + i); });
-  windowSumRowScalar(up + done, mid + done, down + done, count - done, sums + done);
+namespace {
+
+// Column sums of three homogeneity rows from pixel i on, as 16 signed bytes
+// (each at most 12 in magnitude).
+inline __m128i columnSums(const uint8_t* const hom[3], int i) {
+  return _mm_add_epi8(_mm_add_epi8(load128(hom[0] + i), load128(hom[1] + i)), load128(hom[2] + i));
+}
+inline __m128i columnSums(const uint16_t* const hom[3], int i) {
+  auto rows = [&](int at) {
+    return _mm_add_epi16(_mm_add_epi16(load128(hom[0] + at), load128(hom[1] + at)), load128(hom[2] + at));
+  };
+  return _mm_packs_epi16(rows(i), rows(i + 8));
 }
 
+// Bytes still 0 take the byte of `from`.
+inline __m128i fillZeros(__m128i code, __m128i from) {
+  return _mm_or_si128(code, _mm_and_si128(_mm_cmpeq_epi8(code, _mm_setzero_si128()), from));
+}
+
+// The pixels of 16 / sizeof(T) lanes from H or, where `mask` is set, V.
 template <typename T>
-void chooseRow(const T* const h[3], const T* const v[3], const uint8_t* takeV, int count, T* dst, VectorLevel level) {
-  constexpr int block = 16 / int(sizeof(T));
+inline void storeChosen(const T* const h[3], const T* const v[3], int i, __m128i mask, T* dst) {
+  __m128i c[3];
+  for (int k = 0; k < 3; ++k) c[k] = _mm_blendv_epi8(load128(h[k] + i), load128(v[k] + i), mask);
+  storeRgb(dst + 3 * i, c[0], c[1], c[2]);
+}
+
+}  // namespace
+
+template <typename T>
+void choiceRow(const T* const h[3], const T* const v[3], const T* const hom[3], int count, T* dst,
+               VectorLevel level) {
+  constexpr int block = 16;
   int i = 0;
-  if (level != VectorLevel::Scalar) {
+  bool takingV = false;
+  if (level != VectorLevel::Scalar && count >= block) {
+    // A code per pixel: 1 takes H, -1 takes V, 0 repeats the code to its
+    // left. The scan hands each code on to the zeros 1, 2, 4 and 8 lanes to
+    // its right; what is still 0 takes the last code of the block before.
+    const __m128i ones = _mm_set1_epi8(1), lastLane = _mm_set1_epi8(15);
+    __m128i carry = ones;
     for (; i + block <= count; i += block) {
-      const __m128i mask = sizeof(T) == 1 ? load128(takeV + i) : _mm_cvtepi8_epi16(load64(takeV + i));
-      __m128i c[3];
-      for (int k = 0; k < 3; ++k) c[k] = _mm_blendv_epi8(load128(h[k] + i), load128(v[k] + i), mask);
-      storeRgb(dst + 3 * i, c[0], c[1], c[2]);
+      const __m128i sums =
+          _mm_add_epi8(_mm_add_epi8(columnSums(hom, i - 1), columnSums(hom, i)), columnSums(hom, i + 1));
+      __m128i code = _mm_sign_epi8(ones, sums);
+      code = fillZeros(code, _mm_slli_si128(code, 1));
+      code = fillZeros(code, _mm_slli_si128(code, 2));
+      code = fillZeros(code, _mm_slli_si128(code, 4));
+      code = fillZeros(code, _mm_slli_si128(code, 8));
+      code = fillZeros(code, carry);
+      carry = _mm_shuffle_epi8(code, lastLane);
+      const __m128i takeV = _mm_cmplt_epi8(code, _mm_setzero_si128());
+      if constexpr (sizeof(T) == 1) {
+        storeChosen(h, v, i, takeV, dst);
+      } else {
+        storeChosen(h, v, i, _mm_cvtepi8_epi16(takeV), dst);
+        storeChosen(h, v, i + 8, _mm_cvtepi8_epi16(_mm_srli_si128(takeV, 8)), dst);
+      }
     }
+    takingV = int8_t(_mm_cvtsi128_si32(carry)) < 0;
   }
   const T* hr[3] = {h[0] + i, h[1] + i, h[2] + i};
   const T* vr[3] = {v[0] + i, v[1] + i, v[2] + i};
-  chooseRowScalar(hr, vr, takeV + i, count - i, dst + 3 * i);
+  const T* homr[3] = {hom[0] + i, hom[1] + i, hom[2] + i};
+  choiceRowScalar(hr, vr, homr, count - i, takingV, dst + 3 * i);
 }
 
 #define ZEL_AHD_KERNELS(T)                                                                                 \
@@ -221,8 +259,7 @@ void chooseRow(const T* const h[3], const T* const v[3], const uint8_t* takeV, i
   template void colourRow<T>(const ColourTaps<T>&, int, bool, bool, T*, T*, VectorLevel);                  \
   template void lumaChromaRow<T>(const T*, const T*, const T*, int, const LumaChromaRow&, VectorLevel);    \
   template void homogeneityRow<T>(const LumaChromaView[3], const LumaChromaView[3], int, T*, VectorLevel); \
-  template void windowSumRow<T>(const T*, const T*, const T*, int, int32_t*, VectorLevel);                 \
-  template void chooseRow<T>(const T* const[3], const T* const[3], const uint8_t*, int, T*, VectorLevel);
+  template void choiceRow<T>(const T* const[3], const T* const[3], const T* const[3], int, T*, VectorLevel);
 ZEL_AHD_KERNELS(uint8_t)
 ZEL_AHD_KERNELS(uint16_t)
 #undef ZEL_AHD_KERNELS

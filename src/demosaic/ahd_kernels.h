@@ -98,22 +98,29 @@ inline int signedSample(const T* p) {
   return sizeof(T) == 1 ? int(int8_t(loadSample(p))) : int(int16_t(loadSample(p)));
 }
 
-// Step 5 input: the sums of the 3 by 3 windows of homogeneity differences.
+// Step 5: the sum of the 3 by 3 window of homogeneity differences around
+// pixel i of the middle row (`hom` holds the rows above, at and below).
 template <typename T>
-void windowSumRowScalar(const T* up, const T* mid, const T* down, int count, int32_t* sums) {
-  for (int i = 0; i < count; ++i) {
-    int s = 0;
-    for (int k = -1; k <= 1; ++k)
-      s += signedSample(up + i + k) + signedSample(mid + i + k) + signedSample(down + i + k);
-    sums[i] = s;
-  }
+int windowSum(const T* const hom[3], int i) {
+  int s = 0;
+  for (int r = 0; r < 3; ++r)
+    for (int k = -1; k <= 1; ++k) s += signedSample(hom[r] + i + k);
+  return s;
 }
 
-// Step 5 output: the pixels of V where `takeV` is set, else those of H.
+// Step 5 output: a running choice walks the row. A non-zero window sum
+// decides (V where it is negative), a zero sum repeats the last decision;
+// `takingV` is the choice before the first pixel. The pixels of the chosen
+// direction are stored; returns the choice after the last pixel.
 template <typename T>
-void chooseRowScalar(const T* const h[3], const T* const v[3], const uint8_t* takeV, int count, T* dst) {
-  for (int i = 0; i < count; ++i)
-    for (int k = 0; k < 3; ++k) storeSample(dst + 3 * i + k, loadSample((takeV[i] ? v[k] : h[k]) + i));
+bool choiceRowScalar(const T* const h[3], const T* const v[3], const T* const hom[3], int count, bool takingV,
+                     T* dst) {
+  for (int i = 0; i < count; ++i) {
+    const int s = windowSum(hom, i);
+    if (s != 0) takingV = s < 0;
+    for (int k = 0; k < 3; ++k) storeSample(dst + 3 * i + k, loadSample((takingV ? v[k] : h[k]) + i));
+  }
+  return takingV;
 }
 
 // The widest vector form in use: chosen once per call from the processor;
@@ -131,10 +138,11 @@ template <typename T>
 void lumaChromaRow(const T* r, const T* g, const T* b, int count, const LumaChromaRow& out, VectorLevel level);
 template <typename T>
 void homogeneityRow(const LumaChromaView h[3], const LumaChromaView v[3], int count, T* out, VectorLevel level);
+// The choice of a whole row of a tile, starting with H: SSE4.1 blocks of
+// 16 pixels (window sums in bytes, the running choice carried through the
+// block by a prefix scan), the scalar form for the rest.
 template <typename T>
-void windowSumRow(const T* up, const T* mid, const T* down, int count, int32_t* sums, VectorLevel level);
-// SSE4.1 blocks of 16 bytes of each channel.
-template <typename T>
-void chooseRow(const T* const h[3], const T* const v[3], const uint8_t* takeV, int count, T* dst, VectorLevel level);
+void choiceRow(const T* const h[3], const T* const v[3], const T* const hom[3], int count, T* dst,
+               VectorLevel level);
 
 }  // namespace zel

@@ -128,37 +128,49 @@ TEST(AhdKernels, LumaChromaAndHomogeneityMatchTheScalarForm) {
   compareLumaChromaAndHomogeneity<uint16_t>();
 }
 
+// Homogeneity rows that are mostly 0, so that window sums of 0 come in
+// runs (within a block and across blocks) and the running choice is
+// carried; the densest rows hardly ever sum to 0.
 template <typename T>
-void compareSumsAndChoice() {
+void compareChoice() {
   std::mt19937 rng(4);
   for (int count = 1; count <= 70; ++count)
-    for (int offset : {1, 3}) {
-      TestImage<T> rows(count + 2, 3, offset);
-      for (int y = 0; y < 3; ++y)
-        for (int x = 0; x < count + 2; ++x) rows.set(x, y, T(int(rng() % 9) - 4));
-      std::vector<int32_t> want(count + 1, 99), got(count + 1, 99);
-      zel::windowSumRowScalar(rows.row(0) + 1, rows.row(1) + 1, rows.row(2) + 1, count, want.data());
-      for (VectorLevel level : vectorLevels()) {
-        std::fill(got.begin(), got.end(), 99);
-        zel::windowSumRow(rows.row(0) + 1, rows.row(1) + 1, rows.row(2) + 1, count, got.data(), level);
-        ASSERT_EQ(got, want) << "sums, width " << count;
+    for (int offset : {1, 3})
+      for (int density : {2, 12, 100}) {
+        TestImage<T> hom(count + 2, 3, offset);
+        for (int y = 0; y < 3; ++y)
+          for (int x = 0; x < count + 2; ++x)
+            hom.set(x, y, T(int(rng() % 100) < density ? int(rng() % 9) - 4 : 0));
+        TestImage<T> h(count, 3, offset), v(count, 3, offset + 2);
+        h.fillRandom(uint32_t(count)), v.fillRandom(uint32_t(count + 100));
+        const T* hp[3] = {h.row(0), h.row(1), h.row(2)};
+        const T* vp[3] = {v.row(0), v.row(1), v.row(2)};
+        const T* homp[3] = {hom.row(0) + 1, hom.row(1) + 1, hom.row(2) + 1};
+        std::vector<T> pixels(3 * count + 1, T(3)), scalar(pixels);
+        zel::choiceRowScalar(hp, vp, homp, count, false, scalar.data());
+        zel::choiceRow(hp, vp, homp, count, pixels.data(), VectorLevel::Sse41);
+        ASSERT_EQ(pixels, scalar) << "choice, width " << count << " density " << density;
       }
-      TestImage<T> h(count, 3, offset), v(count, 3, offset + 2);
-      h.fillRandom(uint32_t(count)), v.fillRandom(uint32_t(count + 100));
-      std::vector<uint8_t> takeV(count);
-      for (auto& t : takeV) t = rng() & 1 ? 0xFF : 0;
-      const T* hp[3] = {h.row(0), h.row(1), h.row(2)};
-      const T* vp[3] = {v.row(0), v.row(1), v.row(2)};
-      std::vector<T> pixels(3 * count + 1, T(3)), scalar(pixels);
-      zel::chooseRowScalar(hp, vp, takeV.data(), count, scalar.data());
-      zel::chooseRow(hp, vp, takeV.data(), count, pixels.data(), VectorLevel::Sse41);
-      ASSERT_EQ(pixels, scalar) << "choice, width " << count;
-    }
 }
 
-TEST(AhdKernels, WindowSumsAndChoiceMatchTheScalarForm) {
-  compareSumsAndChoice<uint8_t>();
-  compareSumsAndChoice<uint16_t>();
+TEST(AhdKernels, ChoiceMatchesTheScalarForm) {
+  compareChoice<uint8_t>();
+  compareChoice<uint16_t>();
+}
+
+TEST(AhdKernels, ChoiceRunsFromHAndRepeatsOnZeroSums) {
+  // One homogeneity value of -1 at pixel 20 of the middle row: the sums of
+  // pixels 19..21 are -1 (V), and V holds on to the row's end; before it H.
+  constexpr int count = 40;
+  std::vector<uint8_t> hom[3], h[3], v[3];
+  for (int k = 0; k < 3; ++k) hom[k].assign(count + 2, 0), h[k].assign(count, 10), v[k].assign(count, 20);
+  hom[1][1 + 20] = uint8_t(-1);
+  const uint8_t* homp[3] = {hom[0].data() + 1, hom[1].data() + 1, hom[2].data() + 1};
+  const uint8_t* hp[3] = {h[0].data(), h[1].data(), h[2].data()};
+  const uint8_t* vp[3] = {v[0].data(), v[1].data(), v[2].data()};
+  std::vector<uint8_t> out(3 * count);
+  zel::choiceRow(hp, vp, homp, count, out.data(), VectorLevel::Sse41);
+  for (int i = 0; i < count; ++i) ASSERT_EQ(out[3 * i + 1], i < 19 ? 10 : 20) << "pixel " << i;
 }
 
 TEST(AhdFormulas, WorkedValues) {
