@@ -175,17 +175,17 @@ class AhdRows {
   // Luma-chroma of rows y - 1 .. y + 1 for a chunk of columns and one more
   // on either side, then the homogeneity differences of the chunk.
   void homogeneityRows(int y) {
-    int32_t values[2][3][3][kChunk + 2];
+    LumaChromaValue<T> values[2][3][3][kChunk + 2];
     for (int a = t_.x - 1; a < t_.x + t_.width + 1; a += kChunk) {
       const int n = std::min(kChunk, t_.x + t_.width + 1 - a);
-      LumaChromaView views[2][3];
+      LumaChromaView<T> views[2][3];
       for (int d = 0; d < 2; ++d)
         for (int k = 0; k < 3; ++k) {
-          int32_t(&v)[3][kChunk + 2] = values[d][k];
+          LumaChromaValue<T>(&v)[3][kChunk + 2] = values[d][k];
           const int row = y - 1 + k;
           lumaChromaRow(red(d, row) + a - 1, green(d, row) + a - 1, blue(d, row) + a - 1, n + 2,
-                        LumaChromaRow{v[0], v[1], v[2]}, level_);
-          views[d][k] = LumaChromaView{v[0] + 1, v[1] + 1, v[2] + 1};
+                        LumaChromaRow<T>{v[0], v[1], v[2]}, level_);
+          views[d][k] = LumaChromaView<T>{v[0] + 1, v[1] + 1, v[2] + 1};
         }
       homogeneityRow(views[kH], views[kV], n, homDiff(y) + a, level_);
     }

@@ -63,6 +63,60 @@ inline Vec greenLanes(bool firstGreen) {
 #include "demosaic/ahd_lanes.inc"
 #undef ZEL_LANES
 
+// 8-bit samples: 8 pixels in 16-bit lanes.
+namespace words {
+
+using Vec = __m128i;
+constexpr int kLanes = 8;
+
+inline Vec loadBytes(const uint8_t* p) { return _mm_cvtepu8_epi16(load64(p)); }
+inline Vec loadWords(const int16_t* p) { return load128(p); }
+inline void storeBytes(uint8_t* p, Vec v) { store64(p, _mm_packus_epi16(v, v)); }
+inline void storeSignedBytes(uint8_t* p, Vec v) { store64(p, _mm_packs_epi16(v, v)); }
+inline void storeWords(int16_t* p, Vec v) { store128(p, v); }
+
+inline Vec broadcast(int16_t v) { return _mm_set1_epi16(v); }
+inline Vec add(Vec a, Vec b) { return _mm_add_epi16(a, b); }
+inline Vec sub(Vec a, Vec b) { return _mm_sub_epi16(a, b); }
+template <int N>
+inline Vec shiftRight(Vec a) {
+  return _mm_srai_epi16(a, N);
+}
+template <int N>
+inline Vec shiftRightLogical(Vec a) {
+  return _mm_srli_epi16(a, N);
+}
+inline Vec smaller(Vec a, Vec b) { return _mm_min_epi16(a, b); }
+inline Vec larger(Vec a, Vec b) { return _mm_max_epi16(a, b); }
+inline Vec magnitude(Vec a) { return _mm_abs_epi16(a); }
+inline Vec multiplyLow(Vec a, Vec b) { return _mm_mullo_epi16(a, b); }
+inline Vec greater(Vec a, Vec b) { return _mm_cmpgt_epi16(a, b); }
+inline Vec either(Vec a, Vec b) { return _mm_or_si128(a, b); }
+inline Vec select(Vec mask, Vec a, Vec b) { return _mm_blendv_epi8(b, a, mask); }
+inline Vec greenLanes(bool firstGreen) {
+  return firstGreen ? _mm_setr_epi16(-1, 0, -1, 0, -1, 0, -1, 0) : _mm_setr_epi16(0, -1, 0, -1, 0, -1, 0, -1);
+}
+// db^2 + dr^2 of the low and the high half of the lanes, in 32 bits.
+inline void squareSums(Vec db, Vec dr, Vec out[2]) {
+  const Vec low = _mm_unpacklo_epi16(db, dr), high = _mm_unpackhi_epi16(db, dr);
+  out[0] = _mm_madd_epi16(low, low), out[1] = _mm_madd_epi16(high, high);
+}
+inline Vec smaller32(Vec a, Vec b) { return _mm_min_epi32(a, b); }
+inline Vec larger32(Vec a, Vec b) { return _mm_max_epi32(a, b); }
+inline Vec greater32(Vec a, Vec b) { return _mm_cmpgt_epi32(a, b); }
+// Masks of the two halves back into word lanes, in pixel order.
+inline Vec narrowMasks(Vec low, Vec high) { return _mm_packs_epi32(low, high); }
+
+#define ZEL_LANES
+#include "demosaic/ahd_words.inc"
+#undef ZEL_LANES
+
+}  // namespace words
+using words::colourBlocks;
+using words::greenBlocks;
+using words::homogeneityBlocks;
+using words::lumaChromaBlocks;
+
 }  // namespace sse
 
 // ---- AVX2: 8 lanes, the same bits ----
@@ -112,6 +166,64 @@ ZEL_AVX2 inline Vec greenLanes(bool firstGreen) {
 #include "demosaic/ahd_lanes.inc"
 #undef ZEL_LANES
 
+// 8-bit samples: 16 pixels in 16-bit lanes. Unpacking and packing work
+// within each 128-bit half, so the halves of the chroma distances narrow
+// back into pixel order.
+namespace words {
+
+using Vec = __m256i;
+constexpr int kLanes = 16;
+
+ZEL_AVX2 inline Vec loadBytes(const uint8_t* p) { return _mm256_cvtepu8_epi16(load128(p)); }
+ZEL_AVX2 inline Vec loadWords(const int16_t* p) { return load256(p); }
+ZEL_AVX2 inline void storeBytes(uint8_t* p, Vec v) {
+  store128(p, _mm_packus_epi16(_mm256_castsi256_si128(v), _mm256_extracti128_si256(v, 1)));
+}
+ZEL_AVX2 inline void storeSignedBytes(uint8_t* p, Vec v) {
+  store128(p, _mm_packs_epi16(_mm256_castsi256_si128(v), _mm256_extracti128_si256(v, 1)));
+}
+ZEL_AVX2 inline void storeWords(int16_t* p, Vec v) { store256(p, v); }
+
+ZEL_AVX2 inline Vec broadcast(int16_t v) { return _mm256_set1_epi16(v); }
+ZEL_AVX2 inline Vec add(Vec a, Vec b) { return _mm256_add_epi16(a, b); }
+ZEL_AVX2 inline Vec sub(Vec a, Vec b) { return _mm256_sub_epi16(a, b); }
+template <int N>
+ZEL_AVX2 inline Vec shiftRight(Vec a) {
+  return _mm256_srai_epi16(a, N);
+}
+template <int N>
+ZEL_AVX2 inline Vec shiftRightLogical(Vec a) {
+  return _mm256_srli_epi16(a, N);
+}
+ZEL_AVX2 inline Vec smaller(Vec a, Vec b) { return _mm256_min_epi16(a, b); }
+ZEL_AVX2 inline Vec larger(Vec a, Vec b) { return _mm256_max_epi16(a, b); }
+ZEL_AVX2 inline Vec magnitude(Vec a) { return _mm256_abs_epi16(a); }
+ZEL_AVX2 inline Vec multiplyLow(Vec a, Vec b) { return _mm256_mullo_epi16(a, b); }
+ZEL_AVX2 inline Vec greater(Vec a, Vec b) { return _mm256_cmpgt_epi16(a, b); }
+ZEL_AVX2 inline Vec either(Vec a, Vec b) { return _mm256_or_si256(a, b); }
+ZEL_AVX2 inline Vec select(Vec mask, Vec a, Vec b) { return _mm256_blendv_epi8(b, a, mask); }
+ZEL_AVX2 inline Vec greenLanes(bool firstGreen) {
+  return firstGreen ? _mm256_set1_epi32(0x0000FFFF) : _mm256_set1_epi32(int32_t(0xFFFF0000u));
+}
+ZEL_AVX2 inline void squareSums(Vec db, Vec dr, Vec out[2]) {
+  const Vec low = _mm256_unpacklo_epi16(db, dr), high = _mm256_unpackhi_epi16(db, dr);
+  out[0] = _mm256_madd_epi16(low, low), out[1] = _mm256_madd_epi16(high, high);
+}
+ZEL_AVX2 inline Vec smaller32(Vec a, Vec b) { return _mm256_min_epi32(a, b); }
+ZEL_AVX2 inline Vec larger32(Vec a, Vec b) { return _mm256_max_epi32(a, b); }
+ZEL_AVX2 inline Vec greater32(Vec a, Vec b) { return _mm256_cmpgt_epi32(a, b); }
+ZEL_AVX2 inline Vec narrowMasks(Vec low, Vec high) { return _mm256_packs_epi32(low, high); }
+
+#define ZEL_LANES ZEL_AVX2
+#include "demosaic/ahd_words.inc"
+#undef ZEL_LANES
+
+}  // namespace words
+using words::colourBlocks;
+using words::greenBlocks;
+using words::homogeneityBlocks;
+using words::lumaChromaBlocks;
+
 }  // namespace avx2
 
 namespace {
@@ -125,8 +237,14 @@ template <typename T>
 ColourTaps<T> advanced(const ColourTaps<T>& t, int i) {
   return ColourTaps<T>{t.gUp + i, t.g + i, t.gDown + i, t.sUp + i, t.s + i, t.sDown + i};
 }
-inline LumaChromaRow advanced(const LumaChromaRow& r, int i) { return LumaChromaRow{r.y + i, r.cb + i, r.cr + i}; }
-inline LumaChromaView advanced(const LumaChromaView& r, int i) { return LumaChromaView{r.y + i, r.cb + i, r.cr + i}; }
+template <typename T>
+LumaChromaRow<T> advanced(const LumaChromaRow<T>& r, int i) {
+  return LumaChromaRow<T>{r.y + i, r.cb + i, r.cr + i};
+}
+template <typename T>
+LumaChromaView<T> advanced(const LumaChromaView<T>& r, int i) {
+  return LumaChromaView<T>{r.y + i, r.cb + i, r.cr + i};
+}
 
 // Runs `blocks` of each level down from `level` on what the wider ones
 // left, and returns the pixels done; an even count keeps the site phase.
@@ -158,7 +276,7 @@ void colourRow(const ColourTaps<T>& t, int count, bool firstGreen, bool redRow, 
 }
 
 template <typename T>
-void lumaChromaRow(const T* r, const T* g, const T* b, int count, const LumaChromaRow& out, VectorLevel level) {
+void lumaChromaRow(const T* r, const T* g, const T* b, int count, const LumaChromaRow<T>& out, VectorLevel level) {
   const int done = vectorBlocks(
       level, count, [&](int i, int n) { return avx2::lumaChromaBlocks(r + i, g + i, b + i, n, advanced(out, i)); },
       [&](int i, int n) { return sse::lumaChromaBlocks(r + i, g + i, b + i, n, advanced(out, i)); });
@@ -166,23 +284,23 @@ void lumaChromaRow(const T* r, const T* g, const T* b, int count, const LumaChro
 }
 
 template <typename T>
-void homogeneityRow(const LumaChromaView h[3], const LumaChromaView v[3], int count, T* out, VectorLevel level) {
-  auto shifted = [&](int i, LumaChromaView(&hs)[3], LumaChromaView(&vs)[3]) {
+void homogeneityRow(const LumaChromaView<T> h[3], const LumaChromaView<T> v[3], int count, T* out, VectorLevel level) {
+  auto shifted = [&](int i, LumaChromaView<T>(&hs)[3], LumaChromaView<T>(&vs)[3]) {
     for (int k = 0; k < 3; ++k) hs[k] = advanced(h[k], i), vs[k] = advanced(v[k], i);
   };
   const int done = vectorBlocks(
       level, count,
       [&](int i, int n) {
-        LumaChromaView hs[3], vs[3];
+        LumaChromaView<T> hs[3], vs[3];
         shifted(i, hs, vs);
         return avx2::homogeneityBlocks(hs, vs, n, out + i);
       },
       [&](int i, int n) {
-        LumaChromaView hs[3], vs[3];
+        LumaChromaView<T> hs[3], vs[3];
         shifted(i, hs, vs);
         return sse::homogeneityBlocks(hs, vs, n, out + i);
       });
-  LumaChromaView hs[3], vs[3];
+  LumaChromaView<T> hs[3], vs[3];
   shifted(done, hs, vs);
   homogeneityRowScalar(hs, vs, count - done, out + done);
 }
@@ -257,8 +375,8 @@ void choiceRow(const T* const h[3], const T* const v[3], const T* const hom[3], 
 #define ZEL_AHD_KERNELS(T)                                                                                 \
   template void greenRow<T>(const GreenTaps<T>&, int, bool, T*, VectorLevel);                              \
   template void colourRow<T>(const ColourTaps<T>&, int, bool, bool, T*, T*, VectorLevel);                  \
-  template void lumaChromaRow<T>(const T*, const T*, const T*, int, const LumaChromaRow&, VectorLevel);    \
-  template void homogeneityRow<T>(const LumaChromaView[3], const LumaChromaView[3], int, T*, VectorLevel); \
+  template void lumaChromaRow<T>(const T*, const T*, const T*, int, const LumaChromaRow<T>&, VectorLevel);    \
+  template void homogeneityRow<T>(const LumaChromaView<T>[3], const LumaChromaView<T>[3], int, T*, VectorLevel); \
   template void choiceRow<T>(const T* const[3], const T* const[3], const T* const[3], int, T*, VectorLevel);
 ZEL_AHD_KERNELS(uint8_t)
 ZEL_AHD_KERNELS(uint16_t)

@@ -6,6 +6,7 @@
 #pragma once
 
 #include <cstdint>
+#include <type_traits>
 
 #include "demosaic/ahd.h"
 
@@ -33,12 +34,17 @@ struct ColourTaps {
   const T *sUp, *s, *sDown;
 };
 
-// Step 3 output, one row: luma and the two chroma values.
+// Step 3 output, one row: luma and the two chroma values. Those of 8-bit
+// samples fit 16 bits (luma 0..219, chroma -112..112).
+template <typename T>
+using LumaChromaValue = std::conditional_t<sizeof(T) == 1, int16_t, int32_t>;
+template <typename T>
 struct LumaChromaRow {
-  int32_t *y, *cb, *cr;
+  LumaChromaValue<T> *y, *cb, *cr;
 };
+template <typename T>
 struct LumaChromaView {
-  const int32_t *y, *cb, *cr;
+  const LumaChromaValue<T> *y, *cb, *cr;
 };
 
 template <typename T>
@@ -73,10 +79,11 @@ void colourRowScalar(const ColourTaps<T>& t, int count, bool firstGreen, bool re
 }
 
 template <typename T>
-void lumaChromaRowScalar(const T* r, const T* g, const T* b, int count, const LumaChromaRow& out) {
+void lumaChromaRowScalar(const T* r, const T* g, const T* b, int count, const LumaChromaRow<T>& out) {
   for (int i = 0; i < count; ++i) {
     const LumaChroma v = lumaChroma(loadSample(r + i), loadSample(g + i), loadSample(b + i));
-    out.y[i] = v.y, out.cb[i] = v.cb, out.cr[i] = v.cr;
+    using V = LumaChromaValue<T>;
+    out.y[i] = V(v.y), out.cb[i] = V(v.cb), out.cr[i] = V(v.cr);
   }
 }
 
@@ -84,8 +91,8 @@ void lumaChromaRowScalar(const T* r, const T* g, const T* b, int count, const Lu
 // above, at and below, per direction (reach 1 in the middle row). The
 // result is stored as a signed sample.
 template <typename T>
-void homogeneityRowScalar(const LumaChromaView h[3], const LumaChromaView v[3], int count, T* out) {
-  auto pick = [](const LumaChromaView& r, int i) { return LumaChroma{r.y[i], r.cb[i], r.cr[i]}; };
+void homogeneityRowScalar(const LumaChromaView<T> h[3], const LumaChromaView<T> v[3], int count, T* out) {
+  auto pick = [](const LumaChromaView<T>& r, int i) { return LumaChroma{int32_t(r.y[i]), int32_t(r.cb[i]), int32_t(r.cr[i])}; };
   for (int i = 0; i < count; ++i) {
     const Neighbourhood nh{pick(h[1], i), pick(h[1], i - 1), pick(h[1], i + 1), pick(h[0], i), pick(h[2], i)};
     const Neighbourhood nv{pick(v[1], i), pick(v[1], i - 1), pick(v[1], i + 1), pick(v[0], i), pick(v[2], i)};
@@ -135,9 +142,9 @@ void greenRow(const GreenTaps<T>& t, int count, bool firstGreen, T* out, VectorL
 template <typename T>
 void colourRow(const ColourTaps<T>& t, int count, bool firstGreen, bool redRow, T* outR, T* outB, VectorLevel level);
 template <typename T>
-void lumaChromaRow(const T* r, const T* g, const T* b, int count, const LumaChromaRow& out, VectorLevel level);
+void lumaChromaRow(const T* r, const T* g, const T* b, int count, const LumaChromaRow<T>& out, VectorLevel level);
 template <typename T>
-void homogeneityRow(const LumaChromaView h[3], const LumaChromaView v[3], int count, T* out, VectorLevel level);
+void homogeneityRow(const LumaChromaView<T> h[3], const LumaChromaView<T> v[3], int count, T* out, VectorLevel level);
 // The choice of a whole row of a tile, starting with H: SSE4.1 blocks of
 // 16 pixels (window sums in bytes, the running choice carried through the
 // block by a prefix scan), the scalar form for the rest.

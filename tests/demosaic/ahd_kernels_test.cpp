@@ -76,22 +76,23 @@ TEST(AhdKernels, GreenAndColourRowsMatchTheScalarForm) {
 }
 
 // Luma-chroma of three rows per direction, one pixel wider on each side.
+template <typename T>
 struct LumaChromaRows {
-  std::vector<int32_t> values[2][3][3];
-  zel::LumaChromaView views[2][3];
+  std::vector<zel::LumaChromaValue<T>> values[2][3][3];
+  zel::LumaChromaView<T> views[2][3];
 };
 
 template <typename T>
-LumaChromaRows lumaChromaOf(int count, uint32_t seed) {
-  LumaChromaRows out;
+LumaChromaRows<T> lumaChromaOf(int count, uint32_t seed) {
+  LumaChromaRows<T> out;
   for (int d = 0; d < 2; ++d)
     for (int k = 0; k < 3; ++k) {
       Row<T> r(count + 2, 0, 1, seed + 3 * (3 * d + k)), g(count + 2, 0, 3, seed + 1 + 3 * (3 * d + k)),
           b(count + 2, 0, 1, seed + 2 + 3 * (3 * d + k));
       for (auto& v : out.values[d][k]) v.assign(count + 2, 0);
-      zel::LumaChromaRow row{out.values[d][k][0].data(), out.values[d][k][1].data(), out.values[d][k][2].data()};
+      zel::LumaChromaRow<T> row{out.values[d][k][0].data(), out.values[d][k][1].data(), out.values[d][k][2].data()};
       zel::lumaChromaRowScalar(r.at(), g.at(), b.at(), count + 2, row);
-      out.views[d][k] = zel::LumaChromaView{row.y + 1, row.cb + 1, row.cr + 1};
+      out.views[d][k] = zel::LumaChromaView<T>{row.y + 1, row.cb + 1, row.cr + 1};
     }
   return out;
 }
@@ -102,17 +103,17 @@ void compareLumaChromaAndHomogeneity() {
     for (int offset : {1, 3}) {
       const uint32_t seed = uint32_t(count * 5 + offset);
       Row<T> r(count, 0, offset, seed), g(count, 0, offset + 2, seed + 1), b(count, 0, offset, seed + 2);
-      std::vector<int32_t> want[3], got[3];
+      std::vector<zel::LumaChromaValue<T>> want[3], got[3];
       for (auto& v : want) v.assign(count + 1, -7);
       zel::lumaChromaRowScalar(r.at(), g.at(), b.at(), count,
-                               zel::LumaChromaRow{want[0].data(), want[1].data(), want[2].data()});
+                               zel::LumaChromaRow<T>{want[0].data(), want[1].data(), want[2].data()});
       for (VectorLevel level : vectorLevels()) {
         for (auto& v : got) v.assign(count + 1, -7);
         zel::lumaChromaRow(r.at(), g.at(), b.at(), count,
-                           zel::LumaChromaRow{got[0].data(), got[1].data(), got[2].data()}, level);
+                           zel::LumaChromaRow<T>{got[0].data(), got[1].data(), got[2].data()}, level);
         for (int k = 0; k < 3; ++k) ASSERT_EQ(got[k], want[k]) << "luma-chroma " << k << " width " << count;
       }
-      const LumaChromaRows lc = lumaChromaOf<T>(count, seed * 7);
+      const LumaChromaRows<T> lc = lumaChromaOf<T>(count, seed * 7);
       std::vector<T> hom(count + 1, T(5));
       zel::homogeneityRowScalar(lc.views[0], lc.views[1], count, hom.data());
       for (VectorLevel level : vectorLevels()) {
