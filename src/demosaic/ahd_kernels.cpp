@@ -246,39 +246,59 @@ LumaChromaView<T> advanced(const LumaChromaView<T>& r, int i) {
   return LumaChromaView<T>{r.y + i, r.cb + i, r.cr + i};
 }
 
-// Runs `blocks` of each level down from `level` on what the wider ones
-// left, and returns the pixels done; an even count keeps the site phase.
+// Runs the blocks of the widest level on the row; the last pixels take one
+// more block that ends at the row's end and overlaps pixels already made.
+// Every kernel makes each pixel from its taps alone and never writes what
+// it reads, so a pixel made twice comes out the same. A row narrower than
+// a block goes to the next level down, and one narrower than every block is
+// left to the scalar form: returns the pixels done. `wide` and `narrow` are
+// the blocks of the two levels. A block at an odd pixel starts in the other
+// site phase, so kernels are handed the phase of their first pixel.
 template <typename Avx, typename Sse>
-int vectorBlocks(VectorLevel level, int count, Avx avx, Sse sse) {
-  int done = 0;
-  if (level == VectorLevel::Avx2) done = avx(0, count);
-  if (level != VectorLevel::Scalar) done += sse(done, count - done);
-  return done;
+int vectorBlocks(VectorLevel level, int count, int wide, Avx avx, Sse sse) {
+  auto whole = [count](int block, auto blocks) {
+    if (blocks(0, count) < count) blocks(count - block, block);
+    return count;
+  };
+  if (level == VectorLevel::Avx2 && count >= wide) return whole(wide, avx);
+  if (level != VectorLevel::Scalar && count >= wide / 2) return whole(wide / 2, sse);
+  return 0;
 }
+
+// Pixels per AVX2 block: 8-bit samples go in 16-bit lanes, 16-bit ones in
+// 32-bit lanes; an SSE4.1 block is half as wide.
+template <typename T>
+constexpr int kWideBlock = sizeof(T) == 1 ? 16 : 8;
 
 }  // namespace
 
 template <typename T>
 void greenRow(const GreenTaps<T>& t, int count, bool firstGreen, T* out, VectorLevel level) {
   const int done = vectorBlocks(
-      level, count, [&](int i, int n) { return avx2::greenBlocks(advanced(t, i), n, firstGreen, out + i); },
-      [&](int i, int n) { return sse::greenBlocks(advanced(t, i), n, firstGreen, out + i); });
-  greenRowScalar(advanced(t, done), count - done, firstGreen, out + done);
+      level, count, kWideBlock<T>,
+      [&](int i, int n) { return avx2::greenBlocks(advanced(t, i), n, isGreenLane(firstGreen, i), out + i); },
+      [&](int i, int n) { return sse::greenBlocks(advanced(t, i), n, isGreenLane(firstGreen, i), out + i); });
+  greenRowScalar(advanced(t, done), count - done, isGreenLane(firstGreen, done), out + done);
 }
 
 template <typename T>
 void colourRow(const ColourTaps<T>& t, int count, bool firstGreen, bool redRow, T* outR, T* outB, VectorLevel level) {
   const int done = vectorBlocks(
-      level, count,
-      [&](int i, int n) { return avx2::colourBlocks(advanced(t, i), n, firstGreen, redRow, outR + i, outB + i); },
-      [&](int i, int n) { return sse::colourBlocks(advanced(t, i), n, firstGreen, redRow, outR + i, outB + i); });
-  colourRowScalar(advanced(t, done), count - done, firstGreen, redRow, outR + done, outB + done);
+      level, count, kWideBlock<T>,
+      [&](int i, int n) {
+        return avx2::colourBlocks(advanced(t, i), n, isGreenLane(firstGreen, i), redRow, outR + i, outB + i);
+      },
+      [&](int i, int n) {
+        return sse::colourBlocks(advanced(t, i), n, isGreenLane(firstGreen, i), redRow, outR + i, outB + i);
+      });
+  colourRowScalar(advanced(t, done), count - done, isGreenLane(firstGreen, done), redRow, outR + done, outB + done);
 }
 
 template <typename T>
 void lumaChromaRow(const T* r, const T* g, const T* b, int count, const LumaChromaRow<T>& out, VectorLevel level) {
   const int done = vectorBlocks(
-      level, count, [&](int i, int n) { return avx2::lumaChromaBlocks(r + i, g + i, b + i, n, advanced(out, i)); },
+      level, count, kWideBlock<T>,
+      [&](int i, int n) { return avx2::lumaChromaBlocks(r + i, g + i, b + i, n, advanced(out, i)); },
       [&](int i, int n) { return sse::lumaChromaBlocks(r + i, g + i, b + i, n, advanced(out, i)); });
   lumaChromaRowScalar(r + done, g + done, b + done, count - done, advanced(out, done));
 }
@@ -289,7 +309,7 @@ void homogeneityRow(const LumaChromaView<T> h[3], const LumaChromaView<T> v[3], 
     for (int k = 0; k < 3; ++k) hs[k] = advanced(h[k], i), vs[k] = advanced(v[k], i);
   };
   const int done = vectorBlocks(
-      level, count,
+      level, count, kWideBlock<T>,
       [&](int i, int n) {
         LumaChromaView<T> hs[3], vs[3];
         shifted(i, hs, vs);
