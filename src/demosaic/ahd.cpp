@@ -90,7 +90,9 @@ class AhdRows {
  private:
   static constexpr int kH = 0, kV = 1;
   static constexpr int kPiece = 16;  // columns gathered at a time near an edge
-  static constexpr int kChunk = 128;  // columns of luma-chroma kept at a time
+  // Columns of differences made at a time: with the one more on either side
+  // the luma-chroma rows take whole vector blocks.
+  static constexpr int kChunk = sizeof(T) == 1 ? 254 : 126;
 
   static int ring(int y, int n) {
     const int m = y % n;
