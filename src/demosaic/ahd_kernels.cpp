@@ -90,22 +90,16 @@ inline Vec smaller(Vec a, Vec b) { return _mm_min_epi16(a, b); }
 inline Vec larger(Vec a, Vec b) { return _mm_max_epi16(a, b); }
 inline Vec magnitude(Vec a) { return _mm_abs_epi16(a); }
 inline Vec multiplyLow(Vec a, Vec b) { return _mm_mullo_epi16(a, b); }
-inline Vec greater(Vec a, Vec b) { return _mm_cmpgt_epi16(a, b); }
 inline Vec either(Vec a, Vec b) { return _mm_or_si128(a, b); }
 inline Vec select(Vec mask, Vec a, Vec b) { return _mm_blendv_epi8(b, a, mask); }
 inline Vec greenLanes(bool firstGreen) {
   return firstGreen ? _mm_setr_epi16(-1, 0, -1, 0, -1, 0, -1, 0) : _mm_setr_epi16(0, -1, 0, -1, 0, -1, 0, -1);
 }
-// db^2 + dr^2 of the low and the high half of the lanes, in 32 bits.
-inline void squareSums(Vec db, Vec dr, Vec out[2]) {
-  const Vec low = _mm_unpacklo_epi16(db, dr), high = _mm_unpackhi_epi16(db, dr);
-  out[0] = _mm_madd_epi16(low, low), out[1] = _mm_madd_epi16(high, high);
-}
-inline Vec smaller32(Vec a, Vec b) { return _mm_min_epi32(a, b); }
-inline Vec larger32(Vec a, Vec b) { return _mm_max_epi32(a, b); }
-inline Vec greater32(Vec a, Vec b) { return _mm_cmpgt_epi32(a, b); }
-// Masks of the two halves back into word lanes, in pixel order.
-inline Vec narrowMasks(Vec low, Vec high) { return _mm_packs_epi32(low, high); }
+inline Vec smallerUnsigned(Vec a, Vec b) { return _mm_min_epu16(a, b); }
+inline Vec largerUnsigned(Vec a, Vec b) { return _mm_max_epu16(a, b); }
+// a - b where a is above b, else 0, unsigned.
+inline Vec excess(Vec a, Vec b) { return _mm_subs_epu16(a, b); }
+inline Vec equal(Vec a, Vec b) { return _mm_cmpeq_epi16(a, b); }
 
 #define ZEL_LANES
 #include "demosaic/ahd_words.inc"
@@ -166,9 +160,7 @@ ZEL_AVX2 inline Vec greenLanes(bool firstGreen) {
 #include "demosaic/ahd_lanes.inc"
 #undef ZEL_LANES
 
-// 8-bit samples: 16 pixels in 16-bit lanes. Unpacking and packing work
-// within each 128-bit half, so the halves of the chroma distances narrow
-// back into pixel order.
+// 8-bit samples: 16 pixels in 16-bit lanes.
 namespace words {
 
 using Vec = __m256i;
@@ -199,20 +191,15 @@ ZEL_AVX2 inline Vec smaller(Vec a, Vec b) { return _mm256_min_epi16(a, b); }
 ZEL_AVX2 inline Vec larger(Vec a, Vec b) { return _mm256_max_epi16(a, b); }
 ZEL_AVX2 inline Vec magnitude(Vec a) { return _mm256_abs_epi16(a); }
 ZEL_AVX2 inline Vec multiplyLow(Vec a, Vec b) { return _mm256_mullo_epi16(a, b); }
-ZEL_AVX2 inline Vec greater(Vec a, Vec b) { return _mm256_cmpgt_epi16(a, b); }
 ZEL_AVX2 inline Vec either(Vec a, Vec b) { return _mm256_or_si256(a, b); }
 ZEL_AVX2 inline Vec select(Vec mask, Vec a, Vec b) { return _mm256_blendv_epi8(b, a, mask); }
 ZEL_AVX2 inline Vec greenLanes(bool firstGreen) {
   return firstGreen ? _mm256_set1_epi32(0x0000FFFF) : _mm256_set1_epi32(int32_t(0xFFFF0000u));
 }
-ZEL_AVX2 inline void squareSums(Vec db, Vec dr, Vec out[2]) {
-  const Vec low = _mm256_unpacklo_epi16(db, dr), high = _mm256_unpackhi_epi16(db, dr);
-  out[0] = _mm256_madd_epi16(low, low), out[1] = _mm256_madd_epi16(high, high);
-}
-ZEL_AVX2 inline Vec smaller32(Vec a, Vec b) { return _mm256_min_epi32(a, b); }
-ZEL_AVX2 inline Vec larger32(Vec a, Vec b) { return _mm256_max_epi32(a, b); }
-ZEL_AVX2 inline Vec greater32(Vec a, Vec b) { return _mm256_cmpgt_epi32(a, b); }
-ZEL_AVX2 inline Vec narrowMasks(Vec low, Vec high) { return _mm256_packs_epi32(low, high); }
+ZEL_AVX2 inline Vec smallerUnsigned(Vec a, Vec b) { return _mm256_min_epu16(a, b); }
+ZEL_AVX2 inline Vec largerUnsigned(Vec a, Vec b) { return _mm256_max_epu16(a, b); }
+ZEL_AVX2 inline Vec excess(Vec a, Vec b) { return _mm256_subs_epu16(a, b); }
+ZEL_AVX2 inline Vec equal(Vec a, Vec b) { return _mm256_cmpeq_epi16(a, b); }
 
 #define ZEL_LANES ZEL_AVX2
 #include "demosaic/ahd_words.inc"

@@ -5,6 +5,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <random>
 #include <vector>
 
@@ -75,7 +76,9 @@ TEST(AhdKernels, GreenAndColourRowsMatchTheScalarForm) {
   compareGreenAndColour<uint16_t>();
 }
 
-// Luma-chroma of three rows per direction, one pixel wider on each side.
+// Luma-chroma of three rows per direction, one pixel wider on each side;
+// with `corners` every colour is a corner of the colour cube, which gives
+// the largest chroma distances.
 template <typename T>
 struct LumaChromaRows {
   std::vector<zel::LumaChromaValue<T>> values[2][3][3];
@@ -83,12 +86,15 @@ struct LumaChromaRows {
 };
 
 template <typename T>
-LumaChromaRows<T> lumaChromaOf(int count, uint32_t seed) {
+LumaChromaRows<T> lumaChromaOf(int count, uint32_t seed, bool corners) {
   LumaChromaRows<T> out;
   for (int d = 0; d < 2; ++d)
     for (int k = 0; k < 3; ++k) {
       Row<T> r(count + 2, 0, 1, seed + 3 * (3 * d + k)), g(count + 2, 0, 3, seed + 1 + 3 * (3 * d + k)),
           b(count + 2, 0, 1, seed + 2 + 3 * (3 * d + k));
+      if (corners)
+        for (TestImage<T>* im : {&r.image, &g.image, &b.image})
+          for (int x = 0; x < im->rowSamples(); ++x) im->set(x, 0, im->get(x, 0) & 1 ? T(~T(0)) : T(0));
       for (auto& v : out.values[d][k]) v.assign(count + 2, 0);
       zel::LumaChromaRow<T> row{out.values[d][k][0].data(), out.values[d][k][1].data(), out.values[d][k][2].data()};
       zel::lumaChromaRowScalar(r.at(), g.at(), b.at(), count + 2, row);
@@ -99,6 +105,7 @@ LumaChromaRows<T> lumaChromaOf(int count, uint32_t seed) {
 
 template <typename T>
 void compareLumaChromaAndHomogeneity() {
+  int32_t widest = 0;
   for (int count = 1; count <= 70; ++count)
     for (int offset : {1, 3}) {
       const uint32_t seed = uint32_t(count * 5 + offset);
@@ -113,15 +120,24 @@ void compareLumaChromaAndHomogeneity() {
                            zel::LumaChromaRow<T>{got[0].data(), got[1].data(), got[2].data()}, level);
         for (int k = 0; k < 3; ++k) ASSERT_EQ(got[k], want[k]) << "luma-chroma " << k << " width " << count;
       }
-      const LumaChromaRows<T> lc = lumaChromaOf<T>(count, seed * 7);
-      std::vector<T> hom(count + 1, T(5));
-      zel::homogeneityRowScalar(lc.views[0], lc.views[1], count, hom.data());
-      for (VectorLevel level : vectorLevels()) {
-        std::vector<T> got2(count + 1, T(5));
-        zel::homogeneityRow(lc.views[0], lc.views[1], count, got2.data(), level);
-        ASSERT_EQ(got2, hom) << "homogeneity, width " << count << " level " << int(level);
+      for (bool corners : {false, true}) {
+        const LumaChromaRows<T> lc = lumaChromaOf<T>(count, seed * 7, corners);
+        std::vector<T> hom(count + 1, T(5));
+        zel::homogeneityRowScalar(lc.views[0], lc.views[1], count, hom.data());
+        for (VectorLevel level : vectorLevels()) {
+          std::vector<T> got2(count + 1, T(5));
+          zel::homogeneityRow(lc.views[0], lc.views[1], count, got2.data(), level);
+          ASSERT_EQ(got2, hom) << "homogeneity, width " << count << " level " << int(level) << " corners " << corners;
+        }
+        for (int x = 0; x < count; ++x) {
+          auto at = [&](int i) { return zel::LumaChroma{lc.views[0][1].y[i], lc.views[0][1].cb[i], lc.views[0][1].cr[i]}; };
+          widest = std::max(widest, zel::chromaDistance(at(x), at(x + 1)));
+        }
       }
     }
+  // The 8-bit vector form keeps chroma distances in unsigned words: the
+  // data must reach past the signed range.
+  EXPECT_GT(widest, 32767);
 }
 
 TEST(AhdKernels, LumaChromaAndHomogeneityMatchTheScalarForm) {
