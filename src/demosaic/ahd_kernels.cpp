@@ -90,6 +90,13 @@ inline Vec smaller(Vec a, Vec b) { return _mm_min_epi16(a, b); }
 inline Vec larger(Vec a, Vec b) { return _mm_max_epi16(a, b); }
 inline Vec magnitude(Vec a) { return _mm_abs_epi16(a); }
 inline Vec multiplyLow(Vec a, Vec b) { return _mm_mullo_epi16(a, b); }
+// Unsigned bytes of `a` by the signed bytes of `b`, pairs summed to words.
+inline Vec multiplyAddBytes(Vec a, Vec b) { return _mm_maddubs_epi16(a, b); }
+// 2 * kLanes bytes, laid out so that pairLow and pairHigh interleave the
+// bytes of two such vectors for the first and the second kLanes pixels.
+inline Vec loadPairable(const uint8_t* p) { return load128(p); }
+inline Vec pairLow(Vec a, Vec b) { return _mm_unpacklo_epi8(a, b); }
+inline Vec pairHigh(Vec a, Vec b) { return _mm_unpackhi_epi8(a, b); }
 inline Vec either(Vec a, Vec b) { return _mm_or_si128(a, b); }
 inline Vec select(Vec mask, Vec a, Vec b) { return _mm_blendv_epi8(b, a, mask); }
 inline Vec greenLanes(bool firstGreen) {
@@ -191,6 +198,12 @@ ZEL_AVX2 inline Vec smaller(Vec a, Vec b) { return _mm256_min_epi16(a, b); }
 ZEL_AVX2 inline Vec larger(Vec a, Vec b) { return _mm256_max_epi16(a, b); }
 ZEL_AVX2 inline Vec magnitude(Vec a) { return _mm256_abs_epi16(a); }
 ZEL_AVX2 inline Vec multiplyLow(Vec a, Vec b) { return _mm256_mullo_epi16(a, b); }
+ZEL_AVX2 inline Vec multiplyAddBytes(Vec a, Vec b) { return _mm256_maddubs_epi16(a, b); }
+// Quarters 0 2 1 3: the in-half interleaves then give pixels 0..15 and
+// 16..31 in order.
+ZEL_AVX2 inline Vec loadPairable(const uint8_t* p) { return _mm256_permute4x64_epi64(load256(p), 0xD8); }
+ZEL_AVX2 inline Vec pairLow(Vec a, Vec b) { return _mm256_unpacklo_epi8(a, b); }
+ZEL_AVX2 inline Vec pairHigh(Vec a, Vec b) { return _mm256_unpackhi_epi8(a, b); }
 ZEL_AVX2 inline Vec either(Vec a, Vec b) { return _mm256_or_si256(a, b); }
 ZEL_AVX2 inline Vec select(Vec mask, Vec a, Vec b) { return _mm256_blendv_epi8(b, a, mask); }
 ZEL_AVX2 inline Vec greenLanes(bool firstGreen) {
@@ -283,8 +296,9 @@ void colourRow(const ColourTaps<T>& t, int count, bool firstGreen, bool redRow, 
 
 template <typename T>
 void lumaChromaRow(const T* r, const T* g, const T* b, int count, const LumaChromaRow<T>& out, VectorLevel level) {
+  // 8-bit samples go through byte pairs, two blocks of words at a time.
   const int done = vectorBlocks(
-      level, count, kWideBlock<T>,
+      level, count, sizeof(T) == 1 ? 2 * kWideBlock<T> : kWideBlock<T>,
       [&](int i, int n) { return avx2::lumaChromaBlocks(r + i, g + i, b + i, n, advanced(out, i)); },
       [&](int i, int n) { return sse::lumaChromaBlocks(r + i, g + i, b + i, n, advanced(out, i)); });
   lumaChromaRowScalar(r + done, g + done, b + done, count - done, advanced(out, done));

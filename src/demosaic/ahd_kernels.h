@@ -1,8 +1,9 @@
 // Row kernels of the homogeneity-directed demosaicing. Each works on
 // `count` pixels of one row with pointers placed at the first pixel; taps
 // reach the stated number of samples to either side. A scalar form built
-// from the formulas of ahd.h and a vector form (SSE4.1 blocks of 4 pixels
-// in 32-bit lanes, then the scalar form for the rest) give the same values.
+// from the formulas of ahd.h and a vector form give the same values: 16-bit
+// samples in 32-bit lanes, 8-bit ones in 16-bit lanes, where every value
+// of theirs fits a word.
 #pragma once
 
 #include <cstdint>
@@ -135,8 +136,9 @@ bool choiceRowScalar(const T* const h[3], const T* const v[3], const T* const ho
 enum class VectorLevel { Scalar, Sse41, Avx2 };
 VectorLevel bestVectorLevel();
 
-// Vector blocks of the chosen level first (AVX2 blocks of 8 pixels, then
-// SSE4.1 blocks of 4), the scalar form for what is left.
+// Vector blocks of the chosen level (AVX2, or SSE4.1 with half as many
+// pixels), the last block overlapping the one before to end at the row's
+// end; the scalar form for a row narrower than a block.
 template <typename T>
 void greenRow(const GreenTaps<T>& t, int count, bool firstGreen, T* out, VectorLevel level);
 template <typename T>
