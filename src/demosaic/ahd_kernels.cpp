@@ -345,6 +345,30 @@ inline __m128i fillZeros(__m128i code, __m128i from) {
   return _mm_or_si128(code, _mm_and_si128(_mm_cmpeq_epi8(code, _mm_setzero_si128()), from));
 }
 
+// A code per pixel: 1 takes H, -1 takes V, 0 repeats the code to its left.
+// The scan hands each code on to the zeros 1, 2, 4 and 8 lanes to its right
+// within each 16 bytes.
+inline __m128i codesOf(__m128i sums) {
+  __m128i code = _mm_sign_epi8(_mm_set1_epi8(1), sums);
+  code = fillZeros(code, _mm_slli_si128(code, 1));
+  code = fillZeros(code, _mm_slli_si128(code, 2));
+  code = fillZeros(code, _mm_slli_si128(code, 4));
+  return fillZeros(code, _mm_slli_si128(code, 8));
+}
+inline __m128i lastCode(__m128i code) { return _mm_shuffle_epi8(code, _mm_set1_epi8(15)); }
+
+// The choice masks of 16 pixels from i on; what is still 0 after the scan
+// takes `carry`, the last code before them, which moves on to the last code
+// of these.
+template <typename T>
+inline __m128i choiceMasks(const T* const hom[3], int i, __m128i& carry) {
+  const __m128i sums =
+      _mm_add_epi8(_mm_add_epi8(columnSums(hom, i - 1), columnSums(hom, i)), columnSums(hom, i + 1));
+  const __m128i code = fillZeros(codesOf(sums), carry);
+  carry = lastCode(code);
+  return _mm_cmplt_epi8(code, _mm_setzero_si128());
+}
+
 // The pixels of 16 / sizeof(T) lanes from H or, where `mask` is set, V.
 template <typename T>
 inline void storeChosen(const T* const h[3], const T* const v[3], int i, __m128i mask, T* dst) {
@@ -353,40 +377,96 @@ inline void storeChosen(const T* const h[3], const T* const v[3], int i, __m128i
   storeRgb(dst + 3 * i, c[0], c[1], c[2]);
 }
 
+// SSE4.1 blocks of 16 pixels from pixel i on; returns where they end.
+template <typename T>
+int choiceBlocks(const T* const h[3], const T* const v[3], const T* const hom[3], int i, int count, __m128i& carry,
+                 T* dst) {
+  for (; i + 16 <= count; i += 16) {
+    const __m128i takeV = choiceMasks(hom, i, carry);
+    if constexpr (sizeof(T) == 1) {
+      storeChosen(h, v, i, takeV, dst);
+    } else {
+      storeChosen(h, v, i, _mm_cvtepi8_epi16(takeV), dst);
+      storeChosen(h, v, i + 8, _mm_cvtepi8_epi16(_mm_srli_si128(takeV, 8)), dst);
+    }
+  }
+  return i;
+}
+
+// AVX2: the pixels of the two 128-bit halves of the channel vectors, each
+// interleaved as by storeRgb, stored one after the other.
+template <typename T>
+ZEL_AVX2 ZEL_INLINE void storeRgbHalves(T* dst, __m256i r, __m256i g, __m256i b) {
+  const RgbShuffles& s = sizeof(T) == 1 ? kRgbShuffles8 : kRgbShuffles16;
+  __m256i o[3];
+  for (int j = 0; j < 3; ++j)
+    o[j] = _mm256_or_si256(_mm256_or_si256(_mm256_shuffle_epi8(r, broadcast128(s.m[j][0])),
+                                           _mm256_shuffle_epi8(g, broadcast128(s.m[j][1]))),
+                           _mm256_shuffle_epi8(b, broadcast128(s.m[j][2])));
+  uint8_t* out = reinterpret_cast<uint8_t*>(dst);
+  store256(out, _mm256_permute2x128_si256(o[0], o[1], 0x20));
+  store256(out + 32, _mm256_permute2x128_si256(o[2], o[0], 0x30));
+  store256(out + 64, _mm256_permute2x128_si256(o[1], o[2], 0x31));
+}
+
+template <typename T>
+ZEL_AVX2 ZEL_INLINE void storeChosenAvx2(const T* const h[3], const T* const v[3], int i, __m256i mask, T* dst) {
+  __m256i c[3];
+  for (int k = 0; k < 3; ++k) c[k] = _mm256_blendv_epi8(load256(h[k] + i), load256(v[k] + i), mask);
+  storeRgbHalves(dst + 3 * i, c[0], c[1], c[2]);
+}
+
+ZEL_AVX2 ZEL_INLINE __m256i columnSums256(const uint8_t* const hom[3], int i) {
+  return _mm256_add_epi8(_mm256_add_epi8(load256(hom[0] + i), load256(hom[1] + i)), load256(hom[2] + i));
+}
+ZEL_AVX2 ZEL_INLINE __m256i fillZeros256(__m256i code, __m256i from) {
+  return _mm256_or_si256(code, _mm256_and_si256(_mm256_cmpeq_epi8(code, _mm256_setzero_si256()), from));
+}
+
+// AVX2 blocks of 32 bytes of pixels (32 of 8 bits, 16 of 16 bits) from
+// pixel 0 on; returns where they end. 8-bit codes are scanned in both
+// halves at once, the upper half's zeros then taking the lower half's last
+// code.
+template <typename T>
+ZEL_AVX2 int choiceBlocksAvx2(const T* const h[3], const T* const v[3], const T* const hom[3], int count,
+                              __m128i& carry, T* dst) {
+  constexpr int block = 32 / int(sizeof(T));
+  int i = 0;
+  for (; i + block <= count; i += block) {
+    if constexpr (sizeof(T) == 1) {
+      const __m256i sums = _mm256_add_epi8(_mm256_add_epi8(columnSums256(hom, i - 1), columnSums256(hom, i)),
+                                           columnSums256(hom, i + 1));
+      __m256i code = _mm256_sign_epi8(_mm256_set1_epi8(1), sums);
+      code = fillZeros256(code, _mm256_slli_si256(code, 1));
+      code = fillZeros256(code, _mm256_slli_si256(code, 2));
+      code = fillZeros256(code, _mm256_slli_si256(code, 4));
+      code = fillZeros256(code, _mm256_slli_si256(code, 8));
+      const __m128i low = fillZeros(_mm256_castsi256_si128(code), carry);
+      const __m128i high = fillZeros(_mm256_extracti128_si256(code, 1), lastCode(low));
+      carry = lastCode(high);
+      const __m256i all = _mm256_inserti128_si256(_mm256_castsi128_si256(low), high, 1);
+      storeChosenAvx2(h, v, i, _mm256_cmpgt_epi8(_mm256_setzero_si256(), all), dst);
+    } else {
+      storeChosenAvx2(h, v, i, _mm256_cvtepi8_epi16(choiceMasks(hom, i, carry)), dst);
+    }
+  }
+  return i;
+}
+
 }  // namespace
 
 template <typename T>
-void choiceRow(const T* const h[3], const T* const v[3], const T* const hom[3], int count, T* dst,
+void choiceRow(const T* const hRows[3], const T* const vRows[3], const T* const homRows[3], int count, T* dst,
                VectorLevel level) {
-  constexpr int block = 16;
+  // Local copies, out of reach of the stores.
+  const T* const h[3] = {hRows[0], hRows[1], hRows[2]};
+  const T* const v[3] = {vRows[0], vRows[1], vRows[2]};
+  const T* const hom[3] = {homRows[0], homRows[1], homRows[2]};
   int i = 0;
-  bool takingV = false;
-  if (level != VectorLevel::Scalar && count >= block) {
-    // A code per pixel: 1 takes H, -1 takes V, 0 repeats the code to its
-    // left. The scan hands each code on to the zeros 1, 2, 4 and 8 lanes to
-    // its right; what is still 0 takes the last code of the block before.
-    const __m128i ones = _mm_set1_epi8(1), lastLane = _mm_set1_epi8(15);
-    __m128i carry = ones;
-    for (; i + block <= count; i += block) {
-      const __m128i sums =
-          _mm_add_epi8(_mm_add_epi8(columnSums(hom, i - 1), columnSums(hom, i)), columnSums(hom, i + 1));
-      __m128i code = _mm_sign_epi8(ones, sums);
-      code = fillZeros(code, _mm_slli_si128(code, 1));
-      code = fillZeros(code, _mm_slli_si128(code, 2));
-      code = fillZeros(code, _mm_slli_si128(code, 4));
-      code = fillZeros(code, _mm_slli_si128(code, 8));
-      code = fillZeros(code, carry);
-      carry = _mm_shuffle_epi8(code, lastLane);
-      const __m128i takeV = _mm_cmplt_epi8(code, _mm_setzero_si128());
-      if constexpr (sizeof(T) == 1) {
-        storeChosen(h, v, i, takeV, dst);
-      } else {
-        storeChosen(h, v, i, _mm_cvtepi8_epi16(takeV), dst);
-        storeChosen(h, v, i + 8, _mm_cvtepi8_epi16(_mm_srli_si128(takeV, 8)), dst);
-      }
-    }
-    takingV = int8_t(_mm_cvtsi128_si32(carry)) < 0;
-  }
+  __m128i carry = _mm_set1_epi8(1);  // H at the row's start
+  if (level == VectorLevel::Avx2) i = choiceBlocksAvx2(h, v, hom, count, carry, dst);
+  if (level != VectorLevel::Scalar) i = choiceBlocks(h, v, hom, i, count, carry, dst);
+  const bool takingV = int8_t(_mm_cvtsi128_si32(carry)) < 0;
   const T* hr[3] = {h[0] + i, h[1] + i, h[2] + i};
   const T* vr[3] = {v[0] + i, v[1] + i, v[2] + i};
   const T* homr[3] = {hom[0] + i, hom[1] + i, hom[2] + i};

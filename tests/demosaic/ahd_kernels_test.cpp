@@ -166,10 +166,13 @@ void compareChoice() {
         const T* hp[3] = {h.row(0), h.row(1), h.row(2)};
         const T* vp[3] = {v.row(0), v.row(1), v.row(2)};
         const T* homp[3] = {hom.row(0) + 1, hom.row(1) + 1, hom.row(2) + 1};
-        std::vector<T> pixels(3 * count + 1, T(3)), scalar(pixels);
+        std::vector<T> scalar(3 * count + 1, T(3));
         zel::choiceRowScalar(hp, vp, homp, count, false, scalar.data());
-        zel::choiceRow(hp, vp, homp, count, pixels.data(), VectorLevel::Sse41);
-        ASSERT_EQ(pixels, scalar) << "choice, width " << count << " density " << density;
+        for (VectorLevel level : vectorLevels()) {
+          std::vector<T> pixels(3 * count + 1, T(3));
+          zel::choiceRow(hp, vp, homp, count, pixels.data(), level);
+          ASSERT_EQ(pixels, scalar) << "choice, width " << count << " density " << density << " level " << int(level);
+        }
       }
 }
 
@@ -179,18 +182,21 @@ TEST(AhdKernels, ChoiceMatchesTheScalarForm) {
 }
 
 TEST(AhdKernels, ChoiceRunsFromHAndRepeatsOnZeroSums) {
-  // One homogeneity value of -1 at pixel 20 of the middle row: the sums of
-  // pixels 19..21 are -1 (V), and V holds on to the row's end; before it H.
-  constexpr int count = 40;
+  // One homogeneity value of -1 at pixel 10 of the middle row: the sums of
+  // pixels 9..11 are -1 (V), and V holds on to the row's end, through
+  // blocks of zero sums only; before it H.
+  constexpr int count = 60;
   std::vector<uint8_t> hom[3], h[3], v[3];
   for (int k = 0; k < 3; ++k) hom[k].assign(count + 2, 0), h[k].assign(count, 10), v[k].assign(count, 20);
-  hom[1][1 + 20] = uint8_t(-1);
+  hom[1][1 + 10] = uint8_t(-1);
   const uint8_t* homp[3] = {hom[0].data() + 1, hom[1].data() + 1, hom[2].data() + 1};
   const uint8_t* hp[3] = {h[0].data(), h[1].data(), h[2].data()};
   const uint8_t* vp[3] = {v[0].data(), v[1].data(), v[2].data()};
-  std::vector<uint8_t> out(3 * count);
-  zel::choiceRow(hp, vp, homp, count, out.data(), VectorLevel::Sse41);
-  for (int i = 0; i < count; ++i) ASSERT_EQ(out[3 * i + 1], i < 19 ? 10 : 20) << "pixel " << i;
+  for (VectorLevel level : vectorLevels()) {
+    std::vector<uint8_t> out(3 * count);
+    zel::choiceRow(hp, vp, homp, count, out.data(), level);
+    for (int i = 0; i < count; ++i) ASSERT_EQ(out[3 * i + 1], i < 9 ? 10 : 20) << "pixel " << i;
+  }
 }
 
 TEST(AhdFormulas, WorkedValues) {
