@@ -93,7 +93,9 @@ void lumaChromaRowScalar(const T* r, const T* g, const T* b, int count, const Lu
 // result is stored as a signed sample.
 template <typename T>
 void homogeneityRowScalar(const LumaChromaView<T> h[3], const LumaChromaView<T> v[3], int count, T* out) {
-  auto pick = [](const LumaChromaView<T>& r, int i) { return LumaChroma{int32_t(r.y[i]), int32_t(r.cb[i]), int32_t(r.cr[i])}; };
+  auto pick = [](const LumaChromaView<T>& r, int i) {
+    return LumaChroma{int32_t(r.y[i]), int32_t(r.cb[i]), int32_t(r.cr[i])};
+  };
   for (int i = 0; i < count; ++i) {
     const Neighbourhood nh{pick(h[1], i), pick(h[1], i - 1), pick(h[1], i + 1), pick(h[0], i), pick(h[2], i)};
     const Neighbourhood nv{pick(v[1], i), pick(v[1], i - 1), pick(v[1], i + 1), pick(v[0], i), pick(v[2], i)};

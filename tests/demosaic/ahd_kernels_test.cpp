@@ -133,7 +133,8 @@ void compareLumaChromaAndHomogeneity() {
           ASSERT_EQ(got2, hom) << "homogeneity, width " << count << " level " << int(level) << " corners " << corners;
         }
         for (int x = 0; x < count; ++x) {
-          auto at = [&](int i) { return zel::LumaChroma{lc.views[0][1].y[i], lc.views[0][1].cb[i], lc.views[0][1].cr[i]}; };
+          const zel::LumaChromaView<T>& row = lc.views[0][1];
+          auto at = [&](int i) { return zel::LumaChroma{row.y[i], row.cb[i], row.cr[i]}; };
           widest = std::max(widest, zel::chromaDistance(at(x), at(x + 1)));
         }
       }
