@@ -10,6 +10,7 @@
 
 #include <cstdint>
 #include <cstring>
+#include <type_traits>
 
 #include "luma_chroma/vector_units.h"
 
@@ -199,14 +200,26 @@ struct PlanesOut {
 // Samples3) in scalar code and, when kVector, `lanes<U>` (Trio of 16-bit
 // lanes to Trio of 16-bit lanes before SaturateU8).
 
+// A form may also offer `bytes<U>` (kBytes true): bytes of a block in,
+// bytes out, widening and narrowing its own way; it gives the bits of its
+// `pixel`.
+template <class Form, class = void>
+struct TakesBytes : std::false_type {};
+template <class Form>
+struct TakesBytes<Form, std::void_t<decltype(Form::kBytes)>> : std::bool_constant<Form::kBytes> {};
+
 template <class U, class In, class Out, class Form>
 ZEL_INLINE int formBlocks(const In& in, const Out& out, int x, int end, const Form& form) {
-  for (; x + U::kPixels <= end; x += U::kPixels) {
-    const Trio<U> s = in.template block<U>(x);
-    const Wide16<U> a = widen<U>(s.c0), b = widen<U>(s.c1), c = widen<U>(s.c2);
-    const Trio<U> lo = form.template lanes<U>(Trio<U>{a.lo, b.lo, c.lo});
-    const Trio<U> hi = form.template lanes<U>(Trio<U>{a.hi, b.hi, c.hi});
-    out.template block<U>(x, Trio<U>{U::packU8(lo.c0, hi.c0), U::packU8(lo.c1, hi.c1), U::packU8(lo.c2, hi.c2)});
+  if constexpr (TakesBytes<Form>::value) {
+    for (; x + U::kPixels <= end; x += U::kPixels) out.template block<U>(x, form.template bytes<U>(in.template block<U>(x)));
+  } else {
+    for (; x + U::kPixels <= end; x += U::kPixels) {
+      const Trio<U> s = in.template block<U>(x);
+      const Wide16<U> a = widen<U>(s.c0), b = widen<U>(s.c1), c = widen<U>(s.c2);
+      const Trio<U> lo = form.template lanes<U>(Trio<U>{a.lo, b.lo, c.lo});
+      const Trio<U> hi = form.template lanes<U>(Trio<U>{a.hi, b.hi, c.hi});
+      out.template block<U>(x, Trio<U>{U::packU8(lo.c0, hi.c0), U::packU8(lo.c1, hi.c1), U::packU8(lo.c2, hi.c2)});
+    }
   }
   return x;
 }
