@@ -86,7 +86,6 @@ struct Read16 {
   }
   // Eight pixels: pixels 0..3 in the low 128-bit lane, 4..7 in the high one.
   ZEL_AVX2 ZEL_INLINE FloatTrio<Ps8> get8(int x) const {
-    using M = WordMasks<Channels>;
     const uint16_t* s = p + Channels * x;
     const __m256i a = _mm256_inserti128_si256(_mm256_castsi128_si256(load128(s)), load128(s + 4 * Channels), 1);
     const __m256i b =

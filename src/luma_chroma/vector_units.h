@@ -58,6 +58,8 @@ struct Sse {
   static V sll16(V a) { return _mm_slli_epi16(a, N); }
   static V or_(V a, V b) { return _mm_or_si128(a, b); }
   static V xor_(V a, V b) { return _mm_xor_si128(a, b); }
+  // Bytes of b where the mask byte's top bit is set, else of a.
+  static V blend8(V a, V b, V m) { return _mm_blendv_epi8(a, b, m); }
   static V shuffle8(V a, V m) { return _mm_shuffle_epi8(a, m); }
   static V unpackLo8(V a, V b) { return _mm_unpacklo_epi8(a, b); }
   static V unpackHi8(V a, V b) { return _mm_unpackhi_epi8(a, b); }
@@ -113,6 +115,7 @@ struct Avx {
   ZEL_AVX2 static V sll16(V a) { return _mm256_slli_epi16(a, N); }
   ZEL_AVX2 static V or_(V a, V b) { return _mm256_or_si256(a, b); }
   ZEL_AVX2 static V xor_(V a, V b) { return _mm256_xor_si256(a, b); }
+  ZEL_AVX2 static V blend8(V a, V b, V m) { return _mm256_blendv_epi8(a, b, m); }
   ZEL_AVX2 static V shuffle8(V a, V m) { return _mm256_shuffle_epi8(a, m); }
   ZEL_AVX2 static V unpackLo8(V a, V b) { return _mm256_unpacklo_epi8(a, b); }
   ZEL_AVX2 static V unpackHi8(V a, V b) { return _mm256_unpackhi_epi8(a, b); }
