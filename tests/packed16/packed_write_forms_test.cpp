@@ -83,14 +83,13 @@ TEST(PackedForms, WorkedValues) {
 
 // One block of the given form and reduction in unit U, from 16-bit samples.
 template <class U, class Form, class Writer>
-void blockWords(const Form& form, const Writer& writer, int y, const int16_t* s0, const int16_t* s1, const int16_t* s2,
+ZEL_INLINE void blockWords(const Form& form, const Writer& writer, int y, const int16_t* s0, const int16_t* s1, const int16_t* s2,
                 uint16_t* out) {
-  auto ld = [](const int16_t* p) {
+  auto ld = [](const int16_t* p) ZEL_LAMBDA_INLINE {
     if constexpr (U::kWords == 8) return zel::load128(p);
     else return zel::load256(p);
   };
-  const Trio<U> c = form.template lanes<U>(Trio<U>{ld(s0), ld(s1), ld(s2)});
-  U::storeWords(out, RowWords<U, Writer>(writer, y)(writer.redHigh ? c.c2 : c.c0, c.c1, writer.redHigh ? c.c0 : c.c2));
+  U::storeWords(out, wordsOfBlock<U>(Trio<U>{ld(s0), ld(s1), ld(s2)}, form, writer, RowWords<U, Writer>(writer, y)));
 }
 
 template <class Form, class Writer>
