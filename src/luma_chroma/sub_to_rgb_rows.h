@@ -211,8 +211,6 @@ struct StreamLoad;
 
 template <>
 struct StreamLoad<Sse, false> {
-  template <int N>
-  static __m128i alignr(__m128i hi, __m128i lo) { return _mm_alignr_epi8(hi, lo, N); }
   static __m128i first(const uint8_t* q) { return load128(q); }
   static __m128i second(const uint8_t* q) { return load128(q + 16); }
   static __m128i lowHalves(__m128i a, __m128i b) { return _mm_unpacklo_epi64(a, b); }
@@ -221,8 +219,6 @@ struct StreamLoad<Sse, false> {
 
 template <>
 struct StreamLoad<Avx, false> {
-  template <int N>
-  ZEL_AVX2 static __m256i alignr(__m256i hi, __m256i lo) { return _mm256_alignr_epi8(hi, lo, N); }
   ZEL_AVX2 static __m256i first(const uint8_t* q) { return Avx::loadUnits(q, 32); }
   ZEL_AVX2 static __m256i second(const uint8_t* q) { return Avx::loadUnits(q + 16, 32); }
   ZEL_AVX2 static __m256i lowHalves(__m256i a, __m256i b) { return _mm256_unpacklo_epi64(a, b); }
@@ -249,59 +245,6 @@ ZEL_AVX2 inline void storeFlat(const PackedOutAlpha<Reverse>& out, int x, const 
   store256(q + 96, _mm256_unpackhi_epi16(hi01, hi23));
 }
 
-// Three-byte pixels of a block of 16 pixels a unit: channels X, Y (zipped
-// into pairs) and Z to the three 16-byte thirds of each unit.
-template <class U>
-ZEL_INLINE void mergeThirds(typename U::V x, typename U::V y, typename U::V z, typename U::V out[3]) {
-  using V = typename U::V;
-  static constexpr Shuffle16 k[6] = {
-      {{0, 1, -1, 2, 3, -1, 4, 5, -1, 6, 7, -1, 8, 9, -1, 10}},
-      {{-1, -1, 0, -1, -1, 1, -1, -1, 2, -1, -1, 3, -1, -1, 4, -1}},
-      {{0, -1, 1, 2, -1, 3, 4, -1, 5, 6, -1, 7, 8, -1, 9, 10}},
-      {{-1, 5, -1, -1, 6, -1, -1, 7, -1, -1, 8, -1, -1, 9, -1, -1}},
-      {{-1, 6, 7, -1, 8, 9, -1, 10, 11, -1, 12, 13, -1, 14, 15, -1}},
-      {{10, -1, -1, 11, -1, -1, 12, -1, -1, 13, -1, -1, 14, -1, -1, 15}},
-  };
-  const V lo = U::unpackLo8(x, y), hi = U::unpackHi8(x, y);
-  // Pixels 5.. of the pairs: bytes 11.. of lo, then hi.
-  const V mid = StreamLoad<U, false>::template alignr<11>(hi, lo);
-  out[0] = U::or_(U::shuffle8(lo, U::shuffleOf(k[0])), U::shuffle8(z, U::shuffleOf(k[1])));
-  out[1] = U::or_(U::shuffle8(mid, U::shuffleOf(k[2])), U::shuffle8(z, U::shuffleOf(k[3])));
-  out[2] = U::or_(U::shuffle8(hi, U::shuffleOf(k[4])), U::shuffle8(z, U::shuffleOf(k[5])));
-}
-
-inline void storeThirds(uint8_t* q, const __m128i t[3]) {
-  store128(q, t[0]);
-  store128(q + 16, t[1]);
-  store128(q + 32, t[2]);
-}
-// Two units of 48 bytes, whole 32-byte stores.
-ZEL_AVX2 inline void storeThirds(uint8_t* q, const __m256i t[3]) {
-  store256(q, _mm256_permute2x128_si256(t[0], t[1], 0x20));
-  store256(q + 32, _mm256_permute2x128_si256(t[2], t[0], 0x30));
-  store256(q + 64, _mm256_permute2x128_si256(t[1], t[2], 0x31));
-}
-
-template <class Out>
-struct ThirdsOut : std::false_type {};
-template <bool Reverse>
-struct ThirdsOut<PackedOut3<Reverse>> : std::true_type {
-  static constexpr bool kReverse = Reverse;
-};
-
-// A block to its destination; three-byte pixels through mergeThirds.
-template <class U, class Out>
-ZEL_INLINE void writeBlock(const Out& out, int x, const Trio<U>& bytes) {
-  if constexpr (ThirdsOut<Out>::value) {
-    constexpr bool kR = ThirdsOut<Out>::kReverse;
-    typename U::V t[3];
-    mergeThirds<U>(kR ? bytes.c2 : bytes.c0, bytes.c1, kR ? bytes.c0 : bytes.c2, t);
-    storeThirds(out.p + 3 * x, t);
-  } else {
-    out.template block<U>(x, bytes);
-  }
-}
-
 template <class Out>
 struct FlatOut : std::false_type {};
 template <bool Reverse>
@@ -324,7 +267,7 @@ ZEL_INLINE int streamBlocks(const PairStream<Order>& in, const Out& out, int x, 
     if constexpr (Flat)
       storeFlat(out, x, bytes);
     else
-      writeBlock<U>(out, x, bytes);
+      out.template block<U>(x, bytes);
   }
   return x;
 }
@@ -385,8 +328,8 @@ ZEL_INLINE int expandBlocks(const RowSet<Rows, Luma, Chroma, Out>& rowSet, int x
       const Wide16<U> y = rows.luma[r].template lumaBlock<U>(x);
       const Trio<U> lo = form.template combine<U>(y.lo, t.lo);
       const Trio<U> hi = form.template combine<U>(y.hi, t.hi);
-      writeBlock<U>(rows.out[r], x,
-                    Trio<U>{U::packU8(lo.c0, hi.c0), U::packU8(lo.c1, hi.c1), U::packU8(lo.c2, hi.c2)});
+      rows.out[r].template block<U>(x,
+                                    Trio<U>{U::packU8(lo.c0, hi.c0), U::packU8(lo.c1, hi.c1), U::packU8(lo.c2, hi.c2)});
     }
   }
   return x;
