@@ -292,12 +292,50 @@ ZEL_AVX2 __attribute__((flatten)) int forwardBlocksAvx(const Src* src, typename 
   return forwardBlocks<Avx, Op, Src, Ch, Stream>(src, out, 0, end);
 }
 
+// The byte-plane forward in byte lanes, 2 * U::kPixels pixels a block.
+// With ~x = 255 - x and means of two bytes:
+//   Y  = (R + 2G + B + 2) >> 2        = ceil((floor((R + B) / 2) + G) / 2)
+//   Co = ((R - B + 1) >> 1) + 128     = floor((R + ~B) / 2) + 1
+//   Cg = ((2G - B - R + 2) >> 2) + 128 = floor((G + ~ceil((R + B) / 2)) / 2) + 1
+// Co and Cg reach 256 at most, where the saturating add stops at 255, and
+// never go below 1.
+template <class U, class V>
+ZEL_INLINE V floorMeanU8(V a, V b) {
+  return U::sub8(U::averageU8(a, b), U::and_(U::xor_(a, b), U::set8(1)));
+}
+template <class U>
+ZEL_INLINE int bytePlaneBlocks(const uint8_t* src, uint8_t* const* out, int x, int end) {
+  using V = typename U::V;
+  constexpr int kStep = 2 * U::kPixels;
+  const V one = U::set8(1), all = U::ones();
+  for (; x + kStep <= end; x += kStep) {
+    V e[3];
+    ByteTriples<U>::load(src + 3 * x, e);
+    const V r = e[0], g = e[1], b = e[2];
+    const V up = U::averageU8(r, b);
+    const V down = U::sub8(up, U::and_(U::xor_(r, b), one));
+    U::store(out[0] + x, U::averageU8(down, g));
+    U::store(out[1] + x, U::addSatU8(floorMeanU8<U>(r, U::xor_(b, all)), one));
+    U::store(out[2] + x, U::addSatU8(floorMeanU8<U>(g, U::xor_(up, all)), one));
+  }
+  return x;
+}
+ZEL_AVX2 __attribute__((flatten)) inline int bytePlaneBlocksAvx(const uint8_t* src, uint8_t* const* out, int end) {
+  return bytePlaneBlocks<Avx>(src, out, 0, end);
+}
+
 // Interleaved B, G, R (and an unused fourth element) to three planes.
 // Pixels below width & ~3 take the body formula, the rest the tail.
 template <class Op, typename Src, int Ch, bool Stream>
 void forwardRow(const Src* src, typename Op::Plane* const* out, int width, bool avx2) {
   const int blocks = width & ~7, body = width & ~3;
-  int x = avx2 ? forwardBlocksAvx<Op, Src, Ch, Stream>(src, out, blocks) : 0;
+  int x = 0;
+  if constexpr (std::is_same_v<Op, BytePlanes>) {
+    if (avx2) x = bytePlaneBlocksAvx(src, out, width);
+    x = bytePlaneBlocks<Sse>(src, out, x, width);
+  } else if (avx2) {
+    x = forwardBlocksAvx<Op, Src, Ch, Stream>(src, out, blocks);
+  }
   x = forwardBlocks<Sse, Op, Src, Ch, Stream>(src, out, x, blocks);
   auto write = [&](int at, const auto& v) {
     out[0][at] = v.y;

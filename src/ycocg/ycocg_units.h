@@ -66,6 +66,11 @@ struct Sse {
     return _mm_blend_epi16(a, b, Imm);
   }
   static V packU8(V a, V b) { return _mm_packus_epi16(a, b); }
+  static V set8(int v) { return _mm_set1_epi8(static_cast<int8_t>(v)); }
+  static V sub8(V a, V b) { return _mm_sub_epi8(a, b); }
+  static V addSatU8(V a, V b) { return _mm_adds_epu8(a, b); }
+  static V averageU8(V a, V b) { return _mm_avg_epu8(a, b); }
+  static V blend8(V a, V b, V m) { return _mm_blendv_epi8(a, b, m); }
   static V unpackLo8(V a, V b) { return _mm_unpacklo_epi8(a, b); }
   static V unpackHi8(V a, V b) { return _mm_unpackhi_epi8(a, b); }
   static V unpackLo16(V a, V b) { return _mm_unpacklo_epi16(a, b); }
@@ -137,6 +142,11 @@ struct Avx {
     return _mm256_blend_epi16(a, b, Imm);
   }
   ZEL_AVX2 static V packU8(V a, V b) { return _mm256_packus_epi16(a, b); }
+  ZEL_AVX2 static V set8(int v) { return _mm256_set1_epi8(static_cast<int8_t>(v)); }
+  ZEL_AVX2 static V sub8(V a, V b) { return _mm256_sub_epi8(a, b); }
+  ZEL_AVX2 static V addSatU8(V a, V b) { return _mm256_adds_epu8(a, b); }
+  ZEL_AVX2 static V averageU8(V a, V b) { return _mm256_avg_epu8(a, b); }
+  ZEL_AVX2 static V blend8(V a, V b, V m) { return _mm256_blendv_epi8(a, b, m); }
   ZEL_AVX2 static V unpackLo8(V a, V b) { return _mm256_unpacklo_epi8(a, b); }
   ZEL_AVX2 static V unpackHi8(V a, V b) { return _mm256_unpackhi_epi8(a, b); }
   ZEL_AVX2 static V unpackLo16(V a, V b) { return _mm256_unpacklo_epi16(a, b); }
@@ -200,6 +210,48 @@ constexpr ByteMask packedBytes(int chunk, bool fromFirst) {
 }
 template <int Chunk, bool First>
 inline constexpr ByteMask kPackedBytes = packedBytes(Chunk, First);
+
+// Three bytes a pixel, 16 pixels a 128-bit lane: byte 3k + c of the 48
+// lies at byte (3k + c) % 16 of chunk (3k + c) / 16, and (3k + c) % 16 runs
+// over every byte of a chunk once, so a channel is two byte blends and one
+// shuffle.
+constexpr ByteMask bytesFromChunk(int channel, int chunk) {
+  ByteMask m{};
+  for (int k = 0; k < 16; ++k) {
+    const int e = 3 * k + channel;
+    m.b[e % 16] = int8_t(e / 16 == chunk ? -1 : 0);
+  }
+  return m;
+}
+constexpr ByteMask byteOrder(int channel) {
+  ByteMask m{};
+  for (int k = 0; k < 16; ++k) m.b[k] = int8_t((3 * k + channel) % 16);
+  return m;
+}
+template <int C, int Chunk>
+inline constexpr ByteMask kBytesFromChunk = bytesFromChunk(C, Chunk);
+template <int C>
+inline constexpr ByteMask kByteOrder = byteOrder(C);
+
+// 2 * kPixels three-byte pixels to one vector of bytes a channel (lane 0
+// the first 16 pixels, lane 1 the next).
+template <class U>
+struct ByteTriples {
+  using V = typename U::V;
+  using G = PixelGroup<1, 3, 1>;  // 16 pixels, 48 bytes
+  template <int C>
+  ZEL_INLINE static V channel(const V* raw) {
+    const V v =
+        U::blend8(U::blend8(raw[0], raw[1], U::mask(kBytesFromChunk<C, 1>)), raw[2], U::mask(kBytesFromChunk<C, 2>));
+    return U::shuffle8(v, U::mask(kByteOrder<C>));
+  }
+  ZEL_INLINE static void load(const uint8_t* p, V* lanes) {
+    const V raw[3] = {U::template chunk<G>(p, 0), U::template chunk<G>(p, 1), U::template chunk<G>(p, 2)};
+    lanes[0] = channel<0>(raw);
+    lanes[1] = channel<1>(raw);
+    lanes[2] = channel<2>(raw);
+  }
+};
 
 // kPixels pixels of Ch elements of E bytes (1 unsigned, 2 signed 16-bit).
 template <class U, int E, int Ch>
