@@ -29,15 +29,16 @@ bool streamable(const A* interleaved, B* const* planes, int width) {
 template <class Op, typename Src, int Ch, bool StreamRule>
 void forwardDriver(const Src* src, int srcStep, typename Op::Plane* const* dst, int dstStep, ImageSize size) {
   using Plane = typename Op::Plane;
+  const bool avx2 = hasAvx2();
   bool streamed = false;
   plainWalk(size.height, [&](int y) {
     const Src* s = rowAt(src, srcStep, y);
     Plane* rows[3] = {rowAt(dst[0], dstStep, y), rowAt(dst[1], dstStep, y), rowAt(dst[2], dstStep, y)};
     if (StreamRule && streamable(s, rows, size.width)) {
-      forwardRow<Op, Src, Ch, true>(s, rows, size.width);
+      forwardRow<Op, Src, Ch, true>(s, rows, size.width, avx2);
       streamed = true;
     } else {
-      forwardRow<Op, Src, Ch, false>(s, rows, size.width);
+      forwardRow<Op, Src, Ch, false>(s, rows, size.width, avx2);
     }
   });
   if (streamed) _mm_sfence();
@@ -47,15 +48,16 @@ template <class Op, typename Dst, int Ch, bool StreamRule>
 void inverseDriver(const typename Op::Plane* const* src, int srcStep, Dst* dst, int dstStep, ImageSize size,
                    Dst alpha) {
   using Plane = typename Op::Plane;
+  const bool avx2 = hasAvx2();
   bool streamed = false;
   plainWalk(size.height, [&](int y) {
     const Plane* rows[3] = {rowAt(src[0], srcStep, y), rowAt(src[1], srcStep, y), rowAt(src[2], srcStep, y)};
     Dst* d = rowAt(dst, dstStep, y);
     if (StreamRule && streamable(d, rows, size.width)) {
-      inverseRow<Op, Dst, Ch, true>(rows, d, size.width, alpha);
+      inverseRow<Op, Dst, Ch, true>(rows, d, size.width, alpha, avx2);
       streamed = true;
     } else {
-      inverseRow<Op, Dst, Ch, false>(rows, d, size.width, alpha);
+      inverseRow<Op, Dst, Ch, false>(rows, d, size.width, alpha, avx2);
     }
   });
   if (streamed) _mm_sfence();
@@ -84,42 +86,6 @@ Status inverse(const typename Op::Plane* const* src, int srcStep, Dst* dst, int 
 
 }  // namespace
 
-// The byte-plane pair: complete in their public functions, pixel by pixel.
-Status rgbToYCoCgBytes(const uint8_t* src, int srcStep, uint8_t* const dst[3], int dstStep, ImageSize size) {
-  if (anyNull(src, dst) || anyPlaneNull(dst)) return StatusNullPointerError;
-  if (badSize(size)) return StatusSizeError;
-  for (int y = 0; y < size.height; ++y) {
-    const uint8_t* s = rowAt(src, srcStep, y);
-    uint8_t* py = rowAt(dst[0], dstStep, y);
-    uint8_t* pco = rowAt(dst[1], dstStep, y);
-    uint8_t* pcg = rowAt(dst[2], dstStep, y);
-    for (int x = 0; x < size.width; ++x) {
-      const Ycc<uint8_t> v = bytePlaneForward(s[3 * x], s[3 * x + 1], s[3 * x + 2]);
-      py[x] = v.y;
-      pco[x] = v.co;
-      pcg[x] = v.cg;
-    }
-  }
-  return StatusOk;
-}
-
-Status yCoCgToRgbBytes(const uint8_t* const src[3], int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
-  if (anyNull(dst, src) || anyPlaneNull(src)) return StatusNullPointerError;
-  for (int y = 0; y < size.height; ++y) {
-    const uint8_t* py = rowAt(src[0], srcStep, y);
-    const uint8_t* pco = rowAt(src[1], srcStep, y);
-    const uint8_t* pcg = rowAt(src[2], srcStep, y);
-    uint8_t* d = rowAt(dst, dstStep, y);
-    for (int x = 0; x < size.width; ++x) {
-      const Bgr<uint8_t> v = bytePlaneInverse(py[x], pco[x], pcg[x]);
-      d[3 * x] = v.r;
-      d[3 * x + 1] = v.g;
-      d[3 * x + 2] = v.b;
-    }
-  }
-  return StatusOk;
-}
-
 }  // namespace zel::ycocg
 
 using namespace zel::ycocg;
@@ -133,17 +99,17 @@ ZEL_PUBLIC Status zeliBGRToYCoCg_8u16s_C4P3R(const uint8_t* src, int srcStep, in
                                              ImageSize size) {
   return forward<PlainBytes, uint8_t, 4, true>(src, srcStep, dst, dstStep, size);
 }
-ZEL_PUBLIC Status zeliBGRToYCoCg_Rev_8u16s_C3P3R(const uint8_t* src, int srcStep, int16_t* const dst[3],
-                                                 int dstStep, ImageSize size) {
+ZEL_PUBLIC Status zeliBGRToYCoCg_Rev_8u16s_C3P3R(const uint8_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                                 ImageSize size) {
   return forward<LiftBytes, uint8_t, 3, true>(src, srcStep, dst, dstStep, size);
 }
-ZEL_PUBLIC Status zeliBGRToYCoCg_Rev_8u16s_C4P3R(const uint8_t* src, int srcStep, int16_t* const dst[3],
-                                                 int dstStep, ImageSize size) {
+ZEL_PUBLIC Status zeliBGRToYCoCg_Rev_8u16s_C4P3R(const uint8_t* src, int srcStep, int16_t* const dst[3], int dstStep,
+                                                 ImageSize size) {
   return forward<LiftBytes, uint8_t, 4, true>(src, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliRGBToYCoCg_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dst[3], int dstStep,
                                           ImageSize size) {
-  return rgbToYCoCgBytes(src, srcStep, dst, dstStep, size);
+  return forward<BytePlanes, uint8_t, 3, true>(src, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliSBGRToYCoCg_16s32s_C3P3R(const int16_t* src, int srcStep, int32_t* const dst[3], int dstStep,
                                                ImageSize size) {
@@ -161,12 +127,12 @@ ZEL_PUBLIC Status zeliSBGRToYCoCg_16s_C4P3R(const int16_t* src, int srcStep, int
                                             ImageSize size) {
   return forward<PlainShort, int16_t, 4, true>(src, srcStep, dst, dstStep, size);
 }
-ZEL_PUBLIC Status zeliSBGRToYCoCg_Rev_16s32s_C3P3R(const int16_t* src, int srcStep, int32_t* const dst[3],
-                                                   int dstStep, ImageSize size) {
+ZEL_PUBLIC Status zeliSBGRToYCoCg_Rev_16s32s_C3P3R(const int16_t* src, int srcStep, int32_t* const dst[3], int dstStep,
+                                                   ImageSize size) {
   return forward<Wide<true>, int16_t, 3, true>(src, srcStep, dst, dstStep, size);
 }
-ZEL_PUBLIC Status zeliSBGRToYCoCg_Rev_16s32s_C4P3R(const int16_t* src, int srcStep, int32_t* const dst[3],
-                                                   int dstStep, ImageSize size) {
+ZEL_PUBLIC Status zeliSBGRToYCoCg_Rev_16s32s_C4P3R(const int16_t* src, int srcStep, int32_t* const dst[3], int dstStep,
+                                                   ImageSize size) {
   return forward<Wide<true>, int16_t, 4, false>(src, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliSBGRToYCoCg_Rev_16s_C3P3R(const int16_t* src, int srcStep, int16_t* const dst[3], int dstStep,
@@ -187,17 +153,17 @@ ZEL_PUBLIC Status zeliYCoCgToBGR_16s8u_P3C4R(const int16_t* const src[3], int sr
                                              ImageSize size, uint8_t alpha) {
   return inverse<Short<false>, uint8_t, 4, false>(src, srcStep, dst, dstStep, size, alpha);
 }
-ZEL_PUBLIC Status zeliYCoCgToBGR_Rev_16s8u_P3C3R(const int16_t* const src[3], int srcStep, uint8_t* dst,
-                                                 int dstStep, ImageSize size) {
+ZEL_PUBLIC Status zeliYCoCgToBGR_Rev_16s8u_P3C3R(const int16_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                                 ImageSize size) {
   return inverse<Short<true>, uint8_t, 3, false>(src, srcStep, dst, dstStep, size);
 }
-ZEL_PUBLIC Status zeliYCoCgToBGR_Rev_16s8u_P3C4R(const int16_t* const src[3], int srcStep, uint8_t* dst,
-                                                 int dstStep, ImageSize size, uint8_t alpha) {
+ZEL_PUBLIC Status zeliYCoCgToBGR_Rev_16s8u_P3C4R(const int16_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
+                                                 ImageSize size, uint8_t alpha) {
   return inverse<Short<true>, uint8_t, 4, false>(src, srcStep, dst, dstStep, size, alpha);
 }
 ZEL_PUBLIC Status zeliYCoCgToRGB_8u_P3C3R(const uint8_t* const src[3], int srcStep, uint8_t* dst, int dstStep,
                                           ImageSize size) {
-  return yCoCgToRgbBytes(src, srcStep, dst, dstStep, size);
+  return inverse<BytePlanesBack, uint8_t, 3, false>(src, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliYCoCgToSBGR_16s_P3C3R(const int16_t* const src[3], int srcStep, int16_t* dst, int dstStep,
                                             ImageSize size) {
@@ -223,11 +189,11 @@ ZEL_PUBLIC Status zeliYCoCgToSBGR_Rev_16s_P3C4R(const int16_t* const src[3], int
                                                 ImageSize size, int16_t alpha) {
   return inverse<Short<true>, int16_t, 4, false>(src, srcStep, dst, dstStep, size, alpha);
 }
-ZEL_PUBLIC Status zeliYCoCgToSBGR_Rev_32s16s_P3C3R(const int32_t* const src[3], int srcStep, int16_t* dst,
-                                                   int dstStep, ImageSize size) {
+ZEL_PUBLIC Status zeliYCoCgToSBGR_Rev_32s16s_P3C3R(const int32_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                                   ImageSize size) {
   return inverse<Long<true>, int16_t, 3, false>(src, srcStep, dst, dstStep, size);
 }
-ZEL_PUBLIC Status zeliYCoCgToSBGR_Rev_32s16s_P3C4R(const int32_t* const src[3], int srcStep, int16_t* dst,
-                                                   int dstStep, ImageSize size, int16_t alpha) {
+ZEL_PUBLIC Status zeliYCoCgToSBGR_Rev_32s16s_P3C4R(const int32_t* const src[3], int srcStep, int16_t* dst, int dstStep,
+                                                   ImageSize size, int16_t alpha) {
   return inverse<Long<true>, int16_t, 4, false>(src, srcStep, dst, dstStep, size, alpha);
 }

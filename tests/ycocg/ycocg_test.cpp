@@ -9,7 +9,9 @@
 #include <random>
 #include <vector>
 
+#include "frame/simd.h"
 #include "support/test_image.h"
+#include "ycocg/ycocg_kernels.h"
 #include "zelcc/zelcc.h"
 
 namespace {
@@ -161,33 +163,35 @@ TEST(YCoCgInverse, EveryMemberAtEveryWidth) {
 
 TEST(YCoCgBytePlanes, BothWaysAgainstTheDefinition) {
   std::mt19937 rng(5);
-  for (int width = 1; width <= 40; ++width) {
-    TestImage<uint8_t> src(3 * width, 2, 1, 3), p[3] = {{width, 2, 2, 1}, {width, 2, 2, 1}, {width, 2, 2, 1}};
-    src.fillRandom(uint32_t(width));
-    src.set(0, 0, 255), src.set(1, 0, 0), src.set(2, 0, 0);  // Co of 256 clamps to 255
-    uint8_t* const planes[3] = {p[0].data(), p[1].data(), p[2].data()};
-    ASSERT_EQ(zeliRGBToYCoCg_8u_C3P3R(src.data(), src.step(), planes, p[0].step(), ImageSize{width, 2}), StatusOk);
-    EXPECT_EQ(p[1].get(0, 0), 255);
-    for (int y = 0; y < 2; ++y)
-      for (int x = 0; x < width; ++x) {
-        const int64_t r = src.get(3 * x, y), g = src.get(3 * x + 1, y), b = src.get(3 * x + 2, y);
-        ASSERT_EQ(p[0].get(x, y), (r + 2 * g + b + 2) >> 2);
-        ASSERT_EQ(p[1].get(x, y), std::min<int64_t>(((r - b + 1) >> 1) + 128, 255));
-        ASSERT_EQ(p[2].get(x, y), clamp(((2 * g - b - r + 2) >> 2) + 128, 0, 255));
-      }
-    for (auto& plane : p) plane.fillRandom(rng());
-    TestImage<uint8_t> out(3 * width, 2, 3, 2);
-    const uint8_t* const in[3] = {p[0].data(), p[1].data(), p[2].data()};
-    ASSERT_EQ(zeliYCoCgToRGB_8u_P3C3R(in, p[0].step(), out.data(), out.step(), ImageSize{width, 2}), StatusOk);
-    for (int y = 0; y < 2; ++y)
-      for (int x = 0; x < width; ++x) {
-        const int64_t Y = p[0].get(x, y), co = p[1].get(x, y), cg = p[2].get(x, y);
-        ASSERT_EQ(out.get(3 * x, y), clamp(Y + co - cg, 0, 255));
-        ASSERT_EQ(out.get(3 * x + 1, y), clamp(Y + cg - 128, 0, 255));
-        ASSERT_EQ(out.get(3 * x + 2, y), clamp(Y - co - cg + 256, 0, 255));
-      }
-    ASSERT_TRUE(out.guardsIntact() && p[0].guardsIntact() && p[1].guardsIntact() && p[2].guardsIntact());
-  }
+  for (int width = 1; width <= 70; ++width)
+    for (const auto& l : kLayouts) {
+      TestImage<uint8_t> src(3 * width, 2, l[1], 3),
+          p[3] = {{width, 2, l[0], l[1]}, {width, 2, l[0], l[1]}, {width, 2, l[0], l[1]}};
+      src.fillRandom(uint32_t(width));
+      src.set(0, 0, 255), src.set(1, 0, 0), src.set(2, 0, 0);  // Co of 256 clamps to 255
+      uint8_t* const planes[3] = {p[0].data(), p[1].data(), p[2].data()};
+      ASSERT_EQ(zeliRGBToYCoCg_8u_C3P3R(src.data(), src.step(), planes, p[0].step(), ImageSize{width, 2}), StatusOk);
+      EXPECT_EQ(p[1].get(0, 0), 255);
+      for (int y = 0; y < 2; ++y)
+        for (int x = 0; x < width; ++x) {
+          const int64_t r = src.get(3 * x, y), g = src.get(3 * x + 1, y), b = src.get(3 * x + 2, y);
+          ASSERT_EQ(p[0].get(x, y), (r + 2 * g + b + 2) >> 2);
+          ASSERT_EQ(p[1].get(x, y), std::min<int64_t>(((r - b + 1) >> 1) + 128, 255));
+          ASSERT_EQ(p[2].get(x, y), clamp(((2 * g - b - r + 2) >> 2) + 128, 0, 255));
+        }
+      for (auto& plane : p) plane.fillRandom(rng());
+      TestImage<uint8_t> out(3 * width, 2, l[0] + 3, l[1]);
+      const uint8_t* const in[3] = {p[0].data(), p[1].data(), p[2].data()};
+      ASSERT_EQ(zeliYCoCgToRGB_8u_P3C3R(in, p[0].step(), out.data(), out.step(), ImageSize{width, 2}), StatusOk);
+      for (int y = 0; y < 2; ++y)
+        for (int x = 0; x < width; ++x) {
+          const int64_t Y = p[0].get(x, y), co = p[1].get(x, y), cg = p[2].get(x, y);
+          ASSERT_EQ(out.get(3 * x, y), clamp(Y + co - cg, 0, 255));
+          ASSERT_EQ(out.get(3 * x + 1, y), clamp(Y + cg - 128, 0, 255));
+          ASSERT_EQ(out.get(3 * x + 2, y), clamp(Y - co - cg + 256, 0, 255));
+        }
+      ASSERT_TRUE(out.guardsIntact() && p[0].guardsIntact() && p[1].guardsIntact() && p[2].guardsIntact());
+    }
 }
 
 TEST(YCoCgRoundTrip, EveryByteColourThroughLifting) {
@@ -243,6 +247,58 @@ TEST(YCoCgRoundTrip, ShortSamplesAtTheExtremes) {
   EXPECT_EQ(back, bgr) << "through 32-bit planes";
   EXPECT_EQ(p32[1][8], 65535) << "B = -32768, R = 32767: the true difference";
   EXPECT_EQ(p16[1][8], -1) << "the same difference wrapped";
+}
+
+// The 128-bit blocks alone and the 256-bit blocks give the same rows (the
+// members above run the wider ones where the processor has them).
+template <class Op, typename Src, int Ch>
+void forwardWidthsAgree() {
+  using Plane = typename Op::Plane;
+  std::mt19937 rng(3);
+  for (int width = 1; width <= 70; ++width) {
+    std::vector<Src> src(size_t(width) * Ch + 1);
+    for (auto& v : src) v = sample<Src>(rng);
+    std::vector<Plane> narrow(3 * width), wide(3 * width);
+    Plane* const n[3] = {&narrow[0], &narrow[width], &narrow[2 * width]};
+    Plane* const w[3] = {&wide[0], &wide[width], &wide[2 * width]};
+    zel::ycocg::forwardRow<Op, Src, Ch, false>(src.data() + 1, n, width, false);
+    zel::ycocg::forwardRow<Op, Src, Ch, false>(src.data() + 1, w, width, true);
+    ASSERT_EQ(narrow, wide) << "width " << width;
+  }
+}
+template <class Op, typename Dst, int Ch>
+void inverseWidthsAgree() {
+  using Plane = typename Op::Plane;
+  std::mt19937 rng(4);
+  for (int width = 1; width <= 70; ++width) {
+    std::vector<Plane> planes(3 * width + 1);
+    for (auto& v : planes) v = sample<Plane>(rng);
+    const Plane* const in[3] = {&planes[1], &planes[1 + width], &planes[1 + 2 * width]};
+    std::vector<Dst> narrow(size_t(width) * Ch), wide(narrow.size());
+    zel::ycocg::inverseRow<Op, Dst, Ch, false>(in, narrow.data(), width, Dst(0x5A), false);
+    zel::ycocg::inverseRow<Op, Dst, Ch, false>(in, wide.data(), width, Dst(0x5A), true);
+    ASSERT_EQ(narrow, wide) << "width " << width;
+  }
+}
+
+TEST(YCoCgBlocks, BothVectorWidthsAgree) {
+  if (!zel::hasAvx2()) GTEST_SKIP() << "no 256-bit blocks on this processor";
+  using namespace zel::ycocg;
+  forwardWidthsAgree<PlainBytes, uint8_t, 3>();
+  forwardWidthsAgree<LiftBytes, uint8_t, 4>();
+  forwardWidthsAgree<BytePlanes, uint8_t, 3>();
+  forwardWidthsAgree<Wide<false>, int16_t, 3>();
+  forwardWidthsAgree<Wide<true>, int16_t, 4>();
+  forwardWidthsAgree<PlainShort, int16_t, 3>();
+  forwardWidthsAgree<PlainShort, int16_t, 4>();
+  forwardWidthsAgree<LiftShort, int16_t, 4>();
+  inverseWidthsAgree<Short<false>, uint8_t, 3>();
+  inverseWidthsAgree<Short<true>, uint8_t, 4>();
+  inverseWidthsAgree<BytePlanesBack, uint8_t, 3>();
+  inverseWidthsAgree<Short<false>, int16_t, 3>();
+  inverseWidthsAgree<Short<true>, int16_t, 4>();
+  inverseWidthsAgree<Long<false>, int16_t, 4>();
+  inverseWidthsAgree<Long<true>, int16_t, 3>();
 }
 
 TEST(YCoCgValues, GreyHasNoChroma) {

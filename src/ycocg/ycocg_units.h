@@ -1,0 +1,353 @@
+// The vector operations of the YCoCg kernels at two widths:
+//   Sse  one 128-bit register, 8 pixels in 16-bit lanes;
+//   Avx  one 256-bit register, 16 pixels (lane 0 pixels 0..7, lane 1
+//        pixels 8..15), chosen at run time.
+// Lane arithmetic works within a 128-bit lane, so one kernel template gives
+// the same bits at both widths. Avx kernels are instantiated only inside a
+// ZEL_AVX2 function marked `flatten`, which pulls every operation in.
+#pragma once
+
+#include <immintrin.h>
+
+#include <cstdint>
+
+#include "frame/lane_shuffle.h"
+#include "frame/simd.h"
+
+// 256-bit values only pass between helpers the flattened AVX2 kernels
+// inline; none crosses a real call.
+#pragma GCC diagnostic ignored "-Wpsabi"
+
+namespace zel::ycocg {
+
+struct Sse {
+  using V = __m128i;
+  static constexpr int kPixels = 8;
+
+  static V load(const void* p) { return load128(p); }
+  static void store(void* p, V v) { store128(p, v); }
+  static void stream(void* p, V v) { storeStream128(p, v); }
+  // kPixels bytes to 16-bit lanes, and back clamped to 0..255.
+  static V loadBytes(const uint8_t* p) { return _mm_cvtepu8_epi16(load64(p)); }
+  static void storeBytes(uint8_t* p, V v) { store64(p, _mm_packus_epi16(v, v)); }
+  // Chunk i of the group of 8 pixels at p (each lane its own group).
+  template <class G>
+  static V chunk(const uint8_t* p, int i) {
+    return G::chunk(p, i);
+  }
+  template <class G, bool Stream>
+  static void put(uint8_t* p, int i, V v) {
+    G::template put<Stream>(p, i, v);
+  }
+  static V mask(const ByteMask& m) { return maskOf(m); }
+
+  static V set16(int v) { return _mm_set1_epi16(static_cast<int16_t>(v)); }
+  static V set32(int32_t v) { return _mm_set1_epi32(v); }
+  static V ones() { return _mm_set1_epi32(-1); }
+  static V add16(V a, V b) { return _mm_add_epi16(a, b); }
+  static V sub16(V a, V b) { return _mm_sub_epi16(a, b); }
+  static V addSatS16(V a, V b) { return _mm_adds_epi16(a, b); }
+  template <int N>
+  static V sra16(V a) {
+    return _mm_srai_epi16(a, N);
+  }
+  static V add32(V a, V b) { return _mm_add_epi32(a, b); }
+  static V sub32(V a, V b) { return _mm_sub_epi32(a, b); }
+  template <int N>
+  static V sra32(V a) {
+    return _mm_srai_epi32(a, N);
+  }
+  static V and_(V a, V b) { return _mm_and_si128(a, b); }
+  static V or_(V a, V b) { return _mm_or_si128(a, b); }
+  static V xor_(V a, V b) { return _mm_xor_si128(a, b); }
+  static V shuffle8(V a, V m) { return _mm_shuffle_epi8(a, m); }
+  template <int Imm>
+  static V blend16(V a, V b) {
+    return _mm_blend_epi16(a, b, Imm);
+  }
+  static V packU8(V a, V b) { return _mm_packus_epi16(a, b); }
+  static V set8(int v) { return _mm_set1_epi8(static_cast<int8_t>(v)); }
+  static V sub8(V a, V b) { return _mm_sub_epi8(a, b); }
+  static V addSatU8(V a, V b) { return _mm_adds_epu8(a, b); }
+  static V averageU8(V a, V b) { return _mm_avg_epu8(a, b); }
+  static V blend8(V a, V b, V m) { return _mm_blendv_epi8(a, b, m); }
+  static V unpackLo8(V a, V b) { return _mm_unpacklo_epi8(a, b); }
+  static V unpackHi8(V a, V b) { return _mm_unpackhi_epi8(a, b); }
+  static V unpackLo16(V a, V b) { return _mm_unpacklo_epi16(a, b); }
+  static V unpackHi16(V a, V b) { return _mm_unpackhi_epi16(a, b); }
+  static V unpackLo32(V a, V b) { return _mm_unpacklo_epi32(a, b); }
+  static V unpackHi32(V a, V b) { return _mm_unpackhi_epi32(a, b); }
+  static V unpackLo64(V a, V b) { return _mm_unpacklo_epi64(a, b); }
+  static V unpackHi64(V a, V b) { return _mm_unpackhi_epi64(a, b); }
+  // Signed 16-bit lanes of the first and second half of the pixels to
+  // 32-bit lanes; and the low 16 bits of 32-bit lanes back, in order.
+  static V widenLo(V v) { return _mm_cvtepi16_epi32(v); }
+  static V widenHi(V v) { return _mm_cvtepi16_epi32(_mm_srli_si128(v, 8)); }
+  static V narrowLow(V lo, V hi) {
+    const V low = _mm_set1_epi32(0xFFFF);
+    return _mm_packus_epi32(_mm_and_si128(lo, low), _mm_and_si128(hi, low));
+  }
+};
+
+struct Avx {
+  using V = __m256i;
+  static constexpr int kPixels = 16;
+
+  ZEL_AVX2 static V load(const void* p) { return load256(p); }
+  ZEL_AVX2 static void store(void* p, V v) { store256(p, v); }
+  // Rows are 16-byte aligned only: two 16-byte non-temporal stores.
+  ZEL_AVX2 static void stream(void* p, V v) {
+    auto* b = static_cast<uint8_t*>(p);
+    storeStream128(b, _mm256_castsi256_si128(v));
+    storeStream128(b + 16, _mm256_extracti128_si256(v, 1));
+  }
+  ZEL_AVX2 static V loadBytes(const uint8_t* p) { return _mm256_cvtepu8_epi16(load128(p)); }
+  ZEL_AVX2 static void storeBytes(uint8_t* p, V v) {
+    store128(p, _mm256_castsi256_si128(_mm256_permute4x64_epi64(_mm256_packus_epi16(v, v), 0x08)));
+  }
+  // Lane 0 takes chunk i of the group at p, lane 1 that of the next group.
+  template <class G>
+  ZEL_AVX2 static V chunk(const uint8_t* p, int i) {
+    return _mm256_inserti128_si256(_mm256_castsi128_si256(G::chunk(p, i)), G::chunk(p + G::kBytes, i), 1);
+  }
+  template <class G, bool Stream>
+  ZEL_AVX2 static void put(uint8_t* p, int i, V v) {
+    G::template put<Stream>(p, i, _mm256_castsi256_si128(v));
+    G::template put<Stream>(p + G::kBytes, i, _mm256_extracti128_si256(v, 1));
+  }
+  ZEL_AVX2 static V mask(const ByteMask& m) { return _mm256_broadcastsi128_si256(maskOf(m)); }
+
+  ZEL_AVX2 static V set16(int v) { return _mm256_set1_epi16(static_cast<int16_t>(v)); }
+  ZEL_AVX2 static V set32(int32_t v) { return _mm256_set1_epi32(v); }
+  ZEL_AVX2 static V ones() { return _mm256_set1_epi32(-1); }
+  ZEL_AVX2 static V add16(V a, V b) { return _mm256_add_epi16(a, b); }
+  ZEL_AVX2 static V sub16(V a, V b) { return _mm256_sub_epi16(a, b); }
+  ZEL_AVX2 static V addSatS16(V a, V b) { return _mm256_adds_epi16(a, b); }
+  template <int N>
+  ZEL_AVX2 static V sra16(V a) {
+    return _mm256_srai_epi16(a, N);
+  }
+  ZEL_AVX2 static V add32(V a, V b) { return _mm256_add_epi32(a, b); }
+  ZEL_AVX2 static V sub32(V a, V b) { return _mm256_sub_epi32(a, b); }
+  template <int N>
+  ZEL_AVX2 static V sra32(V a) {
+    return _mm256_srai_epi32(a, N);
+  }
+  ZEL_AVX2 static V and_(V a, V b) { return _mm256_and_si256(a, b); }
+  ZEL_AVX2 static V or_(V a, V b) { return _mm256_or_si256(a, b); }
+  ZEL_AVX2 static V xor_(V a, V b) { return _mm256_xor_si256(a, b); }
+  ZEL_AVX2 static V shuffle8(V a, V m) { return _mm256_shuffle_epi8(a, m); }
+  template <int Imm>
+  ZEL_AVX2 static V blend16(V a, V b) {
+    return _mm256_blend_epi16(a, b, Imm);
+  }
+  ZEL_AVX2 static V packU8(V a, V b) { return _mm256_packus_epi16(a, b); }
+  ZEL_AVX2 static V set8(int v) { return _mm256_set1_epi8(static_cast<int8_t>(v)); }
+  ZEL_AVX2 static V sub8(V a, V b) { return _mm256_sub_epi8(a, b); }
+  ZEL_AVX2 static V addSatU8(V a, V b) { return _mm256_adds_epu8(a, b); }
+  ZEL_AVX2 static V averageU8(V a, V b) { return _mm256_avg_epu8(a, b); }
+  ZEL_AVX2 static V blend8(V a, V b, V m) { return _mm256_blendv_epi8(a, b, m); }
+  ZEL_AVX2 static V unpackLo8(V a, V b) { return _mm256_unpacklo_epi8(a, b); }
+  ZEL_AVX2 static V unpackHi8(V a, V b) { return _mm256_unpackhi_epi8(a, b); }
+  ZEL_AVX2 static V unpackLo16(V a, V b) { return _mm256_unpacklo_epi16(a, b); }
+  ZEL_AVX2 static V unpackHi16(V a, V b) { return _mm256_unpackhi_epi16(a, b); }
+  ZEL_AVX2 static V unpackLo32(V a, V b) { return _mm256_unpacklo_epi32(a, b); }
+  ZEL_AVX2 static V unpackHi32(V a, V b) { return _mm256_unpackhi_epi32(a, b); }
+  ZEL_AVX2 static V unpackLo64(V a, V b) { return _mm256_unpacklo_epi64(a, b); }
+  ZEL_AVX2 static V unpackHi64(V a, V b) { return _mm256_unpackhi_epi64(a, b); }
+  ZEL_AVX2 static V widenLo(V v) { return _mm256_cvtepi16_epi32(_mm256_castsi256_si128(v)); }
+  ZEL_AVX2 static V widenHi(V v) { return _mm256_cvtepi16_epi32(_mm256_extracti128_si256(v, 1)); }
+  ZEL_AVX2 static V narrowLow(V lo, V hi) {
+    const V low = _mm256_set1_epi32(0xFFFF);
+    const V packed = _mm256_packus_epi32(_mm256_and_si256(lo, low), _mm256_and_si256(hi, low));
+    return _mm256_permute4x64_epi64(packed, 0xD8);
+  }
+};
+
+// ---- interleaved pixels to and from one vector of 16-bit lanes a channel ----
+
+// Three 16-bit elements a pixel: element e of the group lies in word e % 8
+// of chunk e / 8, and 3k + c runs over every word of a chunk once as k runs
+// over the pixels, so a channel is two word blends and one byte shuffle.
+constexpr int wordsFromChunk(int channel, int chunk) {
+  int bits = 0;
+  for (int k = 0; k < 8; ++k)
+    if ((3 * k + channel) / 8 == chunk) bits |= 1 << ((3 * k + channel) % 8);
+  return bits;
+}
+constexpr int wordsOfChannel(int chunk, int channel) {
+  int bits = 0;
+  for (int p = 0; p < 8; ++p)
+    if ((8 * chunk + p) % 3 == channel) bits |= 1 << p;
+  return bits;
+}
+// Word (3k + c) % 8 to word k (collect), or word k to word (3k + c) % 8.
+constexpr ByteMask wordOrder(int channel, bool collect) {
+  ByteMask m{};
+  for (int k = 0; k < 8; ++k) {
+    const int p = (3 * k + channel) % 8;
+    const int to = collect ? k : p, from = collect ? p : k;
+    m.b[2 * to] = int8_t(2 * from);
+    m.b[2 * to + 1] = int8_t(2 * from + 1);
+  }
+  return m;
+}
+template <int C, bool Collect>
+inline constexpr ByteMask kWordOrder = wordOrder(C, Collect);
+
+// Three channels of bytes in 16-bit lanes, packed as [c0 | c1] and [c2 | c2]:
+// the bytes of output chunk `chunk` that come from one of the two.
+constexpr ByteMask packedBytes(int chunk, bool fromFirst) {
+  ByteMask m{};
+  for (int i = 0; i < 16; ++i) {
+    const int at = 16 * chunk + i, k = at / 3, c = at % 3;
+    m.b[i] = -128;
+    if (k >= 8) continue;
+    if (fromFirst && c < 2) m.b[i] = int8_t(8 * c + k);
+    if (!fromFirst && c == 2) m.b[i] = int8_t(k);
+  }
+  return m;
+}
+template <int Chunk, bool First>
+inline constexpr ByteMask kPackedBytes = packedBytes(Chunk, First);
+
+// Three bytes a pixel, 16 pixels a 128-bit lane: byte 3k + c of the 48
+// lies at byte (3k + c) % 16 of chunk (3k + c) / 16, and (3k + c) % 16 runs
+// over every byte of a chunk once, so a channel is two byte blends and one
+// shuffle.
+constexpr ByteMask bytesFromChunk(int channel, int chunk) {
+  ByteMask m{};
+  for (int k = 0; k < 16; ++k) {
+    const int e = 3 * k + channel;
+    m.b[e % 16] = int8_t(e / 16 == chunk ? -1 : 0);
+  }
+  return m;
+}
+constexpr ByteMask byteOrder(int channel) {
+  ByteMask m{};
+  for (int k = 0; k < 16; ++k) m.b[k] = int8_t((3 * k + channel) % 16);
+  return m;
+}
+template <int C, int Chunk>
+inline constexpr ByteMask kBytesFromChunk = bytesFromChunk(C, Chunk);
+template <int C>
+inline constexpr ByteMask kByteOrder = byteOrder(C);
+
+// 2 * kPixels three-byte pixels to one vector of bytes a channel (lane 0
+// the first 16 pixels, lane 1 the next).
+template <class U>
+struct ByteTriples {
+  using V = typename U::V;
+  using G = PixelGroup<1, 3, 1>;  // 16 pixels, 48 bytes
+  template <int C>
+  ZEL_INLINE static V channel(const V* raw) {
+    const V v =
+        U::blend8(U::blend8(raw[0], raw[1], U::mask(kBytesFromChunk<C, 1>)), raw[2], U::mask(kBytesFromChunk<C, 2>));
+    return U::shuffle8(v, U::mask(kByteOrder<C>));
+  }
+  ZEL_INLINE static void load(const uint8_t* p, V* lanes) {
+    const V raw[3] = {U::template chunk<G>(p, 0), U::template chunk<G>(p, 1), U::template chunk<G>(p, 2)};
+    lanes[0] = channel<0>(raw);
+    lanes[1] = channel<1>(raw);
+    lanes[2] = channel<2>(raw);
+  }
+};
+
+// kPixels pixels of Ch elements of E bytes (1 unsigned, 2 signed 16-bit).
+template <class U, int E, int Ch>
+struct Interleaved {
+  using V = typename U::V;
+  using G = PixelGroup<E, Ch, 2>;
+
+  template <int C, int I>
+  ZEL_INLINE static V part(const V* raw) {
+    return U::shuffle8(raw[I], U::mask(kGather<E, Ch, C, 16 * I, 2>));
+  }
+  template <int C>
+  ZEL_INLINE static V gather(const V* raw) {
+    V v = part<C, 0>(raw);
+    if constexpr (G::kChunks > 1) v = U::or_(v, part<C, 1>(raw));
+    if constexpr (G::kChunks > 2) v = U::or_(v, part<C, 2>(raw));
+    if constexpr (G::kChunks > 3) v = U::or_(v, part<C, 3>(raw));
+    return v;
+  }
+  template <int C>
+  ZEL_INLINE static V collectWords(const V* raw) {
+    const V v =
+        U::template blend16<wordsFromChunk(C, 2)>(U::template blend16<wordsFromChunk(C, 1)>(raw[0], raw[1]), raw[2]);
+    return U::shuffle8(v, U::mask(kWordOrder<C, true>));
+  }
+
+  // Elements 0..2 of every pixel to three vectors (bytes zero-extended).
+  ZEL_INLINE static void load(const void* src, V* lanes) {
+    const uint8_t* p = static_cast<const uint8_t*>(src);
+    V raw[G::kChunks];
+    for (int i = 0; i < G::kChunks; ++i) raw[i] = U::template chunk<G>(p, i);
+    if constexpr (E == 2 && Ch == 3) {
+      lanes[0] = collectWords<0>(raw);
+      lanes[1] = collectWords<1>(raw);
+      lanes[2] = collectWords<2>(raw);
+    } else if constexpr (E == 2 && Ch == 4) {
+      // A 4x4 transpose of words, two pixels a chunk.
+      const V t0 = U::unpackLo16(raw[0], raw[1]), t1 = U::unpackHi16(raw[0], raw[1]);
+      const V t2 = U::unpackLo16(raw[2], raw[3]), t3 = U::unpackHi16(raw[2], raw[3]);
+      const V u0 = U::unpackLo16(t0, t1), u1 = U::unpackHi16(t0, t1);
+      const V u2 = U::unpackLo16(t2, t3), u3 = U::unpackHi16(t2, t3);
+      lanes[0] = U::unpackLo64(u0, u2);
+      lanes[1] = U::unpackHi64(u0, u2);
+      lanes[2] = U::unpackLo64(u1, u3);
+    } else {
+      lanes[0] = gather<0>(raw);
+      lanes[1] = gather<1>(raw);
+      lanes[2] = gather<2>(raw);
+    }
+  }
+
+  template <int C>
+  ZEL_INLINE static V spreadWords(const V* lanes) {
+    return U::shuffle8(lanes[C], U::mask(kWordOrder<C, false>));
+  }
+  template <int I>
+  ZEL_INLINE static V mergeWords(const V* spread) {
+    return U::template blend16<wordsOfChannel(I, 2)>(U::template blend16<wordsOfChannel(I, 1)>(spread[0], spread[1]),
+                                                     spread[2]);
+  }
+  template <int I>
+  ZEL_INLINE static V mergePacked(V first, V second) {
+    return U::or_(U::shuffle8(first, U::mask(kPackedBytes<I, true>)),
+                  U::shuffle8(second, U::mask(kPackedBytes<I, false>)));
+  }
+
+  // lanes[0..Ch) to elements 0..Ch-1 of every pixel; every byte of the
+  // pixels is written. Byte elements are clamped to 0..255 (SaturateU8),
+  // 16-bit elements keep their low 16 bits.
+  template <bool Stream>
+  ZEL_INLINE static void store(void* dst, const V* lanes) {
+    uint8_t* p = static_cast<uint8_t*>(dst);
+    if constexpr (E == 1 && Ch == 3) {
+      const V first = U::packU8(lanes[0], lanes[1]), second = U::packU8(lanes[2], lanes[2]);
+      U::template put<G, Stream>(p, 0, mergePacked<0>(first, second));
+      U::template put<G, Stream>(p, 1, mergePacked<1>(first, second));
+    } else if constexpr (E == 1 && Ch == 4) {
+      const V evens = U::packU8(lanes[0], lanes[2]), odds = U::packU8(lanes[1], lanes[3]);
+      const V x = U::unpackLo8(evens, odds), y = U::unpackHi8(evens, odds);
+      U::template put<G, Stream>(p, 0, U::unpackLo16(x, y));
+      U::template put<G, Stream>(p, 1, U::unpackHi16(x, y));
+    } else if constexpr (E == 2 && Ch == 3) {
+      const V spread[3] = {spreadWords<0>(lanes), spreadWords<1>(lanes), spreadWords<2>(lanes)};
+      U::template put<G, Stream>(p, 0, mergeWords<0>(spread));
+      U::template put<G, Stream>(p, 1, mergeWords<1>(spread));
+      U::template put<G, Stream>(p, 2, mergeWords<2>(spread));
+    } else {
+      static_assert(E == 2 && Ch == 4, "layout");
+      const V p0 = U::unpackLo16(lanes[0], lanes[1]), p1 = U::unpackHi16(lanes[0], lanes[1]);
+      const V q0 = U::unpackLo16(lanes[2], lanes[3]), q1 = U::unpackHi16(lanes[2], lanes[3]);
+      U::template put<G, Stream>(p, 0, U::unpackLo32(p0, q0));
+      U::template put<G, Stream>(p, 1, U::unpackHi32(p0, q0));
+      U::template put<G, Stream>(p, 2, U::unpackLo32(p1, q1));
+      U::template put<G, Stream>(p, 3, U::unpackHi32(p1, q1));
+    }
+  }
+};
+
+}  // namespace zel::ycocg
