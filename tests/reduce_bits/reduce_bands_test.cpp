@@ -1,6 +1,7 @@
-// The banded error diffusion (rows side by side in vector lanes) against the
-// row-by-row walk of the same formulas, for every member and layout, with and
-// without noise, over widths and heights around the band and skew sizes.
+// The banded error diffusions (rows side by side in vector lanes) against
+// the row-by-row walk of the same formulas, for every kind, member and
+// layout, with and without noise, over widths and heights around the band
+// and skew sizes.
 #include <gtest/gtest.h>
 
 #include <cmath>
@@ -27,8 +28,9 @@ void fillSource(TestImage<Src>& img, int rowSamples, int rows, uint32_t seed) {
   }
 }
 
+// kind 1 Floyd-Steinberg, 2 and 3 the three-row kinds.
 template <typename M, LayoutCode L, bool Noisy>
-void bandsAgree(int width, int height, int levels, uint32_t seed) {
+void bandsAgree(int kind, int width, int height, int levels, uint32_t seed) {
   using Src = typename M::Source;
   using Dst = typename M::Dest;
   const int samples = width * LayoutOf<L>::stride;
@@ -39,12 +41,18 @@ void bandsAgree(int width, int height, int levels, uint32_t seed) {
   const QuantValues qv = quantValues<Src>(levels);
   NoiseTables tables;
   if constexpr (Noisy) ASSERT_EQ(diffusionNoise(tables, 35, qv.q), StatusOk);
-  std::vector<float> block(size_t(2 * width + 4));
+  std::vector<float> block(size_t(3 * width + 12));
+  const ThreeRowWeights k = threeRowWeights(uint32_t(kind));
   auto run = [&](TestImage<Dst>& dst, int how) {
     std::fill(block.begin(), block.end(), 0.0f);
     const Image<Src, Dst> im{src.data(), src.step(), dst.data(), dst.step(), width, height};
-    if (how == 0) floydSteinbergRows<M, L, Noisy>(im, block.data(), qv, tables);
-    else floydSteinbergBands<M, L, Noisy>(im, block.data(), qv, tables, how == 2);
+    if (kind == 1) {
+      if (how == 0) floydSteinbergRows<M, L, Noisy>(im, block.data(), qv, tables);
+      else floydSteinbergBands<M, L, Noisy>(im, block.data(), qv, tables, how == 2);
+    } else {
+      if (how == 0) threeRowRows<M, L, Noisy>(im, block.data(), qv, k, tables);
+      else threeRowBands<M, L, Noisy>(im, block.data(), qv, k, tables, how == 2);
+    }
   };
   run(rows, 0);
   run(sse, 1);
@@ -59,7 +67,7 @@ void bandsAgree(int width, int height, int levels, uint32_t seed) {
 }
 
 template <typename Src, typename Dst, LayoutCode L>
-void layoutAgrees() {
+void layoutAgrees(int kind) {
   using M = Member<Src, Dst>;
   const int levels[] = {2, 3, 7, 16, 255, M::maxLevels};
   uint32_t seed = 1;
@@ -67,21 +75,23 @@ void layoutAgrees() {
     for (int height : {1, 2, 3, 4, 5, 8, 9, 11, 17}) {
       SCOPED_TRACE("width " + std::to_string(width) + " height " + std::to_string(height));
       ++seed;
-      bandsAgree<M, L, false>(width, height, levels[seed % 6], seed);
-      bandsAgree<M, L, true>(width, height, levels[(seed + 3) % 6], seed);
+      bandsAgree<M, L, false>(kind, width, height, levels[seed % 6], seed);
+      bandsAgree<M, L, true>(kind, width, height, levels[(seed + 3) % 6], seed);
     }
 }
 
 template <typename Src, typename Dst>
 void memberAgrees(const char* name) {
-  SCOPED_TRACE(name);
-  layoutAgrees<Src, Dst, LayoutCode::C1>();
-  layoutAgrees<Src, Dst, LayoutCode::C3>();
-  layoutAgrees<Src, Dst, LayoutCode::C4>();
-  layoutAgrees<Src, Dst, LayoutCode::AC4>();
+  for (int kind = 1; kind <= 3; ++kind) {
+    SCOPED_TRACE(std::string(name) + " kind " + std::to_string(kind));
+    layoutAgrees<Src, Dst, LayoutCode::C1>(kind);
+    layoutAgrees<Src, Dst, LayoutCode::C3>(kind);
+    layoutAgrees<Src, Dst, LayoutCode::C4>(kind);
+    layoutAgrees<Src, Dst, LayoutCode::AC4>(kind);
+  }
 }
 
-TEST(ReduceBitsBands, FloydSteinbergMatchesTheRowWalk) {
+TEST(ReduceBitsBands, DiffusionMatchesTheRowWalk) {
   memberAgrees<uint8_t, uint8_t>("8u");
   memberAgrees<uint16_t, uint16_t>("16u");
   memberAgrees<int16_t, int16_t>("16s");
