@@ -14,6 +14,8 @@
 // call between a function built for AVX2 and one that is not (the two pass
 // such values differently). Without it an unoptimised build breaks.
 #define ZEL_INLINE __attribute__((always_inline)) inline
+// The same for a lambda, written after its parameter list.
+#define ZEL_LAMBDA_INLINE __attribute__((always_inline))
 
 namespace zel {
 

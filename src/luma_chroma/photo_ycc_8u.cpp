@@ -15,7 +15,7 @@ struct ForwardLanes {
   static constexpr bool kVector = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(rgbToYccLanes(s.c0, s.c1, s.c2)); }
   template <class U>
-  Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     return rgbToYccLanes<U>(s);
   }
 };
@@ -27,7 +27,7 @@ struct InverseLanes {
   static constexpr bool kVector = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(yccToRgbLanes(s.c0, s.c1, s.c2)); }
   template <class U>
-  Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     return yccToRgbLanes<U>(s);
   }
 };

@@ -29,7 +29,7 @@ inline Pixel8 rgbToYccLanes(int R, int G, int B) {
 }
 
 template <class U>
-inline Trio<U> rgbToYccLanes(const Trio<U>& rgb) {
+ZEL_INLINE Trio<U> rgbToYccLanes(const Trio<U>& rgb) {
   using V = typename U::V;
   const V r = U::template sll16<8>(rgb.c0), g = U::template sll16<8>(rgb.c1), b = U::template sll16<8>(rgb.c2);
   const V l = U::add16(U::add16(U::mulHighU16(r, U::set16(4898)), U::mulHighU16(g, U::set16(9617))),
@@ -59,7 +59,7 @@ inline Pixel8 yccToRgbLanes(int Y, int C1, int C2) {
 }
 
 template <class U>
-inline Trio<U> yccToRgbLanes(const Trio<U>& ycc) {
+ZEL_INLINE Trio<U> yccToRgbLanes(const Trio<U>& ycc) {
   using V = typename U::V;
   const V y = U::mulHighU16(U::template sll16<8>(ycc.c0), U::set16(5563));
   const V c1 = U::mulHighS16(U::template sll16<7>(U::sub16(ycc.c1, U::set16(156))), U::set16(18168));

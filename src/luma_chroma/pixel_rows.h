@@ -69,7 +69,7 @@ struct PackedIn {
     c = q[2];
   }
   template <class U>
-  Trio<U> block(int x) const {
+  ZEL_INLINE Trio<U> block(int x) const {
     const GatherPatterns<Stride>& g = kGather<Stride>;
     const uint8_t* q = p + Stride * x;
     typename U::V chunk[Stride];
@@ -94,7 +94,7 @@ struct PlanesIn {
     c = p2[x];
   }
   template <class U>
-  Trio<U> block(int x) const {
+  ZEL_INLINE Trio<U> block(int x) const {
     return {U::loadUnits(p0 + x, 16), U::loadUnits(p1 + x, 16), U::loadUnits(p2 + x, 16)};
   }
 };
@@ -112,7 +112,7 @@ struct PackedOut3 {
     q[Reverse ? 0 : 2] = static_cast<uint8_t>(c);
   }
   template <class U>
-  void block(int x, const Trio<U>& v) const {
+  ZEL_INLINE void block(int x, const Trio<U>& v) const {
     const typename U::V ch[3] = {Reverse ? v.c2 : v.c0, v.c1, Reverse ? v.c0 : v.c2};
     uint8_t* q = p + 3 * x;
     for (int k = 0; k < 3; ++k) {
@@ -137,7 +137,7 @@ struct PackedOutAlpha {
     q[3] = alpha;
   }
   template <class U>
-  void block(int x, const Trio<U>& v) const {
+  ZEL_INLINE void block(int x, const Trio<U>& v) const {
     const typename U::V first = Reverse ? v.c2 : v.c0, third = Reverse ? v.c0 : v.c2;
     const typename U::V a = U::set8(alpha);
     const typename U::V lo01 = U::unpackLo8(first, v.c1), hi01 = U::unpackHi8(first, v.c1);
@@ -162,7 +162,7 @@ struct PackedOutKeep {
     q[2] = static_cast<uint8_t>(c);
   }
   template <class U>
-  void block(int x, const Trio<U>& v) const {
+  ZEL_INLINE void block(int x, const Trio<U>& v) const {
     const typename U::V z = U::zero();
     const typename U::V lo01 = U::unpackLo8(v.c0, v.c1), hi01 = U::unpackHi8(v.c0, v.c1);
     const typename U::V lo23 = U::unpackLo8(v.c2, z), hi23 = U::unpackHi8(v.c2, z);
@@ -186,7 +186,7 @@ struct PlanesOut {
     p2[x] = static_cast<uint8_t>(c);
   }
   template <class U>
-  void block(int x, const Trio<U>& v) const {
+  ZEL_INLINE void block(int x, const Trio<U>& v) const {
     U::storeUnits(p0 + x, 16, v.c0);
     U::storeUnits(p1 + x, 16, v.c1);
     U::storeUnits(p2 + x, 16, v.c2);
@@ -200,7 +200,7 @@ struct PlanesOut {
 // lanes to Trio of 16-bit lanes before SaturateU8).
 
 template <class U, class In, class Out, class Form>
-inline int formBlocks(const In& in, const Out& out, int x, int end, const Form& form) {
+ZEL_INLINE int formBlocks(const In& in, const Out& out, int x, int end, const Form& form) {
   for (; x + U::kPixels <= end; x += U::kPixels) {
     const Trio<U> s = in.template block<U>(x);
     const Wide16<U> a = widen<U>(s.c0), b = widen<U>(s.c1), c = widen<U>(s.c2);

@@ -187,7 +187,7 @@ inline Chroma2 chromaSigned422(const BlockSums& s) {
 // ---- vector pieces ----
 
 template <class U>
-inline typename U::V lumaLanesV(const MatrixSet& s, typename U::V r, typename U::V g, typename U::V b) {
+ZEL_INLINE typename U::V lumaLanesV(const MatrixSet& s, typename U::V r, typename U::V g, typename U::V b) {
   using V = typename U::V;
   const V sum = U::add16(U::add16(U::add16(U::mulHighU16(U::template sll16<8>(r), U::set16(s.lumaR)),
                                            U::mulHighU16(U::template sll16<8>(g), U::set16(s.lumaG))),
@@ -197,12 +197,12 @@ inline typename U::V lumaLanesV(const MatrixSet& s, typename U::V r, typename U:
 }
 
 template <const MatrixSet& S, int Pixels, class U>
-inline void chromaLanesV(typename U::V sr, typename U::V sg, typename U::V sb, typename U::V& c1, typename U::V& c2) {
+ZEL_INLINE void chromaLanesV(typename U::V sr, typename U::V sg, typename U::V sb, typename U::V& c1, typename U::V& c2) {
   using V = typename U::V;
   using Shape = ChromaLaneShape<S, Pixels>;
   const V xr = U::template sll16<Shape::kInShift>(sr), xg = U::template sll16<Shape::kInShift>(sg),
           xb = U::template sll16<Shape::kInShift>(sb);
-  auto g = [](V x, int c) { return U::mulHighU16(x, U::set16(c)); };
+  auto g = [](V x, int c) ZEL_LAMBDA_INLINE { return U::mulHighU16(x, U::set16(c)); };
   const V add = U::set16(Shape::kAddend);
   c1 = U::template sra16<Shape::kOutShift>(U::add16(U::sub16(g(xb, S.cbB), U::add16(g(xr, S.cbR), g(xg, S.cbG))), add));
   c2 = U::template sra16<Shape::kOutShift>(U::add16(U::sub16(g(xr, S.crR), U::add16(g(xg, S.crG), g(xb, S.crB))), add));
@@ -219,11 +219,11 @@ struct LanesBody {
   uint8_t luma(const Rgb& p, int) const { return lumaLanes<S>(p); }
   Chroma2 chroma(const Rgb* px, int n) const { return chromaLanes<S, Pixels>(sumsOf(px, n)); }
   template <class U>
-  typename U::V luma(typename U::V r, typename U::V g, typename U::V b, typename U::V&) const {
+  ZEL_INLINE typename U::V luma(typename U::V r, typename U::V g, typename U::V b, typename U::V&) const {
     return lumaLanesV<U>(S, r, g, b);
   }
   template <class U>
-  void chroma(typename U::V sr, typename U::V sg, typename U::V sb, typename U::V, typename U::V& c1,
+  ZEL_INLINE void chroma(typename U::V sr, typename U::V sg, typename U::V sb, typename U::V, typename U::V& c1,
               typename U::V& c2) const {
     chromaLanesV<S, Pixels, U>(sr, sg, sb, c1, c2);
   }
@@ -239,18 +239,18 @@ struct RoundedBody {
   uint8_t luma(const Rgb& p, int) const { return After ? lumaRounded411(p) : lc::ycbcrRounded(p.r, p.g, p.b).y; }
   Chroma2 chroma(const Rgb* px, int n) const { return chromaRounded<After>(sumsOf(px, n)); }
   template <class U>
-  typename U::V luma(typename U::V r, typename U::V g, typename U::V b, typename U::V&) const {
+  ZEL_INLINE typename U::V luma(typename U::V r, typename U::V g, typename U::V b, typename U::V&) const {
     using V = typename U::V;
     if constexpr (!After) return lc::ycbcrRounded<U>(r, g, b).y;
-    auto m = [](V s, int c) { return U::mulHighRound(U::template sll16<7>(s), U::set16(c)); };
+    auto m = [](V s, int c) ZEL_LAMBDA_INLINE { return U::mulHighRound(U::template sll16<7>(s), U::set16(c)); };
     const V sum = U::add16(U::add16(m(r, 4211), m(g, 8258)), m(b, 1606));
     return U::add16(U::template sra16<6>(sum), U::set16(16));
   }
   template <class U>
-  void chroma(typename U::V sr, typename U::V sg, typename U::V sb, typename U::V, typename U::V& c1,
+  ZEL_INLINE void chroma(typename U::V sr, typename U::V sg, typename U::V sb, typename U::V, typename U::V& c1,
               typename U::V& c2) const {
     using V = typename U::V;
-    auto m = [](V s, int c) { return U::mulHighRound(U::template sll16<5>(s), U::set16(c)); };
+    auto m = [](V s, int c) ZEL_LAMBDA_INLINE { return U::mulHighRound(U::template sll16<5>(s), U::set16(c)); };
     const V cb = U::sub16(U::sub16(m(sb, 7193), m(sg, 4768)), m(sr, 2425));
     const V cr = U::sub16(U::sub16(m(sr, 7193), m(sg, 6029)), m(sb, 1163));
     if constexpr (After) {
@@ -270,13 +270,13 @@ struct ExactPairBody {
   uint8_t luma(const Rgb& p, int) const { return lumaExactLow(p); }
   Chroma2 chroma(const Rgb* px, int n) const { return chromaExact422(sumsOf(px, n)); }
   template <class U>
-  typename U::V luma(typename U::V r, typename U::V g, typename U::V b, typename U::V&) const {
-    auto h = [](typename U::V s, int c) { return U::mulHighU16(U::template sll16<8>(s), U::set16(c)); };
+  ZEL_INLINE typename U::V luma(typename U::V r, typename U::V g, typename U::V b, typename U::V&) const {
+    auto h = [](typename U::V s, int c) ZEL_LAMBDA_INLINE { return U::mulHighU16(U::template sll16<8>(s), U::set16(c)); };
     const typename U::V sum = U::add16(U::add16(h(r, 16843), h(g, 33030)), h(b, 6423));
     return U::add16(U::template srl16<8>(sum), U::set16(16));
   }
   template <class U>
-  void chroma(typename U::V sr, typename U::V sg, typename U::V sb, typename U::V, typename U::V& c1,
+  ZEL_INLINE void chroma(typename U::V sr, typename U::V sg, typename U::V sb, typename U::V, typename U::V& c1,
               typename U::V& c2) const {
     c1 = dot3Shift<U, 17>(sb, sg, sr, 28770, -19071, -9699, 16842752);
     c2 = dot3Shift<U, 17>(sr, sg, sb, 28770, -24117, -4653, 16842752);
@@ -295,18 +295,18 @@ struct CbYCrBody {
     return chromaSigned422(sumsOf(px, n));
   }
   template <class U>
-  typename U::V luma(typename U::V r, typename U::V g, typename U::V b, typename U::V&) const {
+  ZEL_INLINE typename U::V luma(typename U::V r, typename U::V g, typename U::V b, typename U::V&) const {
     return lumaLanesV<U>(S, r, g, b);
   }
   template <class U>
-  void chroma(typename U::V sr, typename U::V sg, typename U::V sb, typename U::V, typename U::V& c1,
+  ZEL_INLINE void chroma(typename U::V sr, typename U::V sg, typename U::V sb, typename U::V, typename U::V& c1,
               typename U::V& c2) const {
     using V = typename U::V;
     if constexpr (S.narrow) {
       chromaLanesV<S, 2, U>(sr, sg, sb, c1, c2);
     } else {
       const V xr = U::template sll16<6>(sr), xg = U::template sll16<6>(sg), xb = U::template sll16<6>(sb);
-      auto l = [](V x, int c) { return U::mulHighS16(x, U::set16(c)); };
+      auto l = [](V x, int c) ZEL_LAMBDA_INLINE { return U::mulHighS16(x, U::set16(c)); };
       const V add = U::set16(16448);
       c1 = U::template sra16<7>(U::add16(U::add16(U::add16(l(xb, 28770), l(xg, -19071)), l(xr, -9699)), add));
       c2 = U::template sra16<7>(U::add16(U::add16(U::add16(l(xr, 28770), l(xg, -24117)), l(xb, -4653)), add));

@@ -33,7 +33,7 @@ struct RgbSource {
     return Bgr ? Rgb{c, b, a} : Rgb{a, b, c};
   }
   template <class U>
-  Trio<U> block(int x) const {
+  ZEL_INLINE Trio<U> block(int x) const {
     const Trio<U> t = in.template block<U>(x);
     return Bgr ? Trio<U>{t.c2, t.c1, t.c0} : t;
   }
@@ -74,7 +74,7 @@ struct PlanesOutSub {
     }
   }
   template <class U>
-  void block(int x, typename U::V yv, typename U::V cc) const {
+  ZEL_INLINE void block(int x, typename U::V yv, typename U::V cc) const {
     U::storeUnits(y + x, 16, yv);
     if constexpr (Ratio == 2)
       More<U>::storeHalves(c1 + x / 2, c2 + x / 2, 8, cc);
@@ -99,7 +99,7 @@ struct PairsOut {
       q[kSlots.cr] = o.c2;
   }
   template <class U>
-  void block(int x, typename U::V yv, typename U::V cc) const {
+  ZEL_INLINE void block(int x, typename U::V yv, typename U::V cc) const {
     const typename U::V zipped = U::shuffle8(cc, U::shuffleOf(O == PairOrder::YCrCb ? kZipHalvesSwapped : kZipHalves));
     uint8_t* q = p + 2 * x;
     if constexpr (O == PairOrder::CbYCr) {
@@ -127,7 +127,7 @@ struct Planes420Out {
     c2[x / 2] = c.c2;
   }
   template <class U>
-  void block(int x, typename U::V top, typename U::V bottom, typename U::V cc) const {
+  ZEL_INLINE void block(int x, typename U::V top, typename U::V bottom, typename U::V cc) const {
     U::storeUnits(y0 + x, 16, top);
     U::storeUnits(y1 + x, 16, bottom);
     More<U>::storeHalves(c1 + x / 2, c2 + x / 2, 8, cc);
@@ -148,7 +148,7 @@ struct TwoPlane420Out {
     cbcr[x + 1] = c.c2;
   }
   template <class U>
-  void block(int x, typename U::V top, typename U::V bottom, typename U::V cc) const {
+  ZEL_INLINE void block(int x, typename U::V top, typename U::V bottom, typename U::V cc) const {
     U::storeUnits(y0 + x, 16, top);
     U::storeUnits(y1 + x, 16, bottom);
     U::storeUnits(cbcr + x, 16, U::shuffle8(cc, U::shuffleOf(kZipHalves)));
@@ -159,7 +159,7 @@ struct TwoPlane420Out {
 
 // One row, `Ratio` pixels (2 or 4) to a chroma sample.
 template <class U, int Ratio, class Body, class Src, class Out>
-inline int rowBlocks(const Src& in, const Out& out, int x, int end, const Body& body) {
+ZEL_INLINE int rowBlocks(const Src& in, const Out& out, int x, int end, const Body& body) {
   using V = typename U::V;
   using M = More<U>;
   for (; x + U::kPixels <= end; x += U::kPixels) {
@@ -190,7 +190,7 @@ inline int rowBlocks(const Src& in, const Out& out, int x, int end, const Body& 
 
 // A row pair of 4:2:0: chroma from the sums of 2 by 2 pixels.
 template <class U, class Body, class Src, class Out>
-inline int pairBlocks(const Src& top, const Src& bottom, const Out& out, int x, int end, const Body& body) {
+ZEL_INLINE int pairBlocks(const Src& top, const Src& bottom, const Out& out, int x, int end, const Body& body) {
   using V = typename U::V;
   using M = More<U>;
   for (; x + U::kPixels <= end; x += U::kPixels) {

@@ -69,7 +69,7 @@ struct More<Avx> {
 // 16-bit constants; the results return as 16-bit lanes (they fit, so the
 // signed pack never clamps them).
 template <class U, int Shift>
-inline typename U::V dot3Shift(typename U::V a, typename U::V b, typename U::V c, int ca, int cb, int cc, int addend) {
+ZEL_INLINE typename U::V dot3Shift(typename U::V a, typename U::V b, typename U::V c, int ca, int cb, int cc, int addend) {
   using V = typename U::V;
   const V kab = More<U>::pair16(ca, cb), kc = More<U>::pair16(cc, 0), add = U::set32(addend), z = U::zero();
   const V lo = U::add32(U::add32(U::madd16(U::unpackLo16(a, b), kab), U::madd16(U::unpackLo16(c, z), kc)), add);

@@ -36,13 +36,13 @@ inline int yuvT14(const Rgb& p) { return 4899 * p.r + 9617 * p.g + 1868 * p.b; }
 inline int yuvT15(const Rgb& p) { return 9798 * p.r + 19235 * p.g + 3736 * p.b; }
 
 template <class U>
-inline typename U::V yuvPLanes(typename U::V r, typename U::V g, typename U::V b) {
-  auto l = [](typename U::V s, int c) { return U::mulHighS16(U::template sll16<2>(s), U::set16(c)); };
+ZEL_INLINE typename U::V yuvPLanes(typename U::V r, typename U::V g, typename U::V b) {
+  auto l = [](typename U::V s, int c) ZEL_LAMBDA_INLINE { return U::mulHighS16(U::template sll16<2>(s), U::set16(c)); };
   return U::add16(U::add16(l(r, 9798), l(g, 19235)), l(b, 3736));
 }
 template <class U>
-inline typename U::V yuvQLanes(typename U::V r, typename U::V g, typename U::V b) {
-  auto m = [](typename U::V s, int c) { return U::mulHighRound(U::template sll16<7>(s), U::set16(c)); };
+ZEL_INLINE typename U::V yuvQLanes(typename U::V r, typename U::V g, typename U::V b) {
+  auto m = [](typename U::V s, int c) ZEL_LAMBDA_INLINE { return U::mulHighRound(U::template sll16<7>(s), U::set16(c)); };
   return U::add16(U::add16(m(r, 4899), m(g, 9617)), m(b, 1868));
 }
 
@@ -82,15 +82,15 @@ struct DifferenceBody {
     return {scaled(s.b << 2, s.t, 16121), scaled(s.r << 2, s.t, 28737)};
   }
   template <class U>
-  typename U::V luma(typename U::V r, typename U::V g, typename U::V b, typename U::V& term) const {
+  ZEL_INLINE typename U::V luma(typename U::V r, typename U::V g, typename U::V b, typename U::V& term) const {
     term = yuvPLanes<U>(r, g, b);
     return U::template sra16<1>(term);
   }
   template <class U>
-  void chroma(typename U::V sr, typename U::V, typename U::V sb, typename U::V st, typename U::V& c1,
+  ZEL_INLINE void chroma(typename U::V sr, typename U::V, typename U::V sb, typename U::V st, typename U::V& c1,
               typename U::V& c2) const {
     using V = typename U::V;
-    auto scaledV = [&](V sum, int k) {
+    auto scaledV = [&](V sum, int k) ZEL_LAMBDA_INLINE {
       const V four = U::template sll16<2>(sum);
       if constexpr (Pixels == 4)
         return U::add16(U::mulHighS16(U::sub16(U::template sra16<3>(four), U::template sra16<2>(st)), U::set16(k)),
@@ -122,15 +122,15 @@ struct RoundedDifferenceBody {
     return {scaled(s.b, s.t, 8061), scaled(s.r, s.t, 14369)};
   }
   template <class U>
-  typename U::V luma(typename U::V r, typename U::V g, typename U::V b, typename U::V& term) const {
+  ZEL_INLINE typename U::V luma(typename U::V r, typename U::V g, typename U::V b, typename U::V& term) const {
     term = yuvQLanes<U>(r, g, b);
     return U::template sra16<6>(term);
   }
   template <class U>
-  void chroma(typename U::V sr, typename U::V, typename U::V sb, typename U::V st, typename U::V& c1,
+  ZEL_INLINE void chroma(typename U::V sr, typename U::V, typename U::V sb, typename U::V st, typename U::V& c1,
               typename U::V& c2) const {
     using V = typename U::V;
-    auto scaledV = [&](V sum, int k) {
+    auto scaledV = [&](V sum, int k) ZEL_LAMBDA_INLINE {
       const V x = Pixels == 4 ? U::sub16(U::template sll16<5>(sum), U::template srl16<1>(st))
                               : U::sub16(U::template sll16<6>(sum), st);
       return U::add16(U::template sra16<6>(U::mulHighRound(x, U::set16(k))), U::set16(128));

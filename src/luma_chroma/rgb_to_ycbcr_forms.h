@@ -84,14 +84,14 @@ struct LaneYCbCr {
 };
 
 template <class U>
-inline LaneYCbCr<U> ycbcrHighWord(typename U::V r, typename U::V g, typename U::V b) {
+ZEL_INLINE LaneYCbCr<U> ycbcrHighWord(typename U::V r, typename U::V g, typename U::V b) {
   using V = typename U::V;
   const V r8 = U::template sll16<8>(r), g8 = U::template sll16<8>(g), b8 = U::template sll16<8>(b);
   const V r7 = U::template sll16<7>(r), g7 = U::template sll16<7>(g), b7 = U::template sll16<7>(b);
   const V ys = U::addSatU16(U::addSatU16(U::addSatU16(U::mulHighU16(r8, U::set16(kYR)), U::mulHighU16(g8, U::set16(kYG))),
                                          U::mulHighU16(b8, U::set16(kYB))),
                             U::set16(128));
-  auto chroma = [&](int cr, int cg, int cb) {
+  auto chroma = [&](int cr, int cg, int cb) ZEL_LAMBDA_INLINE {
     const V s = U::addSatS16(U::addSatS16(U::addSatS16(U::mulHighS16(r7, U::set16(cr)), U::mulHighS16(g7, U::set16(cg))),
                                           U::mulHighS16(b7, U::set16(cb))),
                              U::set16(64));
@@ -101,10 +101,10 @@ inline LaneYCbCr<U> ycbcrHighWord(typename U::V r, typename U::V g, typename U::
 }
 
 template <class U>
-inline LaneYCbCr<U> ycbcrRounded(typename U::V r, typename U::V g, typename U::V b) {
+ZEL_INLINE LaneYCbCr<U> ycbcrRounded(typename U::V r, typename U::V g, typename U::V b) {
   using V = typename U::V;
   const V r7 = U::template sll16<7>(r), g7 = U::template sll16<7>(g), b7 = U::template sll16<7>(b);
-  auto m = [&](V s, int c) { return U::mulHighRound(s, U::set16(c)); };
+  auto m = [&](V s, int c) ZEL_LAMBDA_INLINE { return U::mulHighRound(s, U::set16(c)); };
   const V y = U::add16(U::add16(U::add16(m(r7, 4211), m(g7, 8258)), m(b7, 1606)), U::set16(1026));
   const V cb = U::add16(U::sub16(U::sub16(m(b7, 7193), m(g7, 4768)), m(r7, 2425)), U::set16(8194));
   const V cr = U::add16(U::sub16(U::sub16(m(r7, 7193), m(g7, 6029)), m(b7, 1163)), U::set16(8194));
@@ -125,7 +125,7 @@ struct HighWordFwd {
   static constexpr bool kVector = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(ycbcrHighWord(s.c0, s.c1, s.c2)); }
   template <class U>
-  Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     const LaneYCbCr<U> r = ycbcrHighWord<U>(s.c0, s.c1, s.c2);
     return {r.y, r.cb, r.cr};
   }
@@ -135,7 +135,7 @@ struct RoundedFwd {
   static constexpr bool kVector = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(ycbcrRounded(s.c0, s.c1, s.c2)); }
   template <class U>
-  Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     const LaneYCbCr<U> r = ycbcrRounded<U>(s.c0, s.c1, s.c2);
     return {r.y, r.cb, r.cr};
   }

@@ -100,7 +100,7 @@ inline Rgb8 rgbOf(const Pixel8& p) { return {p.c0, p.c1, p.c2}; }
 // ---- vector helpers ----
 
 template <class U>
-inline typename U::V termL(typename U::V x, int c) {
+ZEL_INLINE typename U::V termL(typename U::V x, int c) {
   return U::mulHighS16(U::template sll16<7>(x), U::set16(c));
 }
 
@@ -116,14 +116,14 @@ struct LanesForm {
   LaneSet set;
   Rgb8 pixel(int Y, int U, int V) const { return laneAdded(set, Y, U, V, 8); }
   template <class U>
-  Trio<U> chroma(typename U::V u, typename U::V v) const {
+  ZEL_INLINE Trio<U> chroma(typename U::V u, typename U::V v) const {
     const typename U::V ul = chromaLanes<U>(u), vl = chromaLanes<U>(v), k = U::set16(8);
     return {U::add16(U::mulHighS16(vl, U::set16(set.vToR)), k),
             U::add16(U::add16(U::mulHighS16(ul, U::set16(set.uToG)), U::mulHighS16(vl, U::set16(set.vToG))), k),
             U::add16(U::mulHighS16(ul, U::set16(set.uToB)), k)};
   }
   template <class U>
-  Trio<U> combine(typename U::V y, const Trio<U>& t) const {
+  ZEL_INLINE Trio<U> combine(typename U::V y, const Trio<U>& t) const {
     const typename U::V ly = U::mulHighS16(lumaLanes<U>(y), U::set16(set.luma));
     return {U::template sra16<4>(U::add16(ly, t.c0)), U::template sra16<4>(U::add16(ly, t.c1)),
             U::template sra16<4>(U::add16(ly, t.c2))};
@@ -134,14 +134,14 @@ struct PairCentredForm {
   PairSet set;
   Rgb8 pixel(int Y, int U, int V) const { return pairLanesCentred(set, Y, U, V); }
   template <class U>
-  Trio<U> chroma(typename U::V u, typename U::V v) const {
+  ZEL_INLINE Trio<U> chroma(typename U::V u, typename U::V v) const {
     const typename U::V half = U::set16(128);
     const typename U::V uc = U::sub16(u, half), vc = U::sub16(v, half);
     return {termL<U>(vc, set.vToR), U::sub16(U::zero(), U::add16(termL<U>(uc, set.uToG), termL<U>(vc, set.vToG))),
             termL<U>(uc, set.uToB)};
   }
   template <class U>
-  Trio<U> combine(typename U::V y, const Trio<U>& t) const {
+  ZEL_INLINE Trio<U> combine(typename U::V y, const Trio<U>& t) const {
     const typename U::V ly = termL<U>(U::sub16(y, U::set16(16)), set.luma);
     return {U::template sra16<3>(U::add16(ly, t.c0)), U::template sra16<3>(U::add16(ly, t.c1)),
             U::template sra16<3>(U::add16(ly, t.c2))};
@@ -152,13 +152,13 @@ struct PairRawForm {
   PairSet set;
   Rgb8 pixel(int Y, int U, int V) const { return pairLanesRaw(set, Y, U, V); }
   template <class U>
-  Trio<U> chroma(typename U::V u, typename U::V v) const {
+  ZEL_INLINE Trio<U> chroma(typename U::V u, typename U::V v) const {
     return {U::sub16(termL<U>(v, set.vToR), U::set16(set.offR)),
             U::sub16(U::set16(set.offG), U::add16(termL<U>(u, set.uToG), termL<U>(v, set.vToG))),
             U::sub16(termL<U>(u, set.uToB), U::set16(set.offB))};
   }
   template <class U>
-  Trio<U> combine(typename U::V y, const Trio<U>& t) const {
+  ZEL_INLINE Trio<U> combine(typename U::V y, const Trio<U>& t) const {
     const typename U::V ly = termL<U>(y, set.luma);
     return {U::template sra16<3>(U::add16(ly, t.c0)), U::template sra16<3>(U::add16(ly, t.c1)),
             U::template sra16<3>(U::add16(ly, t.c2))};
@@ -169,7 +169,7 @@ struct SixteenthsForm {
   SixteenthsSet set;
   Rgb8 pixel(int Y, int U, int V) const { return lumaSixteenths(set, Y, U, V); }
   template <class U>
-  Trio<U> chroma(typename U::V u, typename U::V v) const {
+  ZEL_INLINE Trio<U> chroma(typename U::V u, typename U::V v) const {
     const typename U::V half = U::set16(128), round = U::set16(8);
     const typename U::V uc = U::sub16(u, half), vc = U::sub16(v, half);
     return {U::add16(termL<U>(vc, set.vToR), round),
@@ -177,7 +177,7 @@ struct SixteenthsForm {
             U::add16(termL<U>(uc, set.uToB), round)};
   }
   template <class U>
-  Trio<U> combine(typename U::V y, const Trio<U>& t) const {
+  ZEL_INLINE Trio<U> combine(typename U::V y, const Trio<U>& t) const {
     const typename U::V y4 = U::template sll16<4>(y);
     return {U::template sra16<4>(U::add16(y4, t.c0)), U::template sra16<4>(U::add16(y4, t.c1)),
             U::template sra16<4>(U::add16(y4, t.c2))};
@@ -190,7 +190,7 @@ struct YuvHalvesForm {
   RgbLaneSet set;
   Rgb8 pixel(int Y, int U, int V) const { return rgbOf(rgbLanesShape<1, 4, 0, 1, false>(set, Y, U, V)); }
   template <class U>
-  Trio<U> chroma(typename U::V u, typename U::V v) const {
+  ZEL_INLINE Trio<U> chroma(typename U::V u, typename U::V v) const {
     const typename U::V half = U::set16(128);
     const typename U::V ul = U::template sll16<4>(U::sub16(u, half)), vl = U::template sll16<4>(U::sub16(v, half));
     return {U::mulHighS16(vl, U::set16(set.vToR)),
@@ -198,7 +198,7 @@ struct YuvHalvesForm {
             U::mulHighS16(ul, U::set16(set.uToB))};
   }
   template <class U>
-  Trio<U> combine(typename U::V y, const Trio<U>& t) const {
+  ZEL_INLINE Trio<U> combine(typename U::V y, const Trio<U>& t) const {
     const typename U::V y2 = U::template sll16<1>(y);
     return {U::template sra16<1>(U::add16(y2, t.c0)), U::template sra16<1>(U::add16(y2, t.c1)),
             U::template sra16<1>(U::add16(y2, t.c2))};
@@ -212,11 +212,11 @@ struct YuvWideForm {
   RgbRounding rounding;
   Rgb8 pixel(int Y, int U, int V) const { return rgbOf(rgbWide(set, rounding, Y, U, V)); }
   template <class U>
-  Trio<U> chroma(typename U::V u, typename U::V v) const {
+  ZEL_INLINE Trio<U> chroma(typename U::V u, typename U::V v) const {
     return {u, v, U::zero()};
   }
   template <class U>
-  Trio<U> combine(typename U::V y, const Trio<U>& t) const {
+  ZEL_INLINE Trio<U> combine(typename U::V y, const Trio<U>& t) const {
     return rgbWide<U>(set, rounding, Trio<U>{y, t.c0, t.c1});
   }
 };

@@ -56,7 +56,7 @@ struct LumaRow {
   const uint8_t* p;
   int sample(int x) const { return p[x]; }
   template <class U>
-  Wide16<U> lumaBlock(int x) const {
+  ZEL_INLINE Wide16<U> lumaBlock(int x) const {
     return widen<U>(U::loadUnits(p + x, 16));
   }
 };
@@ -74,7 +74,7 @@ struct ChromaPlanes {
     v = cr[x / Spread];
   }
   template <class U>
-  ChromaLanes<U> chromaBlock(int x) const {
+  ZEL_INLINE ChromaLanes<U> chromaBlock(int x) const {
     const typename U::V z = U::zero();
     const int at = x / Spread, n = 16 / Spread;
     if constexpr (Spread == 2)
@@ -95,7 +95,7 @@ struct ChromaPairs {
     v = q[CrFirst ? 0 : 1];
   }
   template <class U>
-  ChromaLanes<U> chromaBlock(int x) const {
+  ZEL_INLINE ChromaLanes<U> chromaBlock(int x) const {
     const typename U::V b = U::loadUnits(p + x, 16);
     const typename U::V first = U::template srl16<8>(U::template sll16<8>(b)), second = U::template srl16<8>(b);
     return CrFirst ? ChromaLanes<U>{second, first} : ChromaLanes<U>{first, second};
@@ -145,14 +145,14 @@ struct PairStream {
     v = p[4 * (x >> 1) + s.cr];
   }
   template <class U>
-  Wide16<U> lumaBlock(int x) const {
+  ZEL_INLINE Wide16<U> lumaBlock(int x) const {
     const StreamPatterns& k = kStreamPatterns<Order>;
     const uint8_t* q = p + 2 * x;
     return {U::shuffle8(U::loadUnits(q, 32), U::shuffleOf(k.luma)),
             U::shuffle8(U::loadUnits(q + 16, 32), U::shuffleOf(k.luma))};
   }
   template <class U>
-  ChromaLanes<U> chromaBlock(int x) const {
+  ZEL_INLINE ChromaLanes<U> chromaBlock(int x) const {
     const StreamPatterns& k = kStreamPatterns<Order>;
     const uint8_t* q = p + 2 * x;
     const typename U::V a = U::loadUnits(q, 32), b = U::loadUnits(q + 16, 32);
@@ -179,9 +179,9 @@ struct Spread {
   Trio<U> lo, hi;
 };
 template <int By, class U>
-inline Spread<U> spread(const Trio<U>& t) {
-  auto lo = [](typename U::V v) { return U::unpackLo16(v, v); };
-  auto hi = [](typename U::V v) { return U::unpackHi16(v, v); };
+ZEL_INLINE Spread<U> spread(const Trio<U>& t) {
+  auto lo = [](typename U::V v) ZEL_LAMBDA_INLINE { return U::unpackLo16(v, v); };
+  auto hi = [](typename U::V v) ZEL_LAMBDA_INLINE { return U::unpackHi16(v, v); };
   if constexpr (By == 2) {
     return {{lo(t.c0), lo(t.c1), lo(t.c2)}, {hi(t.c0), hi(t.c1), hi(t.c2)}};
   } else {
@@ -191,7 +191,7 @@ inline Spread<U> spread(const Trio<U>& t) {
 }
 
 template <class U, int Rows, class Luma, class Chroma, class Out, class Form>
-inline int expandBlocks(const RowSet<Rows, Luma, Chroma, Out>& rows, int x, int end, const Form& form) {
+ZEL_INLINE int expandBlocks(const RowSet<Rows, Luma, Chroma, Out>& rows, int x, int end, const Form& form) {
   for (; x + U::kPixels <= end; x += U::kPixels) {
     const ChromaLanes<U> c = rows.chroma.template chromaBlock<U>(x);
     const Spread<U> t = spread<Chroma::kSpread, U>(form.template chroma<U>(c.u, c.v));

@@ -150,12 +150,12 @@ struct Wide16 {
   typename U::V lo, hi;
 };
 template <class U>
-inline Wide16<U> widen(typename U::V bytes) {
+ZEL_INLINE Wide16<U> widen(typename U::V bytes) {
   const typename U::V z = U::zero();
   return {U::unpackLo8(bytes, z), U::unpackHi8(bytes, z)};
 }
 template <class U>
-inline typename U::V narrow(const Wide16<U>& w) {
+ZEL_INLINE typename U::V narrow(const Wide16<U>& w) {
   return U::packU8(w.lo, w.hi);
 }
 

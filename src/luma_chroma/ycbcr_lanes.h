@@ -97,16 +97,16 @@ struct LaneRgb {
 
 // Y' and U', V' from samples widened to 16-bit lanes.
 template <class U>
-inline typename U::V lumaLanes(typename U::V samples) {
+ZEL_INLINE typename U::V lumaLanes(typename U::V samples) {
   return U::sub16(U::template sll16<7>(samples), U::set16(16 << 7));
 }
 template <class U>
-inline typename U::V chromaLanes(typename U::V samples) {
+ZEL_INLINE typename U::V chromaLanes(typename U::V samples) {
   return U::sub16(U::template sll16<7>(samples), U::set16(128 << 7));
 }
 
 template <class U>
-inline LaneRgb<U> laneAdded(const LaneSet& s, typename U::V yl, typename U::V ul, typename U::V vl, int k) {
+ZEL_INLINE LaneRgb<U> laneAdded(const LaneSet& s, typename U::V yl, typename U::V ul, typename U::V vl, int k) {
   const typename U::V kk = U::set16(k);
   const typename U::V luma = U::mulHighS16(yl, U::set16(s.luma));
   const typename U::V r = U::add16(U::add16(luma, U::mulHighS16(vl, U::set16(s.vToR))), kk);
@@ -117,7 +117,7 @@ inline LaneRgb<U> laneAdded(const LaneSet& s, typename U::V yl, typename U::V ul
 }
 
 template <class U>
-inline LaneRgb<U> laneSubtracted(const LaneSet& s, typename U::V yl, typename U::V ul, typename U::V vl,
+ZEL_INLINE LaneRgb<U> laneSubtracted(const LaneSet& s, typename U::V yl, typename U::V ul, typename U::V vl,
                                  int k = 8) {
   const typename U::V kk = U::set16(k);
   const typename U::V luma = U::mulHighS16(yl, U::set16(s.luma));
@@ -154,7 +154,7 @@ struct LaneAddedForm {
   int k;
   Samples3 pixel(const Samples3& s) const { return samplesOf(laneAdded(set, s.c0, s.c1, s.c2, k)); }
   template <class U>
-  Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     const LaneRgb<U> r = laneAdded<U>(set, lumaLanes<U>(s.c0), chromaLanes<U>(s.c1), chromaLanes<U>(s.c2), k);
     return {r.r, r.g, r.b};
   }
@@ -165,7 +165,7 @@ struct LaneSubtractedForm {
   LaneSet set;
   Samples3 pixel(const Samples3& s) const { return samplesOf(laneSubtracted(set, s.c0, s.c1, s.c2)); }
   template <class U>
-  Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     const LaneRgb<U> r = laneSubtracted<U>(set, lumaLanes<U>(s.c0), chromaLanes<U>(s.c1), chromaLanes<U>(s.c2));
     return {r.r, r.g, r.b};
   }

@@ -15,7 +15,7 @@ struct MatrixLanes {
   static constexpr bool kVector = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(yuvMatrixLanes(s.c0, s.c1, s.c2)); }
   template <class U>
-  Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     return yuvMatrixLanes<U>(s);
   }
 };
@@ -24,7 +24,7 @@ struct DifferenceLanes {
   static constexpr bool kVector = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(yuvDifferenceLanes(s.c0, s.c1, s.c2)); }
   template <class U>
-  Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     return yuvDifferenceLanes<U>(s);
   }
 };
@@ -33,7 +33,7 @@ struct DifferenceRounded {
   static constexpr bool kVector = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(yuvDifferenceRounded(s.c0, s.c1, s.c2)); }
   template <class U>
-  Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     return yuvDifferenceRounded<U>(s);
   }
 };

@@ -33,17 +33,17 @@ struct Dot32 {
   typename U::V lo, hi;
 };
 template <class U>
-inline Dot32<U> dot(typename U::V a, typename U::V b, int ca, int cb) {
+ZEL_INLINE Dot32<U> dot(typename U::V a, typename U::V b, int ca, int cb) {
   const typename U::V k = U::set32(int32_t(uint32_t(uint16_t(ca)) | (uint32_t(uint16_t(cb)) << 16)));
   return {U::madd16(U::unpackLo16(a, b), k), U::madd16(U::unpackHi16(a, b), k)};
 }
 template <class U>
-inline Dot32<U> operator+(const Dot32<U>& a, const Dot32<U>& b) {
+ZEL_INLINE Dot32<U> operator+(const Dot32<U>& a, const Dot32<U>& b) {
   return {U::add32(a.lo, b.lo), U::add32(a.hi, b.hi)};
 }
 // (x + add) >> N in 32-bit lanes, packed back to 16-bit lanes.
 template <int N, class U>
-inline typename U::V shiftPack(const Dot32<U>& x, int32_t add) {
+ZEL_INLINE typename U::V shiftPack(const Dot32<U>& x, int32_t add) {
   const typename U::V a = U::set32(add);
   return U::packS32(U::template sra32<N>(U::add32(x.lo, a)), U::template sra32<N>(U::add32(x.hi, a)));
 }
@@ -72,7 +72,7 @@ inline Pixel8 yuvDifferenceWide(int R, int G, int B) {
 // With q = (Half - s) >> 16, the difference ((B << 16) - s + Half) >> 16 is
 // B + q, and (d * 57475) >> 16 is d + MulHighS16(d, 57475 - 65536).
 template <bool RoundedLuma, int Half, class U>
-inline Trio<U> yuvDifferenceWide(const Trio<U>& rgb) {
+ZEL_INLINE Trio<U> yuvDifferenceWide(const Trio<U>& rgb) {
   using namespace yuv_detail;
   const typename U::V R = rgb.c0, G = rgb.c1, B = rgb.c2;
   // s = 19595 R + 19235 G + 7471 B + 19235 G
@@ -88,13 +88,13 @@ inline Trio<U> yuvDifferenceWide(const Trio<U>& rgb) {
 
 inline Pixel8 yuvDifferenceRounded(int R, int G, int B) { return yuvDifferenceWide<true, 32768>(R, G, B); }
 template <class U>
-inline Trio<U> yuvDifferenceRounded(const Trio<U>& rgb) {
+ZEL_INLINE Trio<U> yuvDifferenceRounded(const Trio<U>& rgb) {
   return yuvDifferenceWide<true, 32768, U>(rgb);
 }
 
 inline Pixel8 yuvDifferenceTruncated(int R, int G, int B) { return yuvDifferenceWide<false, 32767>(R, G, B); }
 template <class U>
-inline Trio<U> yuvDifferenceTruncated(const Trio<U>& rgb) {
+ZEL_INLINE Trio<U> yuvDifferenceTruncated(const Trio<U>& rgb) {
   return yuvDifferenceWide<false, 32767, U>(rgb);
 }
 
@@ -110,7 +110,7 @@ inline Pixel8 yuvDifferenceLanes(int R, int G, int B) {
 }
 
 template <class U>
-inline Trio<U> yuvDifferenceLanes(const Trio<U>& rgb) {
+ZEL_INLINE Trio<U> yuvDifferenceLanes(const Trio<U>& rgb) {
   const typename U::V r = U::template sll16<2>(rgb.c0), g = U::template sll16<2>(rgb.c1);
   const typename U::V b = U::template sll16<2>(rgb.c2);
   typename U::V t = U::addSatS16(U::mulHighS16(r, U::set16(9798)), U::mulHighS16(b, U::set16(3736)));
@@ -133,7 +133,7 @@ inline Pixel8 yuvMatrixLanes(int R, int G, int B) {
 }
 
 template <class U>
-inline Trio<U> yuvMatrixLanes(const Trio<U>& rgb) {
+ZEL_INLINE Trio<U> yuvMatrixLanes(const Trio<U>& rgb) {
   using V = typename U::V;
   const V r8 = U::template sll16<8>(rgb.c0), g8 = U::template sll16<8>(rgb.c1), b8 = U::template sll16<8>(rgb.c2);
   const V y = U::addSatU16(U::addSatU16(U::mulHighU16(r8, U::set16(19595)), U::mulHighU16(g8, U::set16(38469))),
@@ -157,7 +157,7 @@ inline Pixel8 yuvMatrixWide(int R, int G, int B) {
 }
 
 template <class U>
-inline Trio<U> yuvMatrixWide(const Trio<U>& rgb) {
+ZEL_INLINE Trio<U> yuvMatrixWide(const Trio<U>& rgb) {
   using namespace yuv_detail;
   const typename U::V R = rgb.c0, G = rgb.c1, B = rgb.c2;
   // 38469 G = 19234 G + 19235 G; 14286 B = 7143 B + 7143 B; -3276 B likewise.
@@ -198,11 +198,11 @@ constexpr int32_t fractionPart(int32_t c) { return c - wholePart(c) * 65536; }
 }  // namespace yuv_detail
 
 template <class U>
-inline Trio<U> rgbWide(const RgbWideSet& k, const RgbRounding& rnd, const Trio<U>& yuv) {
+ZEL_INLINE Trio<U> rgbWide(const RgbWideSet& k, const RgbRounding& rnd, const Trio<U>& yuv) {
   using namespace yuv_detail;
   using V = typename U::V;
   const V y = yuv.c0, u = U::sub16(yuv.c1, U::set16(128)), v = U::sub16(yuv.c2, U::set16(128)), zero = U::zero();
-  auto whole = [](V x, int32_t c) { return U::mulLo16(x, U::set16(wholePart(c))); };
+  auto whole = [](V x, int32_t c) ZEL_LAMBDA_INLINE { return U::mulLo16(x, U::set16(wholePart(c))); };
   const V r = U::add16(U::add16(y, whole(v, k.vToR)), shiftPack<16>(dot<U>(v, zero, fractionPart(k.vToR), 0), rnd.r));
   const V g = U::add16(U::add16(y, U::add16(whole(u, k.uToG), whole(v, k.vToG))),
                        shiftPack<16>(dot<U>(u, v, fractionPart(k.uToG), fractionPart(k.vToG)), rnd.g));
@@ -239,7 +239,7 @@ inline Pixel8 rgbLanesShape(const RgbLaneSet& k, int Y, int U, int V) {
 }
 
 template <int YShift, int CShift, int Round, int Shift, bool SubtractGreen, class U>
-inline Trio<U> rgbLanesShape(const RgbLaneSet& k, const Trio<U>& yuv) {
+ZEL_INLINE Trio<U> rgbLanesShape(const RgbLaneSet& k, const Trio<U>& yuv) {
   using V = typename U::V;
   const V y = U::template sll16<YShift>(yuv.c0);
   const V u = U::template sll16<CShift>(U::sub16(yuv.c1, U::set16(128)));
@@ -259,14 +259,14 @@ inline Trio<U> rgbLanesShape(const RgbLaneSet& k, const Trio<U>& yuv) {
 // rgbLanes1: SaturateU8(Y + terms), chroma << 3.
 inline Pixel8 rgbLanes1(int Y, int U, int V) { return rgbLanesShape<0, 3, 0, 0, false>(rgbLanes1Set, Y, U, V); }
 template <class U>
-inline Trio<U> rgbLanes1(const Trio<U>& yuv) {
+ZEL_INLINE Trio<U> rgbLanes1(const Trio<U>& yuv) {
   return rgbLanesShape<0, 3, 0, 0, false, U>(rgbLanes1Set, yuv);
 }
 
 // rgbLanes2: SaturateU8(((Y << 1) + terms) >> 1), chroma << 4.
 inline Pixel8 rgbLanes2(int Y, int U, int V) { return rgbLanesShape<1, 4, 0, 1, false>(rgbLanes2Set, Y, U, V); }
 template <class U>
-inline Trio<U> rgbLanes2(const Trio<U>& yuv) {
+ZEL_INLINE Trio<U> rgbLanes2(const Trio<U>& yuv) {
   return rgbLanesShape<1, 4, 0, 1, false, U>(rgbLanes2Set, yuv);
 }
 
@@ -274,7 +274,7 @@ inline Trio<U> rgbLanes2(const Trio<U>& yuv) {
 // subtracted.
 inline Pixel8 rgbLanes3(int Y, int U, int V) { return rgbLanesShape<3, 7, 4, 3, true>(rgbLanes3Set, Y, U, V); }
 template <class U>
-inline Trio<U> rgbLanes3(const Trio<U>& yuv) {
+ZEL_INLINE Trio<U> rgbLanes3(const Trio<U>& yuv) {
   return rgbLanesShape<3, 7, 4, 3, true, U>(rgbLanes3Set, yuv);
 }
 

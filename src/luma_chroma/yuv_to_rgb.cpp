@@ -15,7 +15,7 @@ struct Lanes1 {
   static constexpr bool kVector = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(rgbLanes1(s.c0, s.c1, s.c2)); }
   template <class U>
-  Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     return rgbLanes1<U>(s);
   }
 };
@@ -24,7 +24,7 @@ struct Lanes2 {
   static constexpr bool kVector = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(rgbLanes2(s.c0, s.c1, s.c2)); }
   template <class U>
-  Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     return rgbLanes2<U>(s);
   }
 };
@@ -33,7 +33,7 @@ struct Lanes3 {
   static constexpr bool kVector = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(rgbLanes3(s.c0, s.c1, s.c2)); }
   template <class U>
-  Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     return rgbLanes3<U>(s);
   }
 };
@@ -45,7 +45,7 @@ struct Wide {
   RgbRounding rounding;
   Samples3 pixel(const Samples3& s) const { return samplesOf(rgbWide(set, rounding, s.c0, s.c1, s.c2)); }
   template <class U>
-  Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     return rgbWide<U>(set, rounding, s);
   }
 };

@@ -18,10 +18,6 @@
 #include "packed16/packed_fields.h"
 #include "packed16/packed_read_formulas.h"
 
-// Every helper is inlined into its kernel: an AVX2 kernel then holds all of
-// its operations, and no 256-bit value passes through a call.
-#define ZEL_UNPACK_LANE inline __attribute__((always_inline))
-
 namespace zel::unpack {
 
 // The units, with the few operations the readers add.
@@ -74,7 +70,7 @@ struct Words {
 // helpers through references: aggregates of 256-bit values would go
 // through memory.
 template <class U, class W>
-ZEL_UNPACK_LANE void expand(V<U> w, V<U>& r, V<U>& g, V<U>& b) {
+ZEL_INLINE void expand(V<U> w, V<U>& r, V<U>& g, V<U>& b) {
   using L = typename W::Layout;
   const V<U> lo = U::and_(U::template sll16<8 - L::kLowBits>(w), U::set16(L::kLowMask << (8 - L::kLowBits)));
   g = U::and_(U::template srl16<L::kMidShift - (8 - L::kMidBits)>(w), U::set16(L::kMidMask << (8 - L::kMidBits)));
@@ -91,11 +87,11 @@ ZEL_UNPACK_LANE void expand(V<U> w, V<U>& r, V<U>& g, V<U>& b) {
 
 // MulHighU16(c << N, k) and MulHighS16(c, k).
 template <class U, int N>
-ZEL_UNPACK_LANE V<U> highU(V<U> c, int k) {
+ZEL_INLINE V<U> highU(V<U> c, int k) {
   return U::mulHighU16(U::template sll16<N>(c), U::set16(k));
 }
 template <class U>
-ZEL_UNPACK_LANE V<U> highS(V<U> c, int k) {
+ZEL_INLINE V<U> highS(V<U> c, int k) {
   return U::mulHighS16(c, U::set16(k));
 }
 
@@ -103,7 +99,7 @@ ZEL_UNPACK_LANE V<U> highS(V<U> c, int k) {
 template <int Pixels>
 struct StudioLanes {
   template <class U>
-  static ZEL_UNPACK_LANE void pixel(V<U> r, V<U> g, V<U> b, V<U>& y, V<U>& q0, V<U>& q1, V<U>& q2) {
+  ZEL_INLINE static void pixel(V<U> r, V<U> g, V<U> b, V<U>& y, V<U>& q0, V<U>& q1, V<U>& q2) {
     const V<U> s =
         U::add16(U::add16(U::add16(highU<U, 8>(r, kStudioYR), highU<U, 8>(g, kStudioYG)), highU<U, 8>(b, kStudioYB)),
                  U::set16(kStudioYAdd));
@@ -113,7 +109,7 @@ struct StudioLanes {
     q2 = b;
   }
   template <class U>
-  static ZEL_UNPACK_LANE void chroma(V<U> rs, V<U> gs, V<U> bs, V<U>& cb, V<U>& cr) {
+  ZEL_INLINE static void chroma(V<U> rs, V<U> gs, V<U> bs, V<U>& cb, V<U>& cr) {
     using C = StudioChromaBody<Pixels>;
     const V<U> add = U::set16(C::kAdd);
     cb = U::template sra16<C::kShift>(U::add16(
@@ -129,7 +125,7 @@ struct StudioLanes {
 // expansions of blue and red.
 struct YuvLanes {
   template <class U>
-  static ZEL_UNPACK_LANE void pixel(V<U> r, V<U> g, V<U> b, V<U>& y, V<U>& q0, V<U>& q1, V<U>& q2) {
+  ZEL_INLINE static void pixel(V<U> r, V<U> g, V<U> b, V<U>& y, V<U>& q0, V<U>& q1, V<U>& q2) {
     const V<U> s = U::add16(U::add16(U::add16(highU<U, 8>(r, kYuvYR), highU<U, 8>(g, kYuvYG)), highU<U, 8>(b, kYuvYB)),
                             U::set16(64));
     y = U::template sra16<7>(s);
@@ -139,12 +135,12 @@ struct YuvLanes {
   }
   // (MulHighS16((sum << 5) - (Ys << 5), gain) + 8224) >> 6
   template <class U>
-  static ZEL_UNPACK_LANE V<U> difference(V<U> sum, V<U> ys32, int gain) {
+  ZEL_INLINE static V<U> difference(V<U> sum, V<U> ys32, int gain) {
     const V<U> d = U::sub16(U::template sll16<5>(sum), ys32);
     return U::template sra16<6>(U::add16(highS<U>(d, gain), U::set16(8224)));
   }
   template <class U>
-  static ZEL_UNPACK_LANE void chroma(V<U> ys, V<U> bs, V<U> rs, V<U>& u, V<U>& v) {
+  ZEL_INLINE static void chroma(V<U> ys, V<U> bs, V<U> rs, V<U>& u, V<U>& v) {
     const V<U> ys32 = U::template sll16<5>(ys);
     u = difference<U>(bs, ys32, kYuvUGain);
     v = difference<U>(rs, ys32, kYuvVGain);
@@ -158,7 +154,7 @@ struct YuvTwiceLanes {
   static constexpr int kMeanShift = Pixels == 4 ? 2 : 1;  // mean of y2
   static constexpr int kSumShift = Pixels == 4 ? 3 : 2;   // sums of B', R'
   template <class U>
-  static ZEL_UNPACK_LANE void pixel(V<U> r, V<U> g, V<U> b, V<U>& y, V<U>& q0, V<U>& q1, V<U>& q2) {
+  ZEL_INLINE static void pixel(V<U> r, V<U> g, V<U> b, V<U>& y, V<U>& q0, V<U>& q1, V<U>& q2) {
     q1 = U::template sll16<2>(b);
     q2 = U::template sll16<2>(r);
     q0 = U::add16(U::add16(highS<U>(q2, kYuvYR), highS<U>(q1, kYuvYB)), highS<U>(U::template sll16<2>(g), kYuvYG));
@@ -166,11 +162,11 @@ struct YuvTwiceLanes {
   }
   // MulHighS16(mean - m, gain) + 128
   template <class U>
-  static ZEL_UNPACK_LANE V<U> difference(V<U> sum, V<U> m, int gain) {
+  ZEL_INLINE static V<U> difference(V<U> sum, V<U> m, int gain) {
     return U::add16(highS<U>(U::sub16(U::template sra16<kSumShift>(sum), m), gain), U::set16(128));
   }
   template <class U>
-  static ZEL_UNPACK_LANE void chroma(V<U> y2s, V<U> bs, V<U> rs, V<U>& u, V<U>& v) {
+  ZEL_INLINE static void chroma(V<U> y2s, V<U> bs, V<U> rs, V<U>& u, V<U>& v) {
     const V<U> m = U::template sra16<kMeanShift>(y2s);
     u = difference<U>(bs, m, kYuvUGainRedLow);
     v = difference<U>(rs, m, kYuvVGain);
@@ -183,13 +179,13 @@ struct YuvTwiceLanes {
 // (U::loadUnits(p, 32) and U::loadUnits(p + 8, 32)).
 
 template <class U>
-ZEL_UNPACK_LANE V<U> loadLanes(const uint16_t* p) {
+ZEL_INLINE V<U> loadLanes(const uint16_t* p) {
   return U::loadUnits(p, 32);
 }
 
 // Eight pixels a lane: luma lanes and the quantities to sum.
 template <class U, class W, class Form>
-ZEL_UNPACK_LANE void halfBlock(V<U> w, V<U>& y, V<U>& q0, V<U>& q1, V<U>& q2) {
+ZEL_INLINE void halfBlock(V<U> w, V<U>& y, V<U>& q0, V<U>& q1, V<U>& q2) {
   V<U> r, g, b;
   expand<U, W>(w, r, g, b);
   Form::template pixel<U>(r, g, b, y, q0, q1, q2);
@@ -198,7 +194,7 @@ ZEL_UNPACK_LANE void halfBlock(V<U> w, V<U>& y, V<U>& q0, V<U>& q1, V<U>& q2) {
 // Chroma bytes of a lane from its sums: eight first-chroma bytes, then
 // eight second.
 template <class U, class Form>
-ZEL_UNPACK_LANE V<U> chromaBytes(V<U> s0, V<U> s1, V<U> s2) {
+ZEL_INLINE V<U> chromaBytes(V<U> s0, V<U> s1, V<U> s2) {
   V<U> c1, c2;
   Form::template chroma<U>(s0, s1, s2, c1, c2);
   return U::packU8(c1, c2);
@@ -207,7 +203,7 @@ ZEL_UNPACK_LANE V<U> chromaBytes(V<U> s0, V<U> s1, V<U> s2) {
 // A block of a 4:2:0 row pair: luma bytes of both rows, chroma of the
 // 2 x 2 groups (horizontal adds give eight pair sums a lane in order).
 template <class U, class W, class Form>
-ZEL_UNPACK_LANE void block420(V<U> wa0, V<U> wb0, V<U> wa1, V<U> wb1, V<U>& y0, V<U>& y1, V<U>& chroma) {
+ZEL_INLINE void block420(V<U> wa0, V<U> wb0, V<U> wa1, V<U> wb1, V<U>& y0, V<U>& y1, V<U>& chroma) {
   V<U> ya, yb, a0, a1, a2, b0, b1, b2, c0, c1, c2, d0, d1, d2;
   halfBlock<U, W, Form>(wa0, ya, a0, a1, a2);
   halfBlock<U, W, Form>(wb0, yb, b0, b1, b2);
@@ -223,7 +219,7 @@ ZEL_UNPACK_LANE void block420(V<U> wa0, V<U> wb0, V<U> wa1, V<U> wb1, V<U>& y0, 
 // A block of one row: luma bytes, chroma of pairs (Group 2) or of groups
 // of four (Group 4: four bytes of each chroma a lane, at bytes 0 and 8).
 template <int Group, class U, class W, class Form>
-ZEL_UNPACK_LANE void blockRow(V<U> wa, V<U> wb, V<U>& y, V<U>& chroma) {
+ZEL_INLINE void blockRow(V<U> wa, V<U> wb, V<U>& y, V<U>& chroma) {
   V<U> ya, yb, a0, a1, a2, b0, b1, b2;
   halfBlock<U, W, Form>(wa, ya, a0, a1, a2);
   halfBlock<U, W, Form>(wb, yb, b0, b1, b2);
@@ -239,11 +235,11 @@ ZEL_UNPACK_LANE void blockRow(V<U> wa, V<U> wb, V<U>& y, V<U>& chroma) {
 
 // Eight or four words of a short block (SSE), in both halves: the
 // results of its pixels come first in every output.
-ZEL_UNPACK_LANE __m128i loadShort(const uint16_t* p, int n) { return n == 8 ? load128(p) : load64(p); }
+ZEL_INLINE __m128i loadShort(const uint16_t* p, int n) { return n == 8 ? load128(p) : load64(p); }
 
 // Y0 Cb Y1 Cr order of a lane's 16 pixels: 32 bytes, two registers.
 template <class U>
-ZEL_UNPACK_LANE void storePairStream(uint8_t* q, V<U> y, V<U> chroma) {
+ZEL_INLINE void storePairStream(uint8_t* q, V<U> y, V<U> chroma) {
   // Cb0 Cr0 Cb1 Cr1 ... from Cb0..7 Cr0..7.
   static constexpr lc::Shuffle16 kZip = {{0, 8, 1, 9, 2, 10, 3, 11, 4, 12, 5, 13, 6, 14, 7, 15}};
   const V<U> c = U::shuffle8(chroma, U::shuffleOf(kZip));
@@ -255,7 +251,7 @@ ZEL_UNPACK_LANE void storePairStream(uint8_t* q, V<U> y, V<U> chroma) {
 
 // 16 pixels a lane: the bytes of the low field, green, the top field.
 template <class U, class L>
-ZEL_UNPACK_LANE void byteChannels(V<U> wa, V<U> wb, V<U>& c0, V<U>& c1, V<U>& c2) {
+ZEL_INLINE void byteChannels(V<U> wa, V<U> wb, V<U>& c0, V<U>& c1, V<U>& c2) {
   V<U> ra, ga, ba, rb, gb, bb;
   expand<U, Words<L, false>>(wa, ra, ga, ba);
   expand<U, Words<L, false>>(wb, rb, gb, bb);

@@ -41,7 +41,7 @@ inline Rgb operator+(const Rgb& a, const Rgb& b) { return {a.r + b.r, a.g + b.g,
 // ---- 4:2:0 vector part ----
 
 template <class U, class W, class Form>
-ZEL_UNPACK_LANE int blocks420(const PairRows& r, int x, int end) {
+ZEL_INLINE int blocks420(const PairRows& r, int x, int end) {
   for (; x + U::kPixels <= end; x += U::kPixels) {
     V<U> y0, y1, c;
     block420<U, W, Form>(loadLanes<U>(r.s0 + x), loadLanes<U>(r.s0 + x + 8), loadLanes<U>(r.s1 + x),
@@ -104,7 +104,7 @@ struct PlanesSink {
   static constexpr int kGroup = Group;
   PlaneRow row;
   template <class U>
-  ZEL_UNPACK_LANE void store(int x, V<U> y, V<U> c) const {
+  ZEL_INLINE void store(int x, V<U> y, V<U> c) const {
     U::storeUnits(row.y + x, 16, y);
     if constexpr (Group == 4)
       U::storeQuarters(row.c1 + x / 4, row.c2 + x / 4, c);
@@ -123,7 +123,7 @@ struct StreamSink422 {
   static constexpr int kGroup = 2;
   uint8_t* dst;
   template <class U>
-  ZEL_UNPACK_LANE void store(int x, V<U> y, V<U> c) const {
+  ZEL_INLINE void store(int x, V<U> y, V<U> c) const {
     storePairStream<U>(dst + 2 * x, y, c);
   }
   void storeShort(int x, int n, __m128i y, __m128i c) const {
@@ -134,7 +134,7 @@ struct StreamSink422 {
 };
 
 template <class U, class W, class Form, class Sink>
-ZEL_UNPACK_LANE int blocksRow(const uint16_t* s, const Sink& sink, int x, int end) {
+ZEL_INLINE int blocksRow(const uint16_t* s, const Sink& sink, int x, int end) {
   for (; x + U::kPixels <= end; x += U::kPixels) {
     V<U> y, c;
     blockRow<Sink::kGroup, U, W, Form>(loadLanes<U>(s + x), loadLanes<U>(s + x + 8), y, c);
@@ -173,7 +173,7 @@ inline int yuv420End(int width) { return (width & ~7) + ((width & 6) >= 4 ? 4 : 
 // ---- words to bytes ----
 
 template <class U>
-ZEL_UNPACK_LANE int wordBytesBlocks(const uint16_t* s, uint8_t* d, int x, int end) {
+ZEL_INLINE int wordBytesBlocks(const uint16_t* s, uint8_t* d, int x, int end) {
   const lc::PackedOut3<false> out{d};
   for (; x + U::kPixels <= end; x += U::kPixels) {
     lc::Trio<U> t;

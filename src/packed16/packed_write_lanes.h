@@ -147,7 +147,7 @@ struct FullPlanes {
   const uint8_t *y, *cb, *cr;
   Samples3 pixel(int x) const { return {y[x], cb[x], cr[x]}; }
   template <class U>
-  Trio<U> block(int x) const {
+  ZEL_INLINE Trio<U> block(int x) const {
     return {U::bytes(y + x), U::bytes(cb + x), U::bytes(cr + x)};
   }
 };
@@ -157,7 +157,7 @@ struct HalfPlanes {
   const uint8_t *y, *cb, *cr;
   Samples3 pixel(int x) const { return {y[x], cb[x >> 1], cr[x >> 1]}; }
   template <class U>
-  Trio<U> block(int x) const {
+  ZEL_INLINE Trio<U> block(int x) const {
     return {U::bytes(y + x), U::halves(cb + (x >> 1)), U::halves(cr + (x >> 1))};
   }
 };
@@ -167,7 +167,7 @@ struct QuarterPlanes {
   const uint8_t *y, *cb, *cr;
   Samples3 pixel(int x) const { return {y[x], cb[x >> 2], cr[x >> 2]}; }
   template <class U>
-  Trio<U> block(int x) const {
+  ZEL_INLINE Trio<U> block(int x) const {
     return {U::bytes(y + x), U::quarters(cb + (x >> 2)), U::quarters(cr + (x >> 2))};
   }
 };
@@ -177,7 +177,7 @@ struct Triples {
   const uint8_t* p;
   Samples3 pixel(int x) const { return {p[3 * x], p[3 * x + 1], p[3 * x + 2]}; }
   template <class U>
-  Trio<U> block(int x) const {
+  ZEL_INLINE Trio<U> block(int x) const {
     return U::triples(p + 3 * x);
   }
 };
@@ -187,7 +187,7 @@ struct Pairs {
   const uint8_t* p;
   Samples3 pixel(int x) const { return {p[2 * x], p[4 * (x >> 1) + 1], p[4 * (x >> 1) + 3]}; }
   template <class U>
-  Trio<U> block(int x) const {
+  ZEL_INLINE Trio<U> block(int x) const {
     return U::pairs(p + 2 * x);
   }
 };
@@ -197,7 +197,7 @@ struct Pairs {
 struct YCbCrLanes {
   Rgb pixel(const Samples3& s) const { return ycbcrLaneForm(s.c0, s.c1, s.c2); }
   template <class U>
-  Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     const lc::LaneRgb<U> r = lc::laneSubtracted<U>(lc::lanes601b, lc::lumaLanes<U>(s.c0), lc::chromaLanes<U>(s.c1),
                                                    lc::chromaLanes<U>(s.c2), 0);
     return {U::clampU8(r.r), U::clampU8(r.g), U::clampU8(r.b)};
@@ -207,7 +207,7 @@ struct YCbCrLanes {
 struct YuvLanes {
   Rgb pixel(const Samples3& s) const { return yuvLaneForm(s.c0, s.c1, s.c2); }
   template <class U>
-  Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     const Trio<U> r = lc::rgbLanesShape<4, 7, 0, 4, true, U>(kYuvPackedLanes, s);
     return {U::clampU8(r.c0), U::clampU8(r.c1), U::clampU8(r.c2)};
   }
@@ -217,7 +217,7 @@ struct YuvLanes {
 struct SameBytes {
   Rgb pixel(const Samples3& s) const { return {s.c0, s.c1, s.c2}; }
   template <class U>
-  Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     return s;
   }
 };
@@ -225,14 +225,14 @@ struct SameBytes {
 // ---- reductions of a vector block ----
 
 template <class U, int Bits>
-inline typename U::V truncateLanes(typename U::V c) {
+ZEL_INLINE typename U::V truncateLanes(typename U::V c) {
   return U::template srl16<8 - Bits>(c);
 }
 
 // q + 1 where c * 256 - q * S exceeds the threshold; the difference always
 // fits a signed 16-bit lane, so wrapping products give it exactly.
 template <class U, int Bits>
-inline typename U::V ditherLanes(typename U::V c, typename U::V threshold) {
+ZEL_INLINE typename U::V ditherLanes(typename U::V c, typename U::V threshold) {
   using L = DitherLevel<Bits>;
   const typename U::V q = U::template srl16<8>(U::mulLo16(c, U::set16(L::kMultiplier)));
   const typename U::V distance = U::sub16(U::template sll16<8>(c), U::mulLo16(q, U::set16(L::kSize)));
@@ -240,7 +240,7 @@ inline typename U::V ditherLanes(typename U::V c, typename U::V threshold) {
 }
 
 template <class U, class L>
-inline typename U::V assembleLanes(typename U::V low, typename U::V mid, typename U::V top) {
+ZEL_INLINE typename U::V assembleLanes(typename U::V low, typename U::V mid, typename U::V top) {
   return U::or_(U::or_(low, U::template sll16<L::kMidShift>(mid)), U::template sll16<L::kTopShift>(top));
 }
 
@@ -251,7 +251,7 @@ struct RowWords;
 template <class U, class L>
 struct RowWords<U, Truncating<L>> {
   RowWords(const Truncating<L>&, int) {}
-  typename U::V operator()(typename U::V low, typename U::V mid, typename U::V top) const {
+  ZEL_INLINE typename U::V operator()(typename U::V low, typename U::V mid, typename U::V top) const {
     return assembleLanes<U, L>(truncateLanes<U, L::kLowBits>(low), truncateLanes<U, L::kMidBits>(mid),
                                truncateLanes<U, L::kTopBits>(top));
   }
@@ -260,12 +260,12 @@ struct RowWords<U, Truncating<L>> {
 template <class U, class L>
 struct RowWords<U, Dithering<L>> {
   typename U::V outer, mid;  // thresholds of the low and top fields, and of green
-  RowWords(const Dithering<L>&, int y) {
+  ZEL_INLINE RowWords(const Dithering<L>&, int y) {
     const int16_t* row = L::kLowBits == 4 ? kDitherMatrix4[y & 3] : kDitherMatrix5[y & 3];
     outer = U::repeated(repeat4(row, 0));
     mid = U::repeated(repeat4(row, L::kMidBits == 6 ? 1 : 0));
   }
-  typename U::V operator()(typename U::V low, typename U::V g, typename U::V top) const {
+  ZEL_INLINE typename U::V operator()(typename U::V low, typename U::V g, typename U::V top) const {
     return assembleLanes<U, L>(ditherLanes<U, L::kLowBits>(low, outer), ditherLanes<U, L::kMidBits>(g, mid),
                                ditherLanes<U, L::kTopBits>(top, outer));
   }
@@ -276,7 +276,7 @@ struct RowWords<U, Dithering<L>> {
 // Blocks of U::kWords pixels from x while they fit below `end`; returns
 // where it stopped.
 template <class U, class Src, class Form, class Writer>
-inline int wordBlocks(const Src& src, const Form& form, const Writer& writer, int y, uint16_t* dst, int x, int end) {
+ZEL_INLINE int wordBlocks(const Src& src, const Form& form, const Writer& writer, int y, uint16_t* dst, int x, int end) {
   const RowWords<U, Writer> words(writer, y);
   for (; x + U::kWords <= end; x += U::kWords) {
     const Trio<U> c = form.template lanes<U>(src.template block<U>(x));

@@ -33,7 +33,7 @@ inline bool same(Pixel8 a, Pixel8 b) { return a.c0 == b.c0 && a.c1 == b.c1 && a.
       return call(a, b, c);                               \
     }                                                     \
     template <class U>                                    \
-    Trio<U> vec(const Trio<U>& t) const {                 \
+    ZEL_INLINE Trio<U> vec(const Trio<U>& t) const {      \
       return call<U>(t);                                  \
     }                                                     \
   };

@@ -101,7 +101,7 @@ struct WideForm {
   RgbRounding rounding;
   Pixel8 scalar(int y, int u, int v) const { return rgbWide(*set, rounding, y, u, v); }
   template <class U>
-  Trio<U> vec(const Trio<U>& t) const {
+  ZEL_INLINE Trio<U> vec(const Trio<U>& t) const {
     return rgbWide<U>(*set, rounding, t);
   }
 };

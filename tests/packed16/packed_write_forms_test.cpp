@@ -83,9 +83,9 @@ TEST(PackedForms, WorkedValues) {
 
 // One block of the given form and reduction in unit U, from 16-bit samples.
 template <class U, class Form, class Writer>
-void blockWords(const Form& form, const Writer& writer, int y, const int16_t* s0, const int16_t* s1, const int16_t* s2,
+ZEL_INLINE void blockWords(const Form& form, const Writer& writer, int y, const int16_t* s0, const int16_t* s1, const int16_t* s2,
                 uint16_t* out) {
-  auto ld = [](const int16_t* p) {
+  auto ld = [](const int16_t* p) ZEL_LAMBDA_INLINE {
     if constexpr (U::kWords == 8) return zel::load128(p);
     else return zel::load256(p);
   };
