@@ -1,6 +1,6 @@
-// The banded Floyd-Steinberg kernel in two widths: four rows at a time in
-// SSE lanes, eight in AVX2 lanes. One source, diffusion_bands.inc, built
-// once per width.
+// The banded error diffusion kernels in two widths: eight rows at a time in
+// two SSE vectors of lanes, sixteen in two AVX2 vectors. One source,
+// diffusion_bands.inc, built once per width.
 #pragma once
 
 #include <algorithm>
@@ -26,7 +26,7 @@ struct Image {
 
 namespace sse {
 
-struct Lanes {
+struct One {
   static constexpr int n = 4;
   using F = __m128;
   using I = __m128i;
@@ -54,6 +54,10 @@ struct Lanes {
   static ZEL_INLINE F shiftIn(F v, float first) {
     return _mm_move_ss(_mm_castsi128_ps(_mm_slli_si128(_mm_castps_si128(v), 4)), _mm_set_ss(first));
   }
+  // Lanes up by one, the last lane of `below` into lane 0.
+  static ZEL_INLINE F shiftInFrom(F v, F below) {
+    return _mm_castsi128_ps(_mm_alignr_epi8(_mm_castps_si128(v), _mm_castps_si128(below), 12));
+  }
   template <typename G>
   static ZEL_INLINE F make(G g) {
     return _mm_setr_ps(g(0), g(1), g(2), g(3));
@@ -64,6 +68,7 @@ struct Lanes {
   }
 };
 
+#include "reduce_bits/diffusion_pair.inc"
 #include "reduce_bits/diffusion_bands.inc"
 
 }  // namespace sse
@@ -72,7 +77,7 @@ struct Lanes {
 #pragma GCC target("avx2")
 namespace avx2 {
 
-struct Lanes {
+struct One {
   static constexpr int n = 8;
   using F = __m256;
   using I = __m256i;
@@ -100,6 +105,10 @@ struct Lanes {
     const F up = _mm256_permutevar8x32_ps(v, _mm256_setr_epi32(0, 0, 1, 2, 3, 4, 5, 6));
     return _mm256_blend_ps(up, _mm256_set1_ps(first), 1);
   }
+  static ZEL_INLINE F shiftInFrom(F v, F below) {
+    const F up = _mm256_permutevar8x32_ps(v, _mm256_setr_epi32(0, 0, 1, 2, 3, 4, 5, 6));
+    return _mm256_blend_ps(up, _mm256_permutevar8x32_ps(below, _mm256_set1_epi32(7)), 1);
+  }
   template <typename G>
   static ZEL_INLINE F make(G g) {
     return _mm256_setr_ps(g(0), g(1), g(2), g(3), g(4), g(5), g(6), g(7));
@@ -110,6 +119,7 @@ struct Lanes {
   }
 };
 
+#include "reduce_bits/diffusion_pair.inc"
 #include "reduce_bits/diffusion_bands.inc"
 
 }  // namespace avx2

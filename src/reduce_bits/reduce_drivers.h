@@ -148,7 +148,7 @@ void floydSteinbergRows(const Image<typename M::Source, typename M::Dest>& im, f
     }
 }
 
-// The banded kernel, eight rows at a time with AVX2, else four. The row
+// The banded kernel, sixteen rows at a time with AVX2, else eight. The row
 // above a band is the first half of the block, written over in place.
 template <typename M, LayoutCode L, bool Noisy>
 void floydSteinbergBands(const Image<typename M::Source, typename M::Dest>& im, float* block, const QuantValues& qv,
