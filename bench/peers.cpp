@@ -144,6 +144,7 @@ const std::map<std::string, PeerFactory>& table() {
          std::vector<Peer> p;
 #ifdef ZELCC_BENCH_OPENCV
          p.push_back(cvtColorPeer("OpenCV cvtColor BayerBG2RGB", CV_8UC1, CV_8UC3, cv::COLOR_BayerBG2RGB));
+         p.push_back(cvtColorPeer("OpenCV cvtColor BayerBG2RGB_EA", CV_8UC1, CV_8UC3, cv::COLOR_BayerBG2RGB_EA));
 #endif
          return p;
        }},
@@ -348,6 +349,12 @@ const std::map<std::string, PeerFactory>& table() {
                                   f.v2.data(), kWidth / 2, kWidth, kHeight);
          });
        }},
+      {"zeliBGRToBGR565_8u16u_C3R",
+       [] {
+         return yuvPeer("libyuv ARGBToRGB565", [](YuvFrame& f) {
+           libyuv::ARGBToRGB565(f.argb.data(), kWidth * 4, f.packed2.data(), kWidth * 2, kWidth, kHeight);
+         });
+       }},
       {"zeliBGR565ToBGR_16u8u_C3R",
        [] {
          return yuvPeer("libyuv RGB565ToARGB", [](YuvFrame& f) {
@@ -496,7 +503,7 @@ std::vector<Peer> peersOf(const std::string& exportName) {
     if (exportName == row.exportName) out.push_back(cvtColorPeer(row.label, row.srcType, row.dstType, row.code));
   if (exportName == "zeliGammaFwd_8u_C3R" || exportName == "zeliGammaInv_8u_C3R") out.push_back(lutPeer());
   if (exportName == "zeliColorTwist32f_8u_C3R") out.push_back(transformPeer(CV_8UC3));
-  if (exportName == "zeliColorTwist32f_32f_C3R") out.push_back(transformPeer(CV_32FC3));
+  if (exportName == "zeliColorTwist_32f_C3R") out.push_back(transformPeer(CV_32FC3));
   if (exportName == "zeliToneMapLinear_32f8u_C1R") out.push_back(toneMapPeer());
 #endif
   return out;
@@ -508,7 +515,7 @@ std::vector<std::string> exportsWithPeers() {
 #ifdef ZELCC_BENCH_OPENCV
   for (const CvtRow& row : kCvtRows) out.push_back(row.exportName);
   for (const char* n : {"zeliGammaFwd_8u_C3R", "zeliGammaInv_8u_C3R", "zeliColorTwist32f_8u_C3R",
-                        "zeliColorTwist32f_32f_C3R", "zeliToneMapLinear_32f8u_C1R"})
+                        "zeliColorTwist_32f_C3R", "zeliToneMapLinear_32f8u_C1R"})
     out.push_back(n);
 #endif
   std::sort(out.begin(), out.end());

@@ -111,8 +111,8 @@ struct AvxWords : lc::Avx {
   ZEL_AVX2 static V pattern(const WordPattern& p) { return _mm256_broadcastsi128_si256(load128(p.b)); }
   ZEL_AVX2 static V bytes(const uint8_t* p) { return _mm256_cvtepu8_epi16(load128(p)); }
   ZEL_AVX2 static V halves(const uint8_t* p) {
-    const V t = _mm256_cvtepu8_epi32(load64(p));
-    return _mm256_or_si256(t, _mm256_slli_epi32(t, 16));
+    return _mm256_shuffle_epi8(_mm256_broadcastq_epi64(load64(p)), _mm256_setr_epi8(
+        0, -1, 0, -1, 1, -1, 1, -1, 2, -1, 2, -1, 3, -1, 3, -1, 4, -1, 4, -1, 5, -1, 5, -1, 6, -1, 6, -1, 7, -1, 7, -1));
   }
   ZEL_AVX2 static V quarters(const uint8_t* p) {
     const V t = _mm256_cvtepu8_epi64(load32(p));
@@ -194,21 +194,32 @@ struct Pairs {
 
 // ---- forms: three samples to clamped R, G, B ----
 
+// `sums` gives R, G, B before the clamp to 0..255, for reductions that
+// saturate on their own; `lanes` clamps them.
 struct YCbCrLanes {
   Rgb pixel(const Samples3& s) const { return ycbcrLaneForm(s.c0, s.c1, s.c2); }
   template <class U>
-  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
+  ZEL_INLINE Trio<U> sums(const Trio<U>& s) const {
     const lc::LaneRgb<U> r = lc::laneSubtracted<U>(lc::lanes601b, lc::lumaLanes<U>(s.c0), lc::chromaLanes<U>(s.c1),
                                                    lc::chromaLanes<U>(s.c2), 0);
-    return {U::clampU8(r.r), U::clampU8(r.g), U::clampU8(r.b)};
+    return {r.r, r.g, r.b};
+  }
+  template <class U>
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
+    const Trio<U> r = sums<U>(s);
+    return {U::clampU8(r.c0), U::clampU8(r.c1), U::clampU8(r.c2)};
   }
 };
 
 struct YuvLanes {
   Rgb pixel(const Samples3& s) const { return yuvLaneForm(s.c0, s.c1, s.c2); }
   template <class U>
+  ZEL_INLINE Trio<U> sums(const Trio<U>& s) const {
+    return lc::rgbLanesShape<4, 7, 0, 4, true, U>(kYuvPackedLanes, s);
+  }
+  template <class U>
   ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
-    const Trio<U> r = lc::rgbLanesShape<4, 7, 0, 4, true, U>(kYuvPackedLanes, s);
+    const Trio<U> r = sums<U>(s);
     return {U::clampU8(r.c0), U::clampU8(r.c1), U::clampU8(r.c2)};
   }
 };
@@ -229,13 +240,22 @@ ZEL_INLINE typename U::V truncateLanes(typename U::V c) {
   return U::template srl16<8 - Bits>(c);
 }
 
-// q + 1 where c * 256 - q * S exceeds the threshold; the difference always
-// fits a signed 16-bit lane, so wrapping products give it exactly.
+// A field width's multiplier M and level size S in all lanes. They are
+// hidden from the optimiser, which would otherwise spell some products out
+// in shifts and adds, longer than the one multiplication.
 template <class U, int Bits>
-ZEL_INLINE typename U::V ditherLanes(typename U::V c, typename U::V threshold) {
-  using L = DitherLevel<Bits>;
-  const typename U::V q = U::template srl16<8>(U::mulLo16(c, U::set16(L::kMultiplier)));
-  const typename U::V distance = U::sub16(U::template sll16<8>(c), U::mulLo16(q, U::set16(L::kSize)));
+struct DitherConstants {
+  typename U::V multiplier = U::set16(DitherLevel<Bits>::kMultiplier), size = U::set16(DitherLevel<Bits>::kSize);
+  ZEL_INLINE DitherConstants() { __asm__("" : "+x"(multiplier), "+x"(size)); }
+};
+
+// q + 1 where c * 256 - q * S exceeds the threshold, from c * 256 in the
+// lane: q = (c * M) >> 8 is the high half of c * 256 * M. The difference
+// always fits a signed 16-bit lane, so wrapping products give it exactly.
+template <class U, int Bits>
+ZEL_INLINE typename U::V ditherLanes(typename U::V c256, typename U::V threshold, const DitherConstants<U, Bits>& k) {
+  const typename U::V q = U::mulHighU16(c256, k.multiplier);
+  const typename U::V distance = U::sub16(c256, U::mulLo16(q, k.size));
   return U::sub16(q, U::greater16(distance, threshold));
 }
 
@@ -260,16 +280,35 @@ struct RowWords<U, Truncating<L>> {
 template <class U, class L>
 struct RowWords<U, Dithering<L>> {
   typename U::V outer, mid;  // thresholds of the low and top fields, and of green
+  DitherConstants<U, L::kLowBits> outerLevel;
+  DitherConstants<U, L::kMidBits> midLevel;
   ZEL_INLINE RowWords(const Dithering<L>&, int y) {
     const int16_t* row = L::kLowBits == 4 ? kDitherMatrix4[y & 3] : kDitherMatrix5[y & 3];
     outer = U::repeated(repeat4(row, 0));
     mid = U::repeated(repeat4(row, L::kMidBits == 6 ? 1 : 0));
   }
+  // Colours before or after their clamp: the unsigned packs saturate them
+  // to bytes, and unpacking the bytes above zeros gives each as c * 256.
   ZEL_INLINE typename U::V operator()(typename U::V low, typename U::V g, typename U::V top) const {
-    return assembleLanes<U, L>(ditherLanes<U, L::kLowBits>(low, outer), ditherLanes<U, L::kMidBits>(g, mid),
-                               ditherLanes<U, L::kTopBits>(top, outer));
+    const typename U::V outerBytes = U::packU8(low, top), greenBytes = U::packU8(g, g);
+    static_assert(L::kLowBits == L::kTopBits, "the low and top fields share their width");
+    return assembleLanes<U, L>(ditherLanes<U, L::kLowBits>(U::unpackLo8(U::zero(), outerBytes), outer, outerLevel),
+                               ditherLanes<U, L::kMidBits>(U::unpackLo8(U::zero(), greenBytes), mid, midLevel),
+                               ditherLanes<U, L::kTopBits>(U::unpackHi8(U::zero(), outerBytes), outer, outerLevel));
   }
 };
+
+// One block's words from its samples: dithering reductions saturate the
+// form's sums themselves, truncating ones take the clamped colours.
+template <class U, class Form, class Writer>
+ZEL_INLINE typename U::V wordsOfBlock(const Trio<U>& samples, const Form& form, const Writer& writer,
+                                const RowWords<U, Writer>& words) {
+  Trio<U> c;
+  if constexpr (Writer::kDither) c = form.template sums<U>(samples);
+  else c = form.template lanes<U>(samples);
+  const typename U::V low = writer.redHigh ? c.c2 : c.c0, top = writer.redHigh ? c.c0 : c.c2;
+  return words(low, c.c1, top);
+}
 
 // ---- the block loop ----
 
@@ -278,11 +317,11 @@ struct RowWords<U, Dithering<L>> {
 template <class U, class Src, class Form, class Writer>
 ZEL_INLINE int wordBlocks(const Src& src, const Form& form, const Writer& writer, int y, uint16_t* dst, int x, int end) {
   const RowWords<U, Writer> words(writer, y);
-  for (; x + U::kWords <= end; x += U::kWords) {
-    const Trio<U> c = form.template lanes<U>(src.template block<U>(x));
-    const typename U::V low = writer.redHigh ? c.c2 : c.c0, top = writer.redHigh ? c.c0 : c.c2;
-    U::storeWords(dst + x, words(low, c.c1, top));
-  }
+  // Copies that no store into the row can reach.
+  const Src row = src;
+  const Writer target = writer;
+  for (; x + U::kWords <= end; x += U::kWords)
+    U::storeWords(dst + x, wordsOfBlock<U>(row.template block<U>(x), form, target, words));
   return x;
 }
 

@@ -15,6 +15,7 @@
 
 #include <cstdint>
 #include <cstring>
+#include <type_traits>
 
 #include "frame/simd.h"
 
@@ -296,10 +297,17 @@ ZEL_LANE_AVX2 I8 iselect(I8 mask, I8 a, I8 b) { return {_mm256_blendv_epi8(b.v, 
 ZEL_LANE_AVX2 I8 iselect(F8 mask, I8 a, I8 b) { return iselect(asInt(mask), a, b); }
 ZEL_LANE_AVX2 I8 multiplyAddPairs(I8 a, I8 b) { return {_mm256_madd_epi16(a.v, b.v)}; }
 
+// Eight pairs, each one 64-bit read: cheaper than two gathers of floats.
 ZEL_LANE_AVX2 void gatherPairs(const float (*table)[2], I8 index, F8& c, F8& w) {
-  const __m256i at = _mm256_slli_epi32(index.v, 1);
-  c.v = _mm256_i32gather_ps(&table[0][0], at, 4);
-  w.v = _mm256_i32gather_ps(&table[0][1], at, 4);
+  alignas(32) int32_t at[8];
+  _mm256_store_si256(reinterpret_cast<__m256i*>(at), index.v);
+  auto pair = [&](int k) { return _mm_castpd_ps(_mm_load_sd(reinterpret_cast<const double*>(table[at[k]]))); };
+  auto high = [&](__m128 lo, int k) { return _mm_loadh_pi(lo, reinterpret_cast<const __m64*>(table[at[k]])); };
+  // [c0 w0 c1 w1 | c4 w4 c5 w5] and [c2 w2 c3 w3 | c6 w6 c7 w7].
+  const __m256 a = _mm256_insertf128_ps(_mm256_castps128_ps256(high(pair(0), 1)), high(pair(4), 5), 1);
+  const __m256 b = _mm256_insertf128_ps(_mm256_castps128_ps256(high(pair(2), 3)), high(pair(6), 7), 1);
+  c.v = _mm256_shuffle_ps(a, b, _MM_SHUFFLE(2, 0, 2, 0));
+  w.v = _mm256_shuffle_ps(a, b, _MM_SHUFFLE(3, 1, 3, 1));
 }
 
 // Eight pixels are two blocks of four.
@@ -307,16 +315,78 @@ ZEL_LANE_AVX2 I8 join(I4 lo, I4 hi) { return {_mm256_inserti128_si256(_mm256_cas
 ZEL_LANE_AVX2 I4 lowHalf(I8 a) { return {_mm256_castsi256_si128(a.v)}; }
 ZEL_LANE_AVX2 I4 highHalf(I8 a) { return {_mm256_extracti128_si256(a.v, 1)}; }
 
+// Eight byte pixels of three samples, 24 bytes: the first four pixels in
+// the low half of a vector, the last four in the high half at the same
+// places, so one byte shuffle a channel serves both halves.
+ZEL_LANE_AVX2 void loadBytes3(const uint8_t* p, I8& c0, I8& c1, I8& c2) {
+  const __m128i lo = _mm_loadu_si128(reinterpret_cast<const __m128i*>(p));
+  const __m128i hi = _mm_alignr_epi8(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(p + 16)), lo, 12);
+  const __m256i v = _mm256_inserti128_si256(_mm256_castsi128_si256(lo), hi, 1);
+  c0.v = _mm256_shuffle_epi8(v, _mm256_setr_epi8(0, -1, -1, -1, 3, -1, -1, -1, 6, -1, -1, -1, 9, -1, -1, -1, 0, -1, -1,
+                                                 -1, 3, -1, -1, -1, 6, -1, -1, -1, 9, -1, -1, -1));
+  c1.v = _mm256_shuffle_epi8(v, _mm256_setr_epi8(1, -1, -1, -1, 4, -1, -1, -1, 7, -1, -1, -1, 10, -1, -1, -1, 1, -1,
+                                                 -1, -1, 4, -1, -1, -1, 7, -1, -1, -1, 10, -1, -1, -1));
+  c2.v = _mm256_shuffle_epi8(v, _mm256_setr_epi8(2, -1, -1, -1, 5, -1, -1, -1, 8, -1, -1, -1, 11, -1, -1, -1, 2, -1,
+                                                 -1, -1, 5, -1, -1, -1, 8, -1, -1, -1, 11, -1, -1, -1));
+}
+
+// The low byte of each lane back to its place; 24 bytes written.
+ZEL_LANE_AVX2 void storeBytes3(uint8_t* p, I8 c0, I8 c1, I8 c2) {
+  const __m256i v = _mm256_or_si256(
+      _mm256_or_si256(_mm256_shuffle_epi8(c0.v, _mm256_setr_epi8(0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1, -1,
+                                                                 -1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1,
+                                                                 -1, -1, -1)),
+                      _mm256_shuffle_epi8(c1.v, _mm256_setr_epi8(-1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1,
+                                                                 -1, -1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1,
+                                                                 -1, -1, -1))),
+      _mm256_shuffle_epi8(c2.v, _mm256_setr_epi8(-1, -1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1, -1, -1, 0,
+                                                 -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1)));
+  const __m128i lo = _mm256_castsi256_si128(v), hi = _mm256_extracti128_si256(v, 1);
+  _mm_storeu_si128(reinterpret_cast<__m128i*>(p), _mm_or_si128(lo, _mm_slli_si128(hi, 12)));
+  _mm_storel_epi64(reinterpret_cast<__m128i*>(p + 16), _mm_srli_si128(hi, 4));
+}
+
 template <int Stride, bool Bias16, typename T>
 ZEL_LANE_AVX2 void loadRaw(const T* p, I8& c0, I8& c1, I8& c2) {
+  if constexpr (Stride == 3 && sizeof(T) == 1) {
+    loadBytes3(p, c0, c1, c2);
+    return;
+  }
   I4 a0, a1, a2, b0, b1, b2;
   loadRaw<Stride, Bias16>(p, a0, a1, a2);
   loadRaw<Stride, Bias16>(p + 4 * Stride, b0, b1, b2);
   c0 = join(a0, b0), c1 = join(a1, b1), c2 = join(a2, b2);
 }
 
+// Eight float pixels of three samples are three whole vectors: each
+// channel is picked from the three by two blends (its samples sit at
+// distinct places of the three) and put in pixel order by one permute.
+// Storing is the same the other way round.
+ZEL_LANE_AVX2 void loadFloat3(const float* p, F8& c0, F8& c1, F8& c2) {
+  const __m256 v0 = _mm256_loadu_ps(p), v1 = _mm256_loadu_ps(p + 8), v2 = _mm256_loadu_ps(p + 16);
+  const __m256 a = _mm256_blend_ps(_mm256_blend_ps(v0, v1, 0x92), v2, 0x24);
+  const __m256 b = _mm256_blend_ps(_mm256_blend_ps(v0, v1, 0x24), v2, 0x49);
+  const __m256 c = _mm256_blend_ps(_mm256_blend_ps(v0, v1, 0x49), v2, 0x92);
+  c0.v = _mm256_permutevar8x32_ps(a, _mm256_setr_epi32(0, 3, 6, 1, 4, 7, 2, 5));
+  c1.v = _mm256_permutevar8x32_ps(b, _mm256_setr_epi32(1, 4, 7, 2, 5, 0, 3, 6));
+  c2.v = _mm256_permutevar8x32_ps(c, _mm256_setr_epi32(2, 5, 0, 3, 6, 1, 4, 7));
+}
+
+ZEL_LANE_AVX2 void storeFloat3(float* p, F8 c0, F8 c1, F8 c2) {
+  const __m256 a = _mm256_permutevar8x32_ps(c0.v, _mm256_setr_epi32(0, 3, 6, 1, 4, 7, 2, 5));
+  const __m256 b = _mm256_permutevar8x32_ps(c1.v, _mm256_setr_epi32(5, 0, 3, 6, 1, 4, 7, 2));
+  const __m256 c = _mm256_permutevar8x32_ps(c2.v, _mm256_setr_epi32(2, 5, 0, 3, 6, 1, 4, 7));
+  _mm256_storeu_ps(p, _mm256_blend_ps(_mm256_blend_ps(a, b, 0x92), c, 0x24));
+  _mm256_storeu_ps(p + 8, _mm256_blend_ps(_mm256_blend_ps(c, a, 0x92), b, 0x24));
+  _mm256_storeu_ps(p + 16, _mm256_blend_ps(_mm256_blend_ps(b, c, 0x92), a, 0x24));
+}
+
 template <int Stride, bool Bias16, typename T>
 ZEL_LANE_AVX2 void loadPixels(const T* p, F8& c0, F8& c1, F8& c2) {
+  if constexpr (std::is_same_v<T, float> && Stride == 3) {
+    loadFloat3(p, c0, c1, c2);
+    return;
+  }
   I8 r0, r1, r2;
   loadRaw<Stride, Bias16>(p, r0, r1, r2);
   if constexpr (sizeof(T) == 4) {
@@ -328,14 +398,28 @@ ZEL_LANE_AVX2 void loadPixels(const T* p, F8& c0, F8& c1, F8& c2) {
 
 template <int Stride, bool Bias16, typename T>
 ZEL_LANE_AVX2 void storeRaw(T* p, I8 c0, I8 c1, I8 c2) {
+  if constexpr (Stride == 3 && sizeof(T) == 1) {
+    storeBytes3(p, c0, c1, c2);
+    return;
+  }
   storeRaw<Stride, Bias16>(p, lowHalf(c0), lowHalf(c1), lowHalf(c2));
   storeRaw<Stride, Bias16>(p + 4 * Stride, highHalf(c0), highHalf(c1), highHalf(c2));
 }
 
 template <int Stride>
 ZEL_LANE_AVX2 void storePixels(float* p, F8 c0, F8 c1, F8 c2) {
-  storeRaw<Stride, false>(p, asInt(c0), asInt(c1), asInt(c2));
+  if constexpr (Stride == 3) storeFloat3(p, c0, c1, c2);
+  else storeRaw<Stride, false>(p, asInt(c0), asInt(c1), asInt(c2));
 }
+
+// Integer lanes stored as bytes saturated to 0..255 (SaturateS16 then
+// SaturateU8, which together clamp any int32 to 0..255). Eight pixels of
+// three bytes pack with saturation and take one shuffle; other shapes clamp
+// and store the low bytes.
+template <int Stride>
+ZEL_LANE void storeClampedBytes(uint8_t* p, I4 c0, I4 c1, I4 c2);
+template <int Stride>
+ZEL_LANE_AVX2 void storeClampedBytes(uint8_t* p, I8 c0, I8 c1, I8 c2);
 
 // Integer results clamped to the range of a sample: SaturateU8 (also after
 // SaturateS16, which it absorbs) and SaturateU16.
@@ -343,5 +427,25 @@ ZEL_LANE I4 clampToByte(I4 x) { return imax(imin(x, I4::splat(255)), I4::splat(0
 ZEL_LANE I4 clampToWord(I4 x) { return imax(imin(x, I4::splat(65535)), I4::splat(0)); }
 ZEL_LANE_AVX2 I8 clampToByte(I8 x) { return imax(imin(x, I8::splat(255)), I8::splat(0)); }
 ZEL_LANE_AVX2 I8 clampToWord(I8 x) { return imax(imin(x, I8::splat(65535)), I8::splat(0)); }
+
+template <int Stride>
+ZEL_LANE void storeClampedBytes(uint8_t* p, I4 c0, I4 c1, I4 c2) {
+  storeRaw<Stride, false>(p, clampToByte(c0), clampToByte(c1), clampToByte(c2));
+}
+template <int Stride>
+ZEL_LANE_AVX2 void storeClampedBytes(uint8_t* p, I8 c0, I8 c1, I8 c2) {
+  if constexpr (Stride == 3) {
+    // Per half: c0 of four pixels, c1, c2, c2 again, as saturated bytes.
+    const __m256i words01 = _mm256_packs_epi32(c0.v, c1.v), words22 = _mm256_packs_epi32(c2.v, c2.v);
+    const __m256i bytes = _mm256_packus_epi16(words01, words22);
+    const __m256i v = _mm256_shuffle_epi8(bytes, _mm256_setr_epi8(0, 4, 8, 1, 5, 9, 2, 6, 10, 3, 7, 11, -1, -1, -1, -1, 0,
+                                                                  4, 8, 1, 5, 9, 2, 6, 10, 3, 7, 11, -1, -1, -1, -1));
+    const __m128i lo = _mm256_castsi256_si128(v), hi = _mm256_extracti128_si256(v, 1);
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(p), _mm_or_si128(lo, _mm_slli_si128(hi, 12)));
+    _mm_storel_epi64(reinterpret_cast<__m128i*>(p + 16), _mm_srli_si128(hi, 4));
+  } else {
+    storeRaw<Stride, false>(p, clampToByte(c0), clampToByte(c1), clampToByte(c2));
+  }
+}
 
 }  // namespace zel::lanes

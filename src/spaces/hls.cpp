@@ -8,6 +8,7 @@
 #include "frame/image_layout.h"
 #include "frame/row_driver.h"
 #include "frame/simd.h"
+#include "spaces/float_lanes.h"
 #include "spaces/hls_formulas.h"
 #include "spaces/hls_rows.h"
 
@@ -40,6 +41,12 @@ struct Sse {
   static I lowBits(I v, int max) { return _mm_and_si128(v, _mm_set1_epi32(max)); }
   static I join(const __m128i* parts) { return parts[0]; }
   static __m128i part(I v, int) { return v; }
+  // Whole vectors of three-float pixels: only with eight lanes.
+  static constexpr bool kWholeFloat3 = false;
+  static void loadFloat3(const float*, F*) {}
+  static void storeFloat3(float*, const F*) {}
+  static void loadBytes3(const uint8_t*, F*) {}
+  static void storeBytes3(uint8_t*, const I*) {}
 };
 
 namespace sse41 {
@@ -78,6 +85,21 @@ struct Avx {
   static I lowBits(I v, int max) { return _mm256_and_si256(v, _mm256_set1_epi32(max)); }
   static I join(const __m128i* parts) { return _mm256_set_m128i(parts[1], parts[0]); }
   static __m128i part(I v, int k) { return k == 0 ? _mm256_castsi256_si128(v) : _mm256_extracti128_si256(v, 1); }
+  static constexpr bool kWholeFloat3 = true;
+  static void loadFloat3(const float* p, F* c) {
+    lanes::F8 c0, c1, c2;
+    lanes::loadFloat3(p, c0, c1, c2);
+    c[0] = c0.v, c[1] = c1.v, c[2] = c2.v;
+  }
+  static void storeFloat3(float* p, const F* c) { lanes::storeFloat3(p, {c[0]}, {c[1]}, {c[2]}); }
+  // Eight pixels of three bytes as float lanes, and integer lanes (already
+  // clamped) back to their low bytes.
+  static void loadBytes3(const uint8_t* p, F* c) {
+    lanes::I8 c0, c1, c2;
+    lanes::loadBytes3(p, c0, c1, c2);
+    c[0] = _mm256_cvtepi32_ps(c0.v), c[1] = _mm256_cvtepi32_ps(c1.v), c[2] = _mm256_cvtepi32_ps(c2.v);
+  }
+  static void storeBytes3(uint8_t* p, const I* c) { lanes::storeBytes3(p, {c[0]}, {c[1]}, {c[2]}); }
 };
 
 namespace avx2 {

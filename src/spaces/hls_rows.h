@@ -43,6 +43,7 @@ inline T fromBits(uint32_t b) {
 template <typename T, int Ch>
 struct Packed {
   using Sample = T;
+  static constexpr int kChannels = Ch;
   using Group = PixelGroup<int(sizeof(T)), Ch, 4>;
   uint8_t* base;
   int step;
@@ -85,6 +86,7 @@ struct PackedSkipAlpha : Packed<T, 4> {
 template <typename T, int Planes>
 struct Planar {
   using Sample = T;
+  static constexpr int kChannels = 0;
   static constexpr int kPlanes = Planes;
   uint8_t* base[Planes];
   int step;

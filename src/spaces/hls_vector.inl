@@ -52,6 +52,19 @@ inline int forwardGroups(const typename M::In& in, const typename M::Out& out, i
   using F = typename V::F;
   using I = typename V::I;
   constexpr int kStep = 4 * V::kGroups;
+  if constexpr (V::kWholeFloat3 && std::is_same_v<typename M::In, Packed<uint8_t, 3>> &&
+                std::is_same_v<typename M::Out, Packed<uint8_t, 3>>) {
+    // Eight pixels of three bytes: one load and one shuffle a channel, the
+    // clamped results back the same way.
+    for (; x + kStep <= end; x += kStep) {
+      F colour[3];
+      I hls[3];
+      V::loadBytes3(in.pixel(x), colour);
+      forwardLanes<V, typename M::BodyRecipe>(colour[M::kRedAt], colour[1], colour[2 - M::kRedAt], hls);
+      V::storeBytes3(out.pixel(x), hls);
+    }
+    return x;
+  }
   const __m128i bias = _mm_set1_epi32(0x8000);
   for (; x + kStep <= end; x += kStep) {
     __m128i raw[V::kGroups][4];
@@ -87,7 +100,9 @@ inline void forwardFloatLanes(typename V::F r, typename V::F g, typename V::F b,
   const F spread = V::sub(mx, mn), sum = V::add(mx, mn);
   const F light = V::mul(sum, half);
   const F flat = V::le(spread, V::set(kFlatLimit));
-  const F sat = V::select(V::le(light, half), V::div(spread, sum), V::div(spread, V::sub(V::set(2.0f), sum)));
+  // One division with the divisor chosen first: the same quotient as
+  // choosing between the two.
+  const F sat = V::div(spread, V::select(V::le(light, half), sum, V::sub(V::set(2.0f), sum)));
   const F isR = V::eq(r, mx);
   const F isG = V::andNot(isR, V::eq(g, mx));
   const F diff = V::select(isR, V::sub(g, b), V::select(isG, V::sub(b, r), V::sub(r, g)));
@@ -102,6 +117,16 @@ inline void forwardFloatLanes(typename V::F r, typename V::F g, typename V::F b,
 template <class V, class In, class Out>
 inline int forwardFloatGroups(const In& in, const Out& out, int x, int end) {
   constexpr int kStep = 4 * V::kGroups;
+  if constexpr (V::kWholeFloat3 && In::kChannels == 3) {
+    // Eight whole pixels of three floats: three vectors in, three out.
+    for (; x + kStep <= end; x += kStep) {
+      typename V::F colour[3], hls[3];
+      V::loadFloat3(in.pixel(x), colour);
+      forwardFloatLanes<V>(colour[0], colour[1], colour[2], hls);
+      V::storeFloat3(out.pixel(x), hls);
+    }
+    return x;
+  }
   for (; x + kStep <= end; x += kStep) {
     __m128i raw[V::kGroups][4];
     for (int k = 0; k < V::kGroups; ++k) in.template load<3>(x + 4 * k, raw[k]);
@@ -133,10 +158,14 @@ inline typename V::F riseLanes(typename V::F low, typename V::F dm, typename V::
 template <class V, class R>
 inline typename V::F levelLanes(typename V::F h, typename V::F low, typename V::F high, typename V::F dm) {
   using F = typename V::F;
-  F v = low;
-  v = V::select(V::lt(h, V::set(240.0f)), riseLanes<V, R>(low, dm, V::sub(V::set(240.0f), h)), v);
+  // The two sloped bands are one formula of their distance from the band's
+  // low end: h below 60, 240 - h from 180 to 240. That distance is chosen
+  // first and the slope evaluated once.
+  const F below60 = V::lt(h, V::set(60.0f));
+  const F rise = riseLanes<V, R>(low, dm, V::select(below60, h, V::sub(V::set(240.0f), h)));
+  F v = V::select(V::lt(h, V::set(240.0f)), rise, low);
   v = V::select(V::lt(h, V::set(180.0f)), high, v);
-  return V::select(V::lt(h, V::set(60.0f)), riseLanes<V, R>(low, dm, h), v);
+  return V::select(below60, rise, v);
 }
 
 // Levels of R, G, B from hue in degrees, l and s.
@@ -179,6 +208,21 @@ inline int inverseGroups(const typename M::In& in, const typename M::Out& out, i
   using R = typename M::BodyRecipe;
   static_assert(R::kGrey != Grey::CopyL || R::kOutput == Output::Level, "blocks copy L only as a float");
   constexpr int kStep = 4 * V::kGroups;
+  if constexpr (V::kWholeFloat3 && M::kFloat && M::In::kChannels == 3 && M::Out::kChannels == 3) {
+    static_assert(R::kScale == Scale::Float && R::kGrey == Grey::CopyL && R::kOutput == Output::Level);
+    for (; x + kStep <= end; x += kStep) {
+      F hls[3], level[3];
+      V::loadFloat3(in.pixel(x), hls);
+      const F h = V::mul(hls[0], V::set(360.0f)), l = hls[1], s = hls[2];
+      levelLanesOf<V, R>(h, l, s, level);
+      const F grey = V::eq(s, V::set(0.0f));
+      F rgb[3];
+      for (int c = 0; c < 3; ++c) rgb[c] = V::select(grey, hls[1], level[c]);
+      const F ordered[3] = {rgb[M::kRedAt], rgb[1], rgb[2 - M::kRedAt]};
+      V::storeFloat3(out.pixel(x), ordered);
+    }
+    return x;
+  }
   const __m128i bias = _mm_set1_epi32(0x8000);
   for (; x + kStep <= end; x += kStep) {
     __m128i raw[V::kGroups][4];

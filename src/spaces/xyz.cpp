@@ -38,6 +38,12 @@ int rgbToXyzBlocks32f(Lanes lanes, const float* src, float* dst, int n) {
                               : sse::rgbToXyzBlocks32f<lanes::F4, Stride>(src, dst, n);
 }
 
+template <int Stride>
+int xyzToRgbBlocks32f(Lanes lanes, const float* src, float* dst, int n) {
+  return lanes == Lanes::Avx2 ? avx2::xyzToRgbBlocks32f<lanes::F8, Stride>(src, dst, n)
+                              : sse::xyzToRgbBlocks32f<lanes::F4, Stride>(src, dst, n);
+}
+
 template int rgbToXyzBlocks8u<3>(Lanes, const uint8_t*, uint8_t*, int);
 template int rgbToXyzBlocks8u<4>(Lanes, const uint8_t*, uint8_t*, int);
 template int xyzToRgbBlocks8u<3>(Lanes, const uint8_t*, uint8_t*, int);
@@ -52,6 +58,8 @@ template int xyzToRgbBlocks16<3, int16_t>(Lanes, const int16_t*, int16_t*, int);
 template int xyzToRgbBlocks16<4, int16_t>(Lanes, const int16_t*, int16_t*, int);
 template int rgbToXyzBlocks32f<3>(Lanes, const float*, float*, int);
 template int rgbToXyzBlocks32f<4>(Lanes, const float*, float*, int);
+template int xyzToRgbBlocks32f<3>(Lanes, const float*, float*, int);
+template int xyzToRgbBlocks32f<4>(Lanes, const float*, float*, int);
 
 namespace {
 
@@ -95,10 +103,12 @@ void rgbToXyzRow32f(const float* s, float* d, int width) {
   splitRow<Stride, Stride>(s, d, width, 4, rgbToXyzBlocks32f<Stride>,
                            [](const float* p, float* q) { floatPixel(p, q, rgbToXyz32f); });
 }
-// No block form: one pixel at a time.
+// One formula for every pixel: the vector lanes compute exactly what the
+// pixel-by-pixel form does, and the pixels after the last block take it.
 template <int Stride>
 void xyzToRgbRow32f(const float* s, float* d, int width) {
-  for (int x = 0; x < width; ++x) floatPixel(s + x * Stride, d + x * Stride, xyzToRgb32f);
+  splitRow<Stride, Stride>(s, d, width, 4, xyzToRgbBlocks32f<Stride>,
+                           [](const float* p, float* q) { floatPixel(p, q, xyzToRgb32f); });
 }
 
 template <typename T, typename Row>

@@ -19,5 +19,8 @@ template <int Stride, typename T>
 int xyzToRgbBlocks16(Lanes lanes, const T* src, T* dst, int n);
 template <int Stride>
 int rgbToXyzBlocks32f(Lanes lanes, const float* src, float* dst, int n);
+// The inverse has no zones: every pixel takes the one clamped formula.
+template <int Stride>
+int xyzToRgbBlocks32f(Lanes lanes, const float* src, float* dst, int n);
 
 }  // namespace zel::spaces::xyz

@@ -89,8 +89,7 @@ ZEL_INLINE void blockWords(const Form& form, const Writer& writer, int y, const 
     if constexpr (U::kWords == 8) return zel::load128(p);
     else return zel::load256(p);
   };
-  const Trio<U> c = form.template lanes<U>(Trio<U>{ld(s0), ld(s1), ld(s2)});
-  U::storeWords(out, RowWords<U, Writer>(writer, y)(writer.redHigh ? c.c2 : c.c0, c.c1, writer.redHigh ? c.c0 : c.c2));
+  U::storeWords(out, wordsOfBlock<U>(Trio<U>{ld(s0), ld(s1), ld(s2)}, form, writer, RowWords<U, Writer>(writer, y)));
 }
 
 template <class Form, class Writer>

@@ -49,6 +49,25 @@ TEST(GammaEightBit, MembersReadTheTables) {
   for (int i = 0; i < 1024; ++i) EXPECT_EQ(px[i], i < 768 ? kInverse8[(i / 4)] : i / 4) << i;
 }
 
+TEST(GammaEightBit, EveryWidthAndOffsetReadsTheTableAndStopsAtTheRowEnd) {
+  // Runs of eight samples, then single ones; rows that start off word
+  // boundaries; the padding after each row untouched.
+  std::mt19937 rng(5);
+  for (int width = 1; width <= 23; ++width)
+    for (int offset : {0, 1, 3}) {
+      const int rowBytes = width * 3, step = rowBytes + 5, height = 3;
+      std::vector<uint8_t> src(offset + step * height), dst(src.size(), 0xA5);
+      for (auto& v : src) v = uint8_t(rng());
+      ASSERT_EQ(zeliGammaInv_8u_C3R(src.data() + offset, step, dst.data() + offset, step, ImageSize{width, height}),
+                StatusOk);
+      for (int i = 0; i < int(src.size()); ++i) {
+        const int at = i - offset, x = at % step;
+        const bool inRow = at >= 0 && x < rowBytes;
+        ASSERT_EQ(dst[i], inRow ? kInverse8[src[i]] : 0xA5) << width << " " << offset << " " << i;
+      }
+    }
+}
+
 TEST(GammaSixteenBit, RoundingIsOnTheFloatOfHalfPlusY) {
   EXPECT_EQ(roundHalfEven16(2.5), 2);
   EXPECT_EQ(roundHalfEven16(3.5), 4);

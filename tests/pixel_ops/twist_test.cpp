@@ -5,6 +5,8 @@
 
 #include <algorithm>
 #include <cstring>
+#include <iterator>
+#include <limits>
 #include <random>
 #include <type_traits>
 #include <vector>
@@ -19,11 +21,16 @@ namespace {
 using namespace zel::twist;
 using zel::test::TestImage;
 
+// A weight of 0 asks for entries drawn from non-finite, huge and ordinary
+// values, so that the clamps meet infinities, NaN and overflowing sums.
 Matrix randomMatrix(std::mt19937& rng, float weight, float constant) {
   std::uniform_real_distribution<float> w(-weight, weight), c(-constant, constant);
+  const float inf = std::numeric_limits<float>::infinity(), nan = std::numeric_limits<float>::quiet_NaN();
+  const float special[] = {inf, -inf, nan, 3e9f, -3e9f, 1e30f, -1e30f, 0.5f, -0.75f, 1.0f, 127.5f, -300.0f, 0.0f};
   Matrix m{};
   for (int i = 0; i < 4; ++i)
-    for (int j = 0; j < 4; ++j) m.t[i][j] = j == 3 ? c(rng) : w(rng);
+    for (int j = 0; j < 4; ++j)
+      m.t[i][j] = weight == 0 ? special[rng() % std::size(special)] : j == 3 ? c(rng) : w(rng);
   return m;
 }
 
@@ -96,6 +103,13 @@ TEST(TwistKernels, BlocksMatchTheFormulaOfEveryType) {
   checkAllLayouts<uint16_t>(1.5f, 40000.0f);
   checkAllLayouts<int16_t>(1.5f, 40000.0f);
   checkAllLayouts<float>(2.0f, 1.0f);
+}
+
+TEST(TwistKernels, NonFiniteAndHugeEntriesClampAlikeInBlocksAndTails) {
+  checkAllLayouts<uint8_t>(0, 0);
+  checkAllLayouts<int8_t>(0, 0);
+  checkAllLayouts<uint16_t>(0, 0);
+  checkAllLayouts<int16_t>(0, 0);
 }
 
 TEST(TwistKernels, FloatRunsMatchTheFormula) {

@@ -1,6 +1,7 @@
 // RGB and XYZ: reference pixels, the two fixed-point zones of 8u, every
 // member against its formulas, the vector bodies against the body formulas.
 #include <gtest/gtest.h>
+#include <limits>
 
 #include "spaces/xyz_formulas.h"
 #include "spaces/xyz_kernels.h"
@@ -161,18 +162,20 @@ TEST(XyzMembers, FollowTheirFormulasInEveryZone) {
       wide(M16s("XYZToRGB_16s_AC4", zeliXYZToRGB_16s_AC4R), xyzToRgbBlocks16<4, int16_t>,
            levelsPixel<int16_t, xyzToRgb16>, 4),
   });
-  // Float: the inverse has no block form.
+  // Float: the inverse has one formula for every pixel, so its vector body
+  // is held to it too; some samples are NaN, which the clamps let through.
+  auto withNaN = [](std::mt19937& rng) {
+    return rng() % 16 == 0 ? std::numeric_limits<float>::quiet_NaN() : wideFloat(rng);
+  };
   zel::test::expectMembers<float, float>({
       wide(M32("RGBToXYZ_32f_C3", zeliRGBToXYZ_32f_C3R), rgbToXyzBlocks32f<3>, floatsPixel<rgbToXyz32f>, 3)
           .samples(wideFloat),
       wide(M32("RGBToXYZ_32f_AC4", zeliRGBToXYZ_32f_AC4R), rgbToXyzBlocks32f<4>, floatsPixel<rgbToXyz32f>, 4)
           .samples(wideFloat),
-      M32("XYZToRGB_32f_C3", zeliXYZToRGB_32f_C3R).oneFormula(floatsPixel<xyzToRgb32f>).stepsInSamples().samples(wideFloat),
-      M32("XYZToRGB_32f_AC4", zeliXYZToRGB_32f_AC4R)
-          .stride(4)
-          .oneFormula(floatsPixel<xyzToRgb32f>)
-          .stepsInSamples()
-          .samples(wideFloat),
+      wide(M32("XYZToRGB_32f_C3", zeliXYZToRGB_32f_C3R), xyzToRgbBlocks32f<3>, floatsPixel<xyzToRgb32f>, 3)
+          .samples(withNaN),
+      wide(M32("XYZToRGB_32f_AC4", zeliXYZToRGB_32f_AC4R), xyzToRgbBlocks32f<4>, floatsPixel<xyzToRgb32f>, 4)
+          .samples(withNaN),
   });
 }
 

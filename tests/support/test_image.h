@@ -25,14 +25,14 @@ class TestImage {
   T* data() { return reinterpret_cast<T*>(first_); }
   const T* data() const { return reinterpret_cast<const T*>(first_); }
   int step() const { return step_; }
-  T* row(int y) { return reinterpret_cast<T*>(first_ + size_t(y) * step_); }
-  const T* row(int y) const { return reinterpret_cast<const T*>(first_ + size_t(y) * step_); }
+  T* row(int y) { return reinterpret_cast<T*>(first_ + ptrdiff_t(y) * step_); }
+  const T* row(int y) const { return reinterpret_cast<const T*>(first_ + ptrdiff_t(y) * step_); }
   T get(int x, int y) const {
     T v;
-    std::memcpy(&v, first_ + size_t(y) * step_ + size_t(x) * sizeof(T), sizeof(T));
+    std::memcpy(&v, first_ + ptrdiff_t(y) * step_ + ptrdiff_t(x) * ptrdiff_t(sizeof(T)), sizeof(T));
     return v;
   }
-  void set(int x, int y, T v) { std::memcpy(first_ + size_t(y) * step_ + size_t(x) * sizeof(T), &v, sizeof(T)); }
+  void set(int x, int y, T v) { std::memcpy(first_ + ptrdiff_t(y) * step_ + ptrdiff_t(x) * ptrdiff_t(sizeof(T)), &v, sizeof(T)); }
   // Random samples; floats uniform in [lo, hi].
   void fillRandom(uint32_t seed, double lo = 0, double hi = 1) {
     std::mt19937 rng(seed);
