@@ -14,6 +14,8 @@
 #include <map>
 #include <memory>
 #include <regex>
+#include <string>
+#include <utility>
 
 #include "frame/descriptor.h"
 #include "peers.h"
@@ -50,6 +52,26 @@ struct Row {
   std::string exportName;
   std::vector<std::string> peerLabels;
 };
+
+// Named extra rows of one export: the same call with some family arguments
+// set otherwise, for members whose speed depends on them (a dither kind).
+struct Variant {
+  std::string label;                                  // "fs"
+  std::vector<std::pair<std::string, double>> values;  // family argument, value
+};
+
+std::vector<Variant> variantsOf(const Descriptor& d) {
+  if (d.name.rfind("zeliReduceBits_8u1u", 0) == 0)
+    return {{"threshold", {{"ditherKind", 0}}}, {"stucki", {{"ditherKind", 3}}}};
+  if (d.name.rfind("zeliReduceBits_", 0) == 0)
+    return {{"plain", {{"noise", 0}, {"ditherKind", 0}}},
+            {"fs", {{"noise", 0}, {"ditherKind", 1}}},
+            {"jjn", {{"noise", 0}, {"ditherKind", 2}}},
+            {"stucki", {{"noise", 0}, {"ditherKind", 3}}},
+            {"ordered", {{"noise", 0}, {"ditherKind", 4}}},
+            {"fs noise", {{"noise", 30}, {"ditherKind", 1}}}};
+  return {};
+}
 
 }  // namespace
 
@@ -114,6 +136,22 @@ int main(int argc, char** argv) {
       })->Unit(benchmark::kMillisecond)->UseRealTime();
     }
     rows.push_back(row);
+    for (const Variant& v : variantsOf(*d)) {
+      std::vector<double> values;
+      for (const Extra& e : d->extras) values.push_back(e.good);
+      for (const auto& [argName, value] : v.values)
+        for (size_t k = 0; k < d->extras.size(); ++k)
+          if (d->extras[k].name == argName) values[k] = value;
+      auto vargs = std::make_shared<std::vector<Arg>>(ws->arguments(&values));
+      const std::string id = name + " [" + v.label + "]";
+      benchmark::RegisterBenchmark(id.c_str(), [ws, vargs](benchmark::State& state) {
+        for (auto _ : state) {
+          const Status s = ws->call(*vargs);
+          if (s < 0) state.SkipWithError("the export returned an error");
+        }
+      })->Unit(benchmark::kMillisecond)->UseRealTime();
+      rows.push_back(Row{id, {}});
+    }
   }
 
   Collector collector;

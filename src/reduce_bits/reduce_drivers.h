@@ -9,20 +9,12 @@
 
 #include "frame/allocate.h"
 #include "frame/image_layout.h"
+#include "reduce_bits/diffusion_bands.h"
 #include "reduce_bits/noise_generator.h"
 #include "reduce_bits/reduce_formulas.h"
 #include "reduce_bits/reduce_lanes.h"
 
 namespace zel::reduce {
-
-template <typename Src, typename Dst>
-struct Image {
-  const Src* src;
-  int srcStep;  // bytes
-  Dst* dst;
-  int dstStep;  // bytes
-  int width, height;
-};
 
 // The dithered drivers count steps in whole elements (an arithmetic shift),
 // so a byte step that is not a multiple of the element size rounds down.
@@ -124,24 +116,15 @@ inline Status diffusionNoise(NoiseTables& t, int noise, float q) {
 }
 
 // Floyd-Steinberg: two rows of error, P above and C current, swapped after
-// every row and carried on from one channel to the next.
+// every row and carried on from one channel to the next. Row by row, one
+// pixel after the other: the plain form of what the banded kernel does.
 template <typename M, LayoutCode L, bool Noisy>
-Status floydSteinbergDriver(const Image<typename M::Source, typename M::Dest>& im, int levels, int noise) {
+void floydSteinbergRows(const Image<typename M::Source, typename M::Dest>& im, float* block, const QuantValues& qv,
+                        const NoiseTables& tables) {
   using Src = typename M::Source;
   using Dst = typename M::Dest;
   constexpr int stride = LayoutOf<L>::stride;
-  const QuantValues qv = quantValues<Src>(levels);
-  NoiseTables tables;
-  if constexpr (Noisy) {
-    const Status s = diffusionNoise(tables, noise, qv.q);
-    if (s != StatusOk) return s;
-  }
   const int w = im.width;
-  float* block = reinterpret_cast<float*>(allocate32(2 * w + 4));
-  // Without the row block the call ends here; the noise tables and their
-  // records are not given back on this path.
-  if (!block) return StatusOutOfMemoryError;
-  std::memset(block, 0, sizeof(float) * size_t(2 * w + 4));
   float* P = block + 1;
   float* C = block + w + 3;
   const float bottom = diffusionBottom<Src>(true);
@@ -163,6 +146,36 @@ Status floydSteinbergDriver(const Image<typename M::Source, typename M::Dest>& i
       }
       std::swap(P, C);
     }
+}
+
+// The banded kernel, sixteen rows at a time with AVX2, else eight. The row
+// above a band is the first half of the block, written over in place.
+template <typename M, LayoutCode L, bool Noisy>
+void floydSteinbergBands(const Image<typename M::Source, typename M::Dest>& im, float* block, const QuantValues& qv,
+                         const NoiseTables& tables, bool avx2) {
+  using Src = typename M::Source;
+  using Dst = typename M::Dest;
+  const int srcStep = elementStep<Src>(im.srcStep), dstStep = elementStep<Dst>(im.dstStep);
+  const float bottom = diffusionBottom<Src>(true);
+  if (avx2) avx2::floydSteinbergBands<M, L, Noisy>(im, srcStep, dstStep, block + 1, qv, bottom, tables);
+  else sse::floydSteinbergBands<M, L, Noisy>(im, srcStep, dstStep, block + 1, qv, bottom, tables);
+}
+
+template <typename M, LayoutCode L, bool Noisy>
+Status floydSteinbergDriver(const Image<typename M::Source, typename M::Dest>& im, int levels, int noise) {
+  const QuantValues qv = quantValues<typename M::Source>(levels);
+  NoiseTables tables;
+  if constexpr (Noisy) {
+    const Status s = diffusionNoise(tables, noise, qv.q);
+    if (s != StatusOk) return s;
+  }
+  const int w = im.width;
+  float* block = reinterpret_cast<float*>(allocate32(2 * w + 4));
+  // Without the row block the call ends here; the noise tables and their
+  // records are not given back on this path.
+  if (!block) return StatusOutOfMemoryError;
+  std::memset(block, 0, sizeof(float) * size_t(2 * w + 4));
+  floydSteinbergBands<M, L, Noisy>(im, block, qv, tables, hasAvx2());
   release(block);
   if constexpr (Noisy) releaseNoiseTables(tables);
   return StatusOk;
@@ -172,23 +185,14 @@ Status floydSteinbergDriver(const Image<typename M::Source, typename M::Dest>& i
 // current; after every row U1 becomes U2, C becomes U1 and the old U2 the
 // new C, carried on from one channel to the next. With noise, the pixels of
 // each whole block of 4 share the threshold of the block's first column.
+// Row by row: the plain form of the banded kernel.
 template <typename M, LayoutCode L, bool Noisy>
-Status threeRowDriver(const Image<typename M::Source, typename M::Dest>& im, int levels, int noise, uint32_t kind) {
+void threeRowRows(const Image<typename M::Source, typename M::Dest>& im, float* block, const QuantValues& qv,
+                  const ThreeRowWeights& k, const NoiseTables& tables) {
   using Src = typename M::Source;
   using Dst = typename M::Dest;
   constexpr int stride = LayoutOf<L>::stride;
-  const QuantValues qv = quantValues<Src>(levels);
-  const ThreeRowWeights k = threeRowWeights(kind);
-  NoiseTables tables;
-  if constexpr (Noisy) {
-    const Status s = diffusionNoise(tables, noise, qv.q);
-    if (s != StatusOk) return s;
-  }
   const int w = im.width;
-  float* block = reinterpret_cast<float*>(allocate32(3 * w + 12));
-  // As in Floyd-Steinberg, a missing row block leaves the tables allocated.
-  if (!block) return StatusOutOfMemoryError;
-  std::memset(block, 0, sizeof(float) * size_t(3 * w + 12));
   float* U2 = block + 2;
   float* U1 = block + w + 6;
   float* C = block + 2 * w + 10;
@@ -218,6 +222,37 @@ Status threeRowDriver(const Image<typename M::Source, typename M::Dest>& im, int
       U1 = C;
       C = oldU2;
     }
+}
+
+// The banded kernel; the rows above a band are the block's first two rows,
+// written over in place.
+template <typename M, LayoutCode L, bool Noisy>
+void threeRowBands(const Image<typename M::Source, typename M::Dest>& im, float* block, const QuantValues& qv,
+                   const ThreeRowWeights& k, const NoiseTables& tables, bool avx2) {
+  using Src = typename M::Source;
+  using Dst = typename M::Dest;
+  const int srcStep = elementStep<Src>(im.srcStep), dstStep = elementStep<Dst>(im.dstStep);
+  float* U2 = block + 2;
+  float* U1 = block + im.width + 6;
+  if (avx2) avx2::threeRowBands<M, L, Noisy>(im, srcStep, dstStep, U2, U1, qv, k, tables);
+  else sse::threeRowBands<M, L, Noisy>(im, srcStep, dstStep, U2, U1, qv, k, tables);
+}
+
+template <typename M, LayoutCode L, bool Noisy>
+Status threeRowDriver(const Image<typename M::Source, typename M::Dest>& im, int levels, int noise, uint32_t kind) {
+  const QuantValues qv = quantValues<typename M::Source>(levels);
+  const ThreeRowWeights k = threeRowWeights(kind);
+  NoiseTables tables;
+  if constexpr (Noisy) {
+    const Status s = diffusionNoise(tables, noise, qv.q);
+    if (s != StatusOk) return s;
+  }
+  const int w = im.width;
+  float* block = reinterpret_cast<float*>(allocate32(3 * w + 12));
+  // As in Floyd-Steinberg, a missing row block leaves the tables allocated.
+  if (!block) return StatusOutOfMemoryError;
+  std::memset(block, 0, sizeof(float) * size_t(3 * w + 12));
+  threeRowBands<M, L, Noisy>(im, block, qv, k, tables, hasAvx2());
   release(block);
   if constexpr (Noisy) releaseNoiseTables(tables);
   return StatusOk;
