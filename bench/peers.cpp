@@ -144,6 +144,7 @@ const std::map<std::string, PeerFactory>& table() {
          std::vector<Peer> p;
 #ifdef ZELCC_BENCH_OPENCV
          p.push_back(cvtColorPeer("OpenCV cvtColor BayerBG2RGB", CV_8UC1, CV_8UC3, cv::COLOR_BayerBG2RGB));
+         p.push_back(cvtColorPeer("OpenCV cvtColor BayerBG2RGB_EA", CV_8UC1, CV_8UC3, cv::COLOR_BayerBG2RGB_EA));
 #endif
          return p;
        }},

@@ -54,10 +54,12 @@ inline int reflectInto(int c, int last) {
 }
 
 // The row pipeline of one tile. Rows of the planes live in rings in the
-// scratch, at frame columns from tile x - 3 on:
-//   green, per direction, 4 rows: tile columns -3 .. width + 2
-//   red and blue, per direction, 3 rows each: -2 .. width + 1
-//   homogeneity differences, 3 rows: -1 .. width
+// scratch, at frame columns from tile x - 3 on; the homogeneity differences
+// are made two rows at a time, which needs one row more of each ring than
+// single rows would, 30 rows in all:
+//   green, per direction, 5 rows: tile columns -3 .. width + 2
+//   red and blue, per direction, 4 rows each: -2 .. width + 1
+//   homogeneity differences, 4 rows: -1 .. width
 // Reads of the mosaic outside the frame are reflected: near the frame's
 // left and right edges the samples are gathered into a short reflected row
 // first, elsewhere the kernels read the frame directly.
@@ -68,15 +70,18 @@ class AhdRows {
       : f_(f), grid_(grid), t_(t), origin_(t.x - 3), tmp_(tmp), tmpStep_(tmpStep), level_(bestVectorLevel()) {}
 
   void run(T* dst, int dstStep, int originX, int originY) {
+    const int bottom = t_.y + t_.height;  // the last row of differences the tile needs
     int greenNext = t_.y - 3, colourNext = t_.y - 2, homNext = t_.y - 1;
-    for (int y = t_.y; y < t_.y + t_.height; ++y) {
-      for (; homNext <= y + 1; ++homNext) {
-        for (; colourNext <= homNext + 1; ++colourNext) {
+    for (int y = t_.y; y < bottom; ++y) {
+      while (homNext <= y + 1) {
+        const int rows = homNext < bottom ? 2 : 1;
+        for (; colourNext <= homNext + rows; ++colourNext) {
           for (; greenNext <= colourNext + 1; ++greenNext) greenRows(greenNext);
           colourRows(kH, colourNext);
           colourRows(kV, colourNext);
         }
-        homogeneityRows(homNext);
+        homogeneityRows(homNext, rows);
+        homNext += rows;
       }
       outputRow(y, rowAt(dst, dstStep, y - originY) + 3 * (t_.x - originX));
     }
@@ -85,7 +90,9 @@ class AhdRows {
  private:
   static constexpr int kH = 0, kV = 1;
   static constexpr int kPiece = 16;  // columns gathered at a time near an edge
-  static constexpr int kChunk = 64;  // columns of luma-chroma and sums kept at a time
+  // Columns of differences made at a time: with the one more on either side
+  // the luma-chroma rows take whole vector blocks.
+  static constexpr int kChunk = sizeof(T) == 1 ? 254 : 126;
 
   static int ring(int y, int n) {
     const int m = y % n;
@@ -93,10 +100,10 @@ class AhdRows {
   }
   T* scratch(int k) const { return reinterpret_cast<T*>(tmp_ + std::ptrdiff_t(k) * tmpStep_); }
   // Plane rows, addressed by frame column.
-  T* green(int d, int y) const { return scratch(d * 4 + ring(y, 4)) - origin_; }
-  T* red(int d, int y) const { return scratch(8 + d * 3 + ring(y, 3)) - origin_; }
-  T* blue(int d, int y) const { return scratch(14 + d * 3 + ring(y, 3)) - origin_; }
-  T* homDiff(int y) const { return scratch(20 + ring(y, 3)) - origin_; }
+  T* green(int d, int y) const { return scratch(d * 5 + ring(y, 5)) - origin_; }
+  T* red(int d, int y) const { return scratch(10 + d * 4 + ring(y, 4)) - origin_; }
+  T* blue(int d, int y) const { return scratch(18 + d * 4 + ring(y, 4)) - origin_; }
+  T* homDiff(int y) const { return scratch(26 + ring(y, 4)) - origin_; }
 
   const T* sourceRow(int y) const { return f_.row(reflectInto(y, f_.height - 1)); }
   bool greenAt(int c, int y) const { return cfaColour(grid_, c, y) == kGreen; }
@@ -172,44 +179,33 @@ class AhdRows {
         });
   }
 
-  // Luma-chroma of rows y - 1 .. y + 1 for a chunk of columns and one more
-  // on either side, then the homogeneity differences of the chunk.
-  void homogeneityRows(int y) {
-    int32_t values[2][3][3][kChunk + 2];
+  // Luma-chroma of rows y - 1 .. y + rows for a chunk of columns and one
+  // more on either side, then the homogeneity differences of the chunk in
+  // rows y .. y + rows - 1: a pair of rows shares two of its four rows of
+  // luma-chroma.
+  void homogeneityRows(int y, int rows) {
+    LumaChromaValue<T> values[2][4][3][kChunk + 2];
     for (int a = t_.x - 1; a < t_.x + t_.width + 1; a += kChunk) {
       const int n = std::min(kChunk, t_.x + t_.width + 1 - a);
-      LumaChromaView views[2][3];
+      LumaChromaView<T> views[2][4];
       for (int d = 0; d < 2; ++d)
-        for (int k = 0; k < 3; ++k) {
-          int32_t(&v)[3][kChunk + 2] = values[d][k];
+        for (int k = 0; k < rows + 2; ++k) {
+          LumaChromaValue<T>(&v)[3][kChunk + 2] = values[d][k];
           const int row = y - 1 + k;
           lumaChromaRow(red(d, row) + a - 1, green(d, row) + a - 1, blue(d, row) + a - 1, n + 2,
-                        LumaChromaRow{v[0], v[1], v[2]}, level_);
-          views[d][k] = LumaChromaView{v[0] + 1, v[1] + 1, v[2] + 1};
+                        LumaChromaRow<T>{v[0], v[1], v[2]}, level_);
+          views[d][k] = LumaChromaView<T>{v[0] + 1, v[1] + 1, v[2] + 1};
         }
-      homogeneityRow(views[kH], views[kV], n, homDiff(y) + a, level_);
+      for (int j = 0; j < rows; ++j) homogeneityRow(views[kH] + j, views[kV] + j, n, homDiff(y + j) + a, level_);
     }
   }
 
-  // The running choice starts with H at each row of the tile; a non-zero
-  // window sum decides, a zero sum repeats the last decision.
+  // The running choice starts with H at each row of the tile.
   void outputRow(int y, T* out) {
-    int32_t sums[kChunk];
-    uint8_t takeV[kChunk];
-    int t = 1;
-    const T* h[3] = {red(kH, y), green(kH, y), blue(kH, y)};
-    const T* v[3] = {red(kV, y), green(kV, y), blue(kV, y)};
-    for (int a = t_.x; a < t_.x + t_.width; a += kChunk) {
-      const int n = std::min(kChunk, t_.x + t_.width - a);
-      windowSumRow(homDiff(y - 1) + a, homDiff(y) + a, homDiff(y + 1) + a, n, sums, level_);
-      for (int i = 0; i < n; ++i) {
-        if (sums[i] != 0) t = sums[i];
-        takeV[i] = t < 0 ? 0xFF : 0;
-      }
-      const T* hc[3] = {h[0] + a, h[1] + a, h[2] + a};
-      const T* vc[3] = {v[0] + a, v[1] + a, v[2] + a};
-      chooseRow(hc, vc, takeV, n, out + 3 * (a - t_.x), level_);
-    }
+    const T* h[3] = {red(kH, y) + t_.x, green(kH, y) + t_.x, blue(kH, y) + t_.x};
+    const T* v[3] = {red(kV, y) + t_.x, green(kV, y) + t_.x, blue(kV, y) + t_.x};
+    const T* hom[3] = {homDiff(y - 1) + t_.x, homDiff(y) + t_.x, homDiff(y + 1) + t_.x};
+    choiceRow(h, v, hom, t_.width, out, level_);
   }
 
   const CfaFrame<T>& f_;

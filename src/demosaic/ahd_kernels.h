@@ -1,11 +1,13 @@
 // Row kernels of the homogeneity-directed demosaicing. Each works on
 // `count` pixels of one row with pointers placed at the first pixel; taps
 // reach the stated number of samples to either side. A scalar form built
-// from the formulas of ahd.h and a vector form (SSE4.1 blocks of 4 pixels
-// in 32-bit lanes, then the scalar form for the rest) give the same values.
+// from the formulas of ahd.h and a vector form give the same values: 16-bit
+// samples in 32-bit lanes, 8-bit ones in 16-bit lanes, where every value
+// of theirs fits a word.
 #pragma once
 
 #include <cstdint>
+#include <type_traits>
 
 #include "demosaic/ahd.h"
 
@@ -33,12 +35,17 @@ struct ColourTaps {
   const T *sUp, *s, *sDown;
 };
 
-// Step 3 output, one row: luma and the two chroma values.
+// Step 3 output, one row: luma and the two chroma values. Those of 8-bit
+// samples fit 16 bits (luma 0..219, chroma -112..112).
+template <typename T>
+using LumaChromaValue = std::conditional_t<sizeof(T) == 1, int16_t, int32_t>;
+template <typename T>
 struct LumaChromaRow {
-  int32_t *y, *cb, *cr;
+  LumaChromaValue<T> *y, *cb, *cr;
 };
+template <typename T>
 struct LumaChromaView {
-  const int32_t *y, *cb, *cr;
+  const LumaChromaValue<T> *y, *cb, *cr;
 };
 
 template <typename T>
@@ -73,10 +80,11 @@ void colourRowScalar(const ColourTaps<T>& t, int count, bool firstGreen, bool re
 }
 
 template <typename T>
-void lumaChromaRowScalar(const T* r, const T* g, const T* b, int count, const LumaChromaRow& out) {
+void lumaChromaRowScalar(const T* r, const T* g, const T* b, int count, const LumaChromaRow<T>& out) {
   for (int i = 0; i < count; ++i) {
     const LumaChroma v = lumaChroma(loadSample(r + i), loadSample(g + i), loadSample(b + i));
-    out.y[i] = v.y, out.cb[i] = v.cb, out.cr[i] = v.cr;
+    using V = LumaChromaValue<T>;
+    out.y[i] = V(v.y), out.cb[i] = V(v.cb), out.cr[i] = V(v.cr);
   }
 }
 
@@ -84,8 +92,10 @@ void lumaChromaRowScalar(const T* r, const T* g, const T* b, int count, const Lu
 // above, at and below, per direction (reach 1 in the middle row). The
 // result is stored as a signed sample.
 template <typename T>
-void homogeneityRowScalar(const LumaChromaView h[3], const LumaChromaView v[3], int count, T* out) {
-  auto pick = [](const LumaChromaView& r, int i) { return LumaChroma{r.y[i], r.cb[i], r.cr[i]}; };
+void homogeneityRowScalar(const LumaChromaView<T> h[3], const LumaChromaView<T> v[3], int count, T* out) {
+  auto pick = [](const LumaChromaView<T>& r, int i) {
+    return LumaChroma{int32_t(r.y[i]), int32_t(r.cb[i]), int32_t(r.cr[i])};
+  };
   for (int i = 0; i < count; ++i) {
     const Neighbourhood nh{pick(h[1], i), pick(h[1], i - 1), pick(h[1], i + 1), pick(h[0], i), pick(h[2], i)};
     const Neighbourhood nv{pick(v[1], i), pick(v[1], i - 1), pick(v[1], i + 1), pick(v[0], i), pick(v[2], i)};
@@ -98,22 +108,29 @@ inline int signedSample(const T* p) {
   return sizeof(T) == 1 ? int(int8_t(loadSample(p))) : int(int16_t(loadSample(p)));
 }
 
-// Step 5 input: the sums of the 3 by 3 windows of homogeneity differences.
+// Step 5: the sum of the 3 by 3 window of homogeneity differences around
+// pixel i of the middle row (`hom` holds the rows above, at and below).
 template <typename T>
-void windowSumRowScalar(const T* up, const T* mid, const T* down, int count, int32_t* sums) {
-  for (int i = 0; i < count; ++i) {
-    int s = 0;
-    for (int k = -1; k <= 1; ++k)
-      s += signedSample(up + i + k) + signedSample(mid + i + k) + signedSample(down + i + k);
-    sums[i] = s;
-  }
+int windowSum(const T* const hom[3], int i) {
+  int s = 0;
+  for (int r = 0; r < 3; ++r)
+    for (int k = -1; k <= 1; ++k) s += signedSample(hom[r] + i + k);
+  return s;
 }
 
-// Step 5 output: the pixels of V where `takeV` is set, else those of H.
+// Step 5 output: a running choice walks the row. A non-zero window sum
+// decides (V where it is negative), a zero sum repeats the last decision;
+// `takingV` is the choice before the first pixel. The pixels of the chosen
+// direction are stored; returns the choice after the last pixel.
 template <typename T>
-void chooseRowScalar(const T* const h[3], const T* const v[3], const uint8_t* takeV, int count, T* dst) {
-  for (int i = 0; i < count; ++i)
-    for (int k = 0; k < 3; ++k) storeSample(dst + 3 * i + k, loadSample((takeV[i] ? v[k] : h[k]) + i));
+bool choiceRowScalar(const T* const h[3], const T* const v[3], const T* const hom[3], int count, bool takingV,
+                     T* dst) {
+  for (int i = 0; i < count; ++i) {
+    const int s = windowSum(hom, i);
+    if (s != 0) takingV = s < 0;
+    for (int k = 0; k < 3; ++k) storeSample(dst + 3 * i + k, loadSample((takingV ? v[k] : h[k]) + i));
+  }
+  return takingV;
 }
 
 // The widest vector form in use: chosen once per call from the processor;
@@ -121,20 +138,22 @@ void chooseRowScalar(const T* const h[3], const T* const v[3], const uint8_t* ta
 enum class VectorLevel { Scalar, Sse41, Avx2 };
 VectorLevel bestVectorLevel();
 
-// Vector blocks of the chosen level first (AVX2 blocks of 8 pixels, then
-// SSE4.1 blocks of 4), the scalar form for what is left.
+// Vector blocks of the chosen level (AVX2, or SSE4.1 with half as many
+// pixels), the last block overlapping the one before to end at the row's
+// end; the scalar form for a row narrower than a block.
 template <typename T>
 void greenRow(const GreenTaps<T>& t, int count, bool firstGreen, T* out, VectorLevel level);
 template <typename T>
 void colourRow(const ColourTaps<T>& t, int count, bool firstGreen, bool redRow, T* outR, T* outB, VectorLevel level);
 template <typename T>
-void lumaChromaRow(const T* r, const T* g, const T* b, int count, const LumaChromaRow& out, VectorLevel level);
+void lumaChromaRow(const T* r, const T* g, const T* b, int count, const LumaChromaRow<T>& out, VectorLevel level);
 template <typename T>
-void homogeneityRow(const LumaChromaView h[3], const LumaChromaView v[3], int count, T* out, VectorLevel level);
+void homogeneityRow(const LumaChromaView<T> h[3], const LumaChromaView<T> v[3], int count, T* out, VectorLevel level);
+// The choice of a whole row of a tile, starting with H: SSE4.1 blocks of
+// 16 pixels (window sums in bytes, the running choice carried through the
+// block by a prefix scan), the scalar form for the rest.
 template <typename T>
-void windowSumRow(const T* up, const T* mid, const T* down, int count, int32_t* sums, VectorLevel level);
-// SSE4.1 blocks of 16 bytes of each channel.
-template <typename T>
-void chooseRow(const T* const h[3], const T* const v[3], const uint8_t* takeV, int count, T* dst, VectorLevel level);
+void choiceRow(const T* const h[3], const T* const v[3], const T* const hom[3], int count, T* dst,
+               VectorLevel level);
 
 }  // namespace zel

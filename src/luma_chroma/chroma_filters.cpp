@@ -51,10 +51,33 @@ void weightedRows(const uint8_t* a, int wa, const uint8_t* b, int wb, int shift,
 }
 
 // The -1 9 9 -1 half-sample tap over four rows.
+ZEL_AVX2 ZEL_INLINE __m256i halfSampleLanes(__m256i u, __m256i p, __m256i q, __m256i d) {
+  const __m256i nine = _mm256_set1_epi16(9), eight = _mm256_set1_epi16(8);
+  return _mm256_srai_epi16(
+      _mm256_add_epi16(_mm256_sub_epi16(_mm256_mullo_epi16(_mm256_add_epi16(p, q), nine), _mm256_add_epi16(u, d)),
+                       eight),
+      4);
+}
+
+ZEL_AVX2 int halfSampleRowsAvx(const uint8_t* above, const uint8_t* a, const uint8_t* b, const uint8_t* below,
+                               uint8_t* out, int n) {
+  const __m256i zero = _mm256_setzero_si256();
+  int x = 0;
+  for (; x + 32 <= n; x += 32) {
+    const __m256i u = load256(above + x), p = load256(a + x), q = load256(b + x), d = load256(below + x);
+    const __m256i lo = halfSampleLanes(_mm256_unpacklo_epi8(u, zero), _mm256_unpacklo_epi8(p, zero),
+                                       _mm256_unpacklo_epi8(q, zero), _mm256_unpacklo_epi8(d, zero));
+    const __m256i hi = halfSampleLanes(_mm256_unpackhi_epi8(u, zero), _mm256_unpackhi_epi8(p, zero),
+                                       _mm256_unpackhi_epi8(q, zero), _mm256_unpackhi_epi8(d, zero));
+    store256(out + x, _mm256_packus_epi16(lo, hi));
+  }
+  return x;
+}
+
 void halfSampleRows(const uint8_t* above, const uint8_t* a, const uint8_t* b, const uint8_t* below, uint8_t* out,
                     int n) {
   const __m128i zero = _mm_setzero_si128(), nine = _mm_set1_epi16(9), eight = _mm_set1_epi16(8);
-  int x = 0;
+  int x = hasAvx2() ? halfSampleRowsAvx(above, a, b, below, out, n) : 0;
   for (; x + 16 <= n; x += 16) {
     const __m128i u = load128(above + x), p = load128(a + x), q = load128(b + x), d = load128(below + x);
     auto side = [&](auto unpack) {
@@ -135,8 +158,13 @@ bool missingPlanes(T* const* planes, const int* steps) {
   return !planes || !steps || anyNull3(reinterpret_cast<const void* const*>(planes));
 }
 
+// Luma rows copied, as one row when no gap lies between them.
 void copyLuma(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, int width, int height) {
-  plainWalk(height, [&](int y) { std::memcpy(rowAt(dst, dstStep, y), rowAt(src, srcStep, y), size_t(width)); });
+  if (srcStep == width && dstStep == width && int64_t(width) * height <= (int64_t(1) << 30)) {
+    repack::copyBytes(src, dst, width * height, false);
+    return;
+  }
+  plainWalk(height, [&](int y) { repack::copyBytes(rowAt(src, srcStep, y), rowAt(dst, dstStep, y), width, false); });
 }
 
 Status grow1620To420(const Planes3& s, const OutPlanes3& d, ImageSize size) {
@@ -214,6 +242,47 @@ Status halfSampleSize(ImageSize size, int& width, int& height) {
 
 // ---- 4:2:0 to BGR with horizontal interpolation ----
 
+// The 16-bit form for 16 pixels: luma and chroma bytes widened, B G R
+// alpha written.
+ZEL_AVX2 ZEL_INLINE void bgrLanes16(__m128i luma, __m128i crPix, __m128i cbPix, __m256i alphaBytes, uint8_t* o) {
+  const __m256i c16 = _mm256_set1_epi16(16), c128 = _mm256_set1_epi16(128);
+  const __m256i y8 = _mm256_cvtepu8_epi16(luma), r8 = _mm256_cvtepu8_epi16(crPix), b8 = _mm256_cvtepu8_epi16(cbPix);
+  const __m256i yy = _mm256_mulhi_epi16(_mm256_slli_epi16(_mm256_sub_epi16(y8, c16), 7), _mm256_set1_epi16(kLuma12));
+  const __m256i crs = _mm256_slli_epi16(_mm256_sub_epi16(r8, c128), 7);
+  const __m256i cbs = _mm256_slli_epi16(_mm256_sub_epi16(b8, c128), 7);
+  const __m256i r = _mm256_srai_epi16(_mm256_add_epi16(yy, _mm256_mulhi_epi16(crs, _mm256_set1_epi16(kCrToR12))), 3);
+  const __m256i g = _mm256_srai_epi16(
+      _mm256_sub_epi16(_mm256_sub_epi16(yy, _mm256_mulhi_epi16(cbs, _mm256_set1_epi16(kCbToG12))),
+                       _mm256_mulhi_epi16(crs, _mm256_set1_epi16(kCrToG12))),
+      3);
+  const __m256i b = _mm256_srai_epi16(_mm256_add_epi16(yy, _mm256_mulhi_epi16(cbs, _mm256_set1_epi16(kCbToB12))), 3);
+  // Per lane: pixels 0-7 | 8-15.
+  const __m256i bg = _mm256_unpacklo_epi8(_mm256_packus_epi16(b, b), _mm256_packus_epi16(g, g));
+  const __m256i ra = _mm256_unpacklo_epi8(_mm256_packus_epi16(r, r), _mm256_setzero_si256());
+  const __m256i lo = _mm256_or_si256(_mm256_unpacklo_epi16(bg, ra), alphaBytes);  // 0-3 | 8-11
+  const __m256i hi = _mm256_or_si256(_mm256_unpackhi_epi16(bg, ra), alphaBytes);  // 4-7 | 12-15
+  store256(o, _mm256_permute2x128_si256(lo, hi, 0x20));
+  store256(o + 32, _mm256_permute2x128_si256(lo, hi, 0x31));
+}
+
+// Sixteen chroma samples (32 pixels) a step, while a whole step stays
+// below `bodyPairs`.
+ZEL_AVX2 int bgrFilterBodyAvx(const uint8_t* y, const uint8_t* cr, const uint8_t* cb, uint8_t* out, int bodyPairs,
+                              uint8_t alpha) {
+  const __m256i alphaBytes = _mm256_set1_epi32(int32_t(uint32_t(alpha) << 24));
+  int k = 0;
+  for (; k + 16 <= bodyPairs; k += 16) {
+    const __m128i crv = load128(cr + k), cbv = load128(cb + k);
+    const __m128i crOdd = _mm_avg_epu8(crv, load128(cr + k + 1));
+    const __m128i cbOdd = _mm_avg_epu8(cbv, load128(cb + k + 1));
+    bgrLanes16(load128(y + 2 * k), _mm_unpacklo_epi8(crv, crOdd), _mm_unpacklo_epi8(cbv, cbOdd), alphaBytes,
+               out + 8 * k);
+    bgrLanes16(load128(y + 2 * k + 16), _mm_unpackhi_epi8(crv, crOdd), _mm_unpackhi_epi8(cbv, cbOdd), alphaBytes,
+               out + 8 * k + 64);
+  }
+  return k;
+}
+
 // Pixel pairs [0, pairs) of one row; pairs below `bodyPairs` take the
 // 16-bit form, eight chroma samples a block.
 void bgrFilterRow(const uint8_t* y, const uint8_t* cr, const uint8_t* cb, uint8_t* out, int pairs, uint8_t alpha) {
@@ -223,7 +292,7 @@ void bgrFilterRow(const uint8_t* y, const uint8_t* cr, const uint8_t* cb, uint8_
   const __m128i wy = _mm_set1_epi16(kLuma12), wcrR = _mm_set1_epi16(kCrToR12), wcrG = _mm_set1_epi16(kCrToG12),
                 wcbG = _mm_set1_epi16(kCbToG12), wcbB = _mm_set1_epi16(kCbToB12);
   const __m128i alphaBytes = _mm_set1_epi32(int32_t(uint32_t(alpha) << 24));
-  int k = 0;
+  int k = hasAvx2() ? bgrFilterBodyAvx(y, cr, cb, out, bodyPairs, alpha) : 0;
   for (; k < bodyPairs; k += 8) {
     // Chroma of even pixels and the rounded means for odd pixels.
     const __m128i crv = load64(cr + k), cbv = load64(cb + k);
@@ -322,14 +391,16 @@ ZEL_PUBLIC Status zeliYCbCr420To422_Interlace_8u_P3R(const uint8_t* const src[3]
   if (s < 0) return s;
   copyLuma(src[0], srcStep[0], dst[0], dstStep[0], width, height);
   const int cw = width / 2;
-  alignas(16) uint8_t scratch[kChunk];
   for (int plane = 1; plane <= 2; ++plane)
     for (int x = 0; x < cw; x += kChunk) {
       const int n = std::min(kChunk, cw - x);
       auto sourceRow = [&](int r) { return rowAt(src[plane], srcStep[plane], r) + x; };
-      for (int row = 0; row < height; ++row)
-        std::memcpy(rowAt(dst[plane], dstStep[plane], row) + x, fieldUpRow(sourceRow, height, row, n, scratch),
-                    size_t(n));
+      for (int row = 0; row < height; ++row) {
+        // Tapped rows land in place; copied rows are copied.
+        uint8_t* out = rowAt(dst[plane], dstStep[plane], row) + x;
+        const uint8_t* got = fieldUpRow(sourceRow, height, row, n, out);
+        if (got != out) std::memcpy(out, got, size_t(n));
+      }
     }
   return s;
 }

@@ -1,7 +1,8 @@
 // Repacking of 8-bit YCbCr between 4:2:2, 4:2:0 and 4:1:1, pair streams,
-// two planes and three planes, and the YCbCr, YCrCb and CbYCr orders. One
-// driver reads each layout into planar rows, applies the chroma rule of the
-// two schemes, and writes the target layout; luma is always copied.
+// two planes and three planes, and the YCbCr, YCrCb and CbYCr orders. Each
+// route makes one pass over a row: pair streams split into or woven from
+// the target's layout directly, planar layouts copy luma and deal chroma
+// bytes from source rows to target rows by the rule of the two schemes.
 #include <algorithm>
 #include <cstring>
 
@@ -54,137 +55,159 @@ struct Side {
 
 int chromaWidth(Scheme s, int width) { return s == Scheme::S411 ? width / 4 : width / 2; }
 
-// Columns of a chunk: a multiple of 4 pixels so every scheme splits evenly.
-constexpr int kChunk = 2048;
-
-struct Rows {
-  // Planar rows of one group: up to two luma rows and two chroma rows.
-  const uint8_t* y[2];
-  const uint8_t* cb[2];
-  const uint8_t* cr[2];
-};
-
-struct Staging {
-  alignas(16) uint8_t y[2][kChunk];
-  alignas(16) uint8_t cb[2][kChunk / 2];
-  alignas(16) uint8_t cr[2][kChunk / 2];
-};
+// Gapless rows are joined into one only while every offset within it,
+// counted in the bytes of a pair stream, stays well inside an int.
+constexpr int64_t kLongestRow = int64_t(1) << 28;
 
 uint8_t* at(const Side& s, int plane, int row, int offset) { return rowAt(s.p[plane], s.step[plane], row) + offset; }
 
-// Reads luma row `lumaRow` (slot `ly`) and, when `chromaRow` >= 0, chroma
-// row `chromaRow` (slot `cy`) of the columns [x, x + n) into planar rows.
-// A pair stream's luma goes to `lumaTarget` when given (the destination's
-// own luma row), else to staging.
-void readRows(const Layout& l, const Side& s, int lumaRow, int chromaRow, int ly, int cy, int x, int n, Staging& st,
-              Rows& r, uint8_t* lumaTarget) {
-  const int cx = l.scheme == Scheme::S411 ? x / 4 : x / 2;
-  const int cn = chromaWidth(l.scheme, n);
-  switch (l.kind) {
-    case Kind::Pairs: {
-      // Luma and chroma share the row of a pair stream.
-      const uint8_t* in = at(s, 0, lumaRow, 2 * x);
-      uint8_t* luma = lumaTarget ? lumaTarget : st.y[ly];
-      if (chromaRow >= 0) {
-        splitPairs(in, l.order, luma, st.cb[cy], st.cr[cy], n);
-        r.cb[cy] = st.cb[cy];
-        r.cr[cy] = st.cr[cy];
-      } else {
-        lumaOfPairs(in, l.order, luma, n);
-      }
-      r.y[ly] = luma;
-      return;
-    }
-    case Kind::TwoPlanes:
-      r.y[ly] = at(s, 0, lumaRow, x);
-      if (chromaRow >= 0) {
-        unzip(at(s, 1, chromaRow, 2 * cx), st.cb[cy], st.cr[cy], cn);
-        r.cb[cy] = st.cb[cy];
-        r.cr[cy] = st.cr[cy];
-      }
-      return;
-    case Kind::Planes:
-      r.y[ly] = at(s, 0, lumaRow, x);
-      if (chromaRow >= 0) {
-        r.cb[cy] = at(s, 1, chromaRow, cx);
-        r.cr[cy] = at(s, 2, chromaRow, cx);
-      }
-      return;
+// Whether each plane's step is exactly the bytes of its row.
+bool gapless(const Layout& l, const Side& s, int width) {
+  const int chroma = chromaWidth(l.scheme, width);
+  for (int i = 0; i < s.count; ++i) {
+    const int bytes = l.kind == Kind::Pairs ? 2 * width : i == 0 ? width : l.kind == Kind::TwoPlanes ? 2 * chroma : chroma;
+    if (s.step[i] != bytes) return false;
   }
+  return true;
 }
 
-// Where the chroma of destination row slot `cy` goes: straight into the
-// planes, or into staging for a pair stream or two planes.
-void chromaTargets(const Layout& l, const Side& s, int chromaRow, int cy, int x, Staging& st, uint8_t*& cb,
-                   uint8_t*& cr) {
-  if (l.kind == Kind::Planes) {
-    const int cx = l.scheme == Scheme::S411 ? x / 4 : x / 2;
-    cb = at(s, 1, chromaRow, cx);
-    cr = at(s, 2, chromaRow, cx);
-  } else {
-    cb = st.cb[cy];
-    cr = st.cr[cy];
-  }
+// Luma rows copied, as one row when no gap lies between them.
+void copyLuma(const Side& src, const Side& dst, int width, int height, bool nonTemporal) {
+  if (src.step[0] == width && dst.step[0] == width && int64_t(width) * height <= kLongestRow)
+    copyBytes(src.p[0], dst.p[0], width * height, nonTemporal);
+  else
+    for (int y = 0; y < height; ++y) copyBytes(at(src, 0, y, 0), at(dst, 0, y, 0), width, nonTemporal);
 }
 
-void writeRow(const Layout& l, const Side& s, int lumaRow, int chromaRow, const uint8_t* y, const uint8_t* cb,
-              const uint8_t* cr, int x, int n, bool nonTemporal, bool streamLuma) {
-  const int cx = l.scheme == Scheme::S411 ? x / 4 : x / 2;
-  const int cn = chromaWidth(l.scheme, n);
-  switch (l.kind) {
-    case Kind::Pairs:
-      mergePairs(y, cb, cr, l.order, at(s, 0, lumaRow, 2 * x), n, nonTemporal);
-      return;
-    case Kind::TwoPlanes:
-    case Kind::Planes: {
-      uint8_t* luma = at(s, 0, lumaRow, x);
-      if (y != luma) copyBytes(y, luma, n, nonTemporal || streamLuma);  // else already unpacked in place
-      if (l.kind == Kind::TwoPlanes && chromaRow >= 0) zip(cb, cr, at(s, 1, chromaRow, 2 * cx), cn, nonTemporal);
-      return;  // planes took their chroma in place
-    }
-  }
-}
-
-// One chroma plane's rule between two schemes, for a group of rows: the
-// source has one chroma row for 4:2:0 in a pair group, else one per luma row.
-void convertChroma(Scheme from, Scheme to, const uint8_t* const* in, uint8_t* const* out, int dstCount, int n,
-                   bool nonTemporal) {
-  const int cn = chromaWidth(to, n);
-  if (from == to) {
-    for (int r = 0; r < dstCount; ++r) copyBytes(in[r], out[r], cn, nonTemporal);
-  } else if (from == Scheme::S422 && to == Scheme::S420) {
-    copyBytes(in[0], out[0], cn, nonTemporal);  // even rows kept, odd dropped
-  } else if (from == Scheme::S420 && to == Scheme::S422) {
-    copyBytes(in[0], out[0], cn, nonTemporal);  // each row written twice
-    copyBytes(in[0], out[1], cn, nonTemporal);
-  } else if (from == Scheme::S422 && to == Scheme::S411) {
-    for (int r = 0; r < dstCount; ++r) keepEven(in[r], out[r], cn);
-  } else if (from == Scheme::S411 && to == Scheme::S422) {
-    for (int r = 0; r < dstCount; ++r) doubleSamples(in[r], out[r], cn / 2, nonTemporal);
-  } else if (from == Scheme::S411 && to == Scheme::S420) {
-    zip(in[0], in[1], out[0], cn / 2, nonTemporal);  // two rows interleave into one
-  } else {                                           // 4:2:0 to 4:1:1, the inverse
-    unzip(in[0], out[0], out[1], cn);
-  }
-}
-
-// Pair streams and two planes unpacked straight into destination planes,
-// for the rules that only keep, drop or repeat whole chroma rows.
-void unpackIntoPlanes(const Member& m, const Side& src, const Side& dst, int width, int height) {
-  const int cw = chromaWidth(m.dst.scheme, width);
+// A pair stream into planes or two planes: one pass a row writes luma and,
+// on rows that keep chroma, the chroma in the target's scheme and layout.
+void unpackPairs(const Member& m, const Side& src, const Side& dst, int width, int height, bool nonTemporal) {
+  const PairOrder o = m.src.order;
   for (int y = 0; y < height; ++y) {
-    const bool dstHalf = m.dst.scheme == Scheme::S420;
-    const int dstChroma = dstHalf ? ((y & 1) ? -1 : y / 2) : y;
-    const int srcChroma = m.src.scheme == Scheme::S420 ? y / 2 : y;
+    const uint8_t* in = at(src, 0, y, 0);
     uint8_t* luma = at(dst, 0, y, 0);
-    if (m.src.kind == Kind::Pairs) {
-      if (dstChroma >= 0)
-        splitPairs(at(src, 0, y, 0), m.src.order, luma, at(dst, 1, dstChroma, 0), at(dst, 2, dstChroma, 0), width);
+    const bool half = m.dst.scheme == Scheme::S420;
+    if (half && (y & 1)) {  // odd rows drop their chroma
+      lumaOfPairs(in, o, luma, width);
+      continue;
+    }
+    const int row = half ? y / 2 : y;
+    if (m.dst.kind == Kind::Planes) {
+      if (m.dst.scheme == Scheme::S411)
+        splitPairs411(in, o, luma, at(dst, 1, row, 0), at(dst, 2, row, 0), width);
       else
-        lumaOfPairs(at(src, 0, y, 0), m.src.order, luma, width);
+        splitPairs(in, o, luma, at(dst, 1, row, 0), at(dst, 2, row, 0), width);
+    } else if (m.dst.scheme == Scheme::S411) {
+      splitPairsToCbCr411(in, o, luma, at(dst, 1, row, 0), width, nonTemporal);
     } else {
-      std::memcpy(luma, at(src, 0, y, 0), size_t(width));
-      if (dstChroma >= 0) unzip(at(src, 1, srcChroma, 0), at(dst, 1, dstChroma, 0), at(dst, 2, dstChroma, 0), cw);
+      splitPairsToCbCr(in, o, luma, at(dst, 1, row, 0), width, nonTemporal);
+    }
+  }
+}
+
+// Planes or two planes into a pair stream: each row reads its chroma row
+// (shared by two rows in 4:2:0) and weaves it with luma in one pass.
+void packPairs(const Member& m, const Side& src, const Side& dst, int width, int height, bool nonTemporal) {
+  const PairOrder o = m.dst.order;
+  for (int y = 0; y < height; ++y) {
+    const uint8_t* luma = at(src, 0, y, 0);
+    uint8_t* out = at(dst, 0, y, 0);
+    const int row = m.src.scheme == Scheme::S420 ? y / 2 : y;
+    if (m.src.kind == Kind::Planes) {
+      if (m.src.scheme == Scheme::S411)
+        mergePairs411(luma, at(src, 1, row, 0), at(src, 2, row, 0), o, out, width, nonTemporal);
+      else
+        mergePairs(luma, at(src, 1, row, 0), at(src, 2, row, 0), o, out, width, nonTemporal);
+    } else if (m.src.scheme == Scheme::S411) {
+      mergePairsCbCr411(luma, at(src, 1, row, 0), o, out, width, nonTemporal);
+    } else {
+      mergePairsCbCr(luma, at(src, 1, row, 0), o, out, width, nonTemporal);
+    }
+  }
+}
+
+// Chroma between planar layouts (planes or two planes, either side): each
+// rule moves whole rows or deals out bytes, straight from source rows to
+// target rows.
+void moveChroma(const Member& m, const Side& src, const Side& dst, int width, int height) {
+  const Scheme from = m.src.scheme, to = m.dst.scheme;
+  const bool srcPlanes = m.src.kind == Kind::Planes, dstPlanes = m.dst.kind == Kind::Planes;
+  // One chroma row in the same scheme (or a row kept or repeated whole);
+  // `cw` samples of each plane.
+  auto sameRow = [&](int s, int d, int cw) {
+    if (srcPlanes && dstPlanes) {
+      copyBytes(at(src, 1, s, 0), at(dst, 1, d, 0), cw, false);
+      copyBytes(at(src, 2, s, 0), at(dst, 2, d, 0), cw, false);
+    } else if (srcPlanes) {
+      zip(at(src, 1, s, 0), at(src, 2, s, 0), at(dst, 1, d, 0), cw, false);
+    } else if (dstPlanes) {
+      unzip(at(src, 1, s, 0), at(dst, 1, d, 0), at(dst, 2, d, 0), cw);
+    } else {
+      copyBytes(at(src, 1, s, 0), at(dst, 1, d, 0), 2 * cw, false);
+    }
+  };
+  const int rowSamples = chromaWidth(to, width);
+  if (from == to) {
+    const int rows = from == Scheme::S420 ? height / 2 : height;
+    // Rows that follow each other without a gap in every plane go as one.
+    const int srcBytes = srcPlanes ? rowSamples : 2 * rowSamples, dstBytes = dstPlanes ? rowSamples : 2 * rowSamples;
+    const bool gapless = src.step[1] == srcBytes && dst.step[1] == dstBytes &&
+                         (!srcPlanes || src.step[2] == srcBytes) && (!dstPlanes || dst.step[2] == dstBytes) &&
+                         int64_t(rowSamples) * rows <= kLongestRow;
+    if (gapless) {
+      sameRow(0, 0, rowSamples * rows);
+    } else {
+      for (int r = 0; r < rows; ++r) sameRow(r, r, rowSamples);
+    }
+  } else if (from == Scheme::S422 && to == Scheme::S420) {
+    for (int r = 0; r < height / 2; ++r) sameRow(2 * r, r, rowSamples);  // even rows kept
+  } else if (from == Scheme::S420 && to == Scheme::S422) {
+    for (int r = 0; r < height; ++r) sameRow(r / 2, r, rowSamples);  // each row twice
+  } else if (from == Scheme::S422 && to == Scheme::S411) {
+    const int cw = width / 4;  // even samples kept
+    for (int r = 0; r < height; ++r) {
+      if (dstPlanes) {
+        keepEven(at(src, 1, r, 0), at(dst, 1, r, 0), cw);
+        keepEven(at(src, 2, r, 0), at(dst, 2, r, 0), cw);
+      } else {
+        zipEvens(at(src, 1, r, 0), at(src, 2, r, 0), at(dst, 1, r, 0), cw);
+      }
+    }
+  } else if (from == Scheme::S411 && to == Scheme::S422) {
+    const int cw = width / 4;  // each sample twice
+    for (int r = 0; r < height; ++r) {
+      if (srcPlanes) {
+        doubleSamples(at(src, 1, r, 0), at(dst, 1, r, 0), cw, false);
+        doubleSamples(at(src, 2, r, 0), at(dst, 2, r, 0), cw, false);
+      } else {
+        unzipDouble(at(src, 1, r, 0), at(dst, 1, r, 0), at(dst, 2, r, 0), cw);
+      }
+    }
+  } else if (from == Scheme::S411 && to == Scheme::S420) {
+    const int cw = width / 4;  // two source rows interleave into one
+    for (int r = 0; r < height / 2; ++r) {
+      if (srcPlanes && dstPlanes) {
+        zip(at(src, 1, 2 * r, 0), at(src, 1, 2 * r + 1, 0), at(dst, 1, r, 0), cw, false);
+        zip(at(src, 2, 2 * r, 0), at(src, 2, 2 * r + 1, 0), at(dst, 2, r, 0), cw, false);
+      } else if (srcPlanes) {
+        zip4(at(src, 1, 2 * r, 0), at(src, 2, 2 * r, 0), at(src, 1, 2 * r + 1, 0), at(src, 2, 2 * r + 1, 0),
+             at(dst, 1, r, 0), cw);
+      } else {
+        crossPairs(at(src, 1, 2 * r, 0), at(src, 1, 2 * r + 1, 0), at(dst, 1, r, 0), at(dst, 2, r, 0), 2 * cw);
+      }
+    }
+  } else {  // 4:2:0 to 4:1:1, the inverse
+    const int cw = width / 4;
+    for (int r = 0; r < height / 2; ++r) {
+      if (srcPlanes && dstPlanes) {
+        unzip(at(src, 1, r, 0), at(dst, 1, 2 * r, 0), at(dst, 1, 2 * r + 1, 0), cw);
+        unzip(at(src, 2, r, 0), at(dst, 2, 2 * r, 0), at(dst, 2, 2 * r + 1, 0), cw);
+      } else if (srcPlanes) {
+        crossPairs(at(src, 1, r, 0), at(src, 2, r, 0), at(dst, 1, 2 * r, 0), at(dst, 1, 2 * r + 1, 0), 2 * cw);
+      } else {
+        unzip4(at(src, 1, r, 0), at(dst, 1, 2 * r, 0), at(dst, 2, 2 * r, 0), at(dst, 1, 2 * r + 1, 0),
+               at(dst, 2, 2 * r + 1, 0), cw);
+      }
     }
   }
 }
@@ -236,75 +259,26 @@ Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
   }
   const bool streamLuma = m.streamedLuma && int64_t(width) * height >= 348603;
 
-  const bool pairs = m.src.scheme == Scheme::S420 || m.dst.scheme == Scheme::S420;
-  const int groupRows = pairs ? 2 : 1;
-  const int srcChromaRows = (m.src.scheme == Scheme::S420) ? 1 : groupRows;
-  const int dstChromaRows = (m.dst.scheme == Scheme::S420) ? 1 : groupRows;
-  // Rules that move whole chroma rows and leave the samples of a row alone.
-  const bool moveOnly = m.src.scheme == m.dst.scheme ||
-                        (m.src.scheme == Scheme::S422 && m.dst.scheme == Scheme::S420) ||
-                        (m.src.scheme == Scheme::S420 && m.dst.scheme == Scheme::S422);
+  // Without 4:2:0 every row stands alone; when no plane has a gap between
+  // rows, the image is one long row.
+  if (m.src.scheme != Scheme::S420 && m.dst.scheme != Scheme::S420 && gapless(m.src, src, width) &&
+      gapless(m.dst, dst, width) && int64_t(width) * height <= kLongestRow) {
+    width *= height;
+    height = 1;
+  }
 
   if (m.src.kind == Kind::Pairs && m.dst.kind == Kind::Pairs) {
     // 4:2:2 streams of two byte orders: one byte permutation a row.
     for (int y = 0; y < height; ++y)
       reorderPairs(at(src, 0, y, 0), m.src.order, at(dst, 0, y, 0), m.dst.order, width, nonTemporal);
-    if (nonTemporal) _mm_sfence();
-    return StatusOk;
-  }
-  if (moveOnly && m.dst.kind == Kind::Planes && m.src.kind != Kind::Planes) {
-    unpackIntoPlanes(m, src, dst, width, height);
-    return StatusOk;
-  }
-
-  Staging st;
-  for (int g = 0; g + groupRows <= height; g += groupRows) {
-    for (int x = 0; x < width; x += kChunk) {
-      const int n = std::min(kChunk, width - x);
-      Rows r{};
-      for (int k = 0; k < groupRows; ++k) {
-        const int chromaRow = k < srcChromaRows ? (srcChromaRows == 1 ? g / groupRows : g + k) : -1;
-        // Pair-stream luma lands in the destination's luma row directly,
-        // unless that row is to be streamed.
-        uint8_t* lumaTarget = m.src.kind == Kind::Pairs && m.dst.kind != Kind::Pairs && !nonTemporal && !streamLuma
-                                  ? at(dst, 0, g + k, x)
-                                  : nullptr;
-        readRows(m.src, src, g + k, chromaRow, k, k, x, n, st, r, lumaTarget);
-      }
-      // Chroma rule, written straight into destination planes or staged
-      // for a pair stream or two planes.
-      Staging out;
-      const uint8_t* cb[2];
-      const uint8_t* cr[2];
-      if (m.dst.kind != Kind::Planes && moveOnly) {
-        // Rows are only kept, dropped or repeated: the writer reads the
-        // source chroma rows themselves.
-        for (int k = 0; k < dstChromaRows; ++k) {
-          const int from = m.src.scheme == m.dst.scheme ? k : 0;
-          cb[k] = r.cb[from];
-          cr[k] = r.cr[from];
-        }
-      } else {
-        uint8_t* tcb[2];
-        uint8_t* tcr[2];
-        for (int k = 0; k < dstChromaRows; ++k) {
-          const int chromaRow = dstChromaRows == 1 ? g / groupRows : g + k;
-          chromaTargets(m.dst, dst, chromaRow, k, x, out, tcb[k], tcr[k]);
-          cb[k] = tcb[k];
-          cr[k] = tcr[k];
-        }
-        // Staging stays in the cache: only stores into the planes stream.
-        const bool streamChroma = nonTemporal && m.dst.kind == Kind::Planes;
-        convertChroma(m.src.scheme, m.dst.scheme, r.cb, tcb, dstChromaRows, n, streamChroma);
-        convertChroma(m.src.scheme, m.dst.scheme, r.cr, tcr, dstChromaRows, n, streamChroma);
-      }
-      for (int k = 0; k < groupRows; ++k) {
-        const int chromaSlot = dstChromaRows == 1 ? 0 : k;
-        const int chromaRow = k < dstChromaRows ? (dstChromaRows == 1 ? g / groupRows : g + k) : -1;
-        writeRow(m.dst, dst, g + k, chromaRow, r.y[k], cb[chromaSlot], cr[chromaSlot], x, n, nonTemporal,
-                 streamLuma);
-      }
-    }
+  } else if (m.src.kind == Kind::Pairs) {
+    unpackPairs(m, src, dst, width, height, nonTemporal);
+  } else if (m.dst.kind == Kind::Pairs) {
+    packPairs(m, src, dst, width, height, nonTemporal);
+  } else {
+    // Planar both sides: luma rows copied, then the chroma rule.
+    copyLuma(src, dst, width, height, nonTemporal || streamLuma);
+    moveChroma(m, src, dst, width, height);
   }
   if (nonTemporal || streamLuma) _mm_sfence();
   return StatusOk;
@@ -312,12 +286,28 @@ Status run(const Member& m, const Side& src, const Side& dst, ImageSize size) {
 
 // ---- filtered members ----
 
+// Samples and the rounded means of their right neighbours, 32 a step.
+ZEL_AVX2 void meansBetweenAvx(const uint8_t* c, uint8_t* o, int size) {
+  for (int j = 0; j < size; j += 32) {
+    const __m256i a = load256(c + j), m = _mm256_avg_epu8(a, load256(c + j + 1));
+    const __m256i lo = _mm256_unpacklo_epi8(a, m), hi = _mm256_unpackhi_epi8(a, m);
+    store256(o + 2 * j, _mm256_permute2x128_si256(lo, hi, 0x20));
+    store256(o + 2 * j + 32, _mm256_permute2x128_si256(lo, hi, 0x31));
+  }
+}
+
 // 4:1:1 to 4:2:0 from the even source rows, the new odd columns the
 // average of their neighbours: rounded in blocks of 64 and 16 while more
 // than that many samples remain, truncated for single samples.
 void filter411To420Row(const uint8_t* c, uint8_t* o, int n) {
   int k = 0;
+  const bool avx2 = hasAvx2();
   auto block = [&](int size) {
+    if (avx2 && size == 64) {
+      meansBetweenAvx(c + k, o + 2 * k, size);
+      k += size;
+      return;
+    }
     for (int j = 0; j < size; j += 16) {
       const __m128i a = load128(c + k + j), b = load128(c + k + j + 1);
       const __m128i m = _mm_avg_epu8(a, b);
@@ -334,15 +324,35 @@ void filter411To420Row(const uint8_t* c, uint8_t* o, int n) {
   }
 }
 
+// The 32 even samples of 64 bytes.
+ZEL_AVX2 ZEL_INLINE __m256i evens256(const uint8_t* p, __m256i m) {
+  const __m256i lo = _mm256_shuffle_epi8(load256(p), m), hi = _mm256_shuffle_epi8(load256(p + 32), m);
+  return _mm256_permute4x64_epi64(_mm256_unpacklo_epi64(lo, hi), _MM_SHUFFLE(3, 1, 2, 0));
+}
+
+// Even samples and their rounded means with the row below, 32 a step.
+ZEL_AVX2 int evenMeansAvx(const uint8_t* c, const uint8_t* below, uint8_t* even, uint8_t* odd, int n) {
+  const __m256i m = _mm256_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, -1, -1, -1, -1, -1, -1, -1, -1, 0, 2, 4, 6, 8, 10,
+                                     12, 14, -1, -1, -1, -1, -1, -1, -1, -1);
+  int k = 0;
+  for (; n - k >= 32; k += 32) {
+    const __m256i a = evens256(c + 2 * k, m);
+    store256(even + k, a);
+    store256(odd + k, below ? _mm256_avg_epu8(a, evens256(below + 2 * k, m)) : a);
+  }
+  return k;
+}
+
 // 4:2:0 to 4:1:1 from the even columns, the new odd rows the average of
 // the rows above and below: rounded in blocks of 32 while 32 remain,
 // truncated after that; the last source row is copied.
+
 void filter420To411Rows(const uint8_t* c, const uint8_t* below, uint8_t* even, uint8_t* odd, int n) {
   const __m128i m = _mm_setr_epi8(0, 2, 4, 6, 8, 10, 12, 14, -1, -1, -1, -1, -1, -1, -1, -1);
   auto evens = [&](const uint8_t* p) {
     return _mm_unpacklo_epi64(_mm_shuffle_epi8(load128(p), m), _mm_shuffle_epi8(load128(p + 16), m));
   };
-  int k = 0;
+  int k = hasAvx2() ? evenMeansAvx(c, below, even, odd, n) : 0;
   for (; n - k >= 32; k += 32)
     for (int j = 0; j < 32; j += 16) {
       const __m128i a = evens(c + 2 * (k + j));
@@ -358,7 +368,7 @@ void filter420To411Rows(const uint8_t* c, const uint8_t* below, uint8_t* even, u
 Status filter411To420(const Side& src, const Side& dst, ImageSize size) {
   if (size.width < 4 || size.height < 4 || (size.width & 3) || (size.height & 3)) return StatusSizeError;
   const int n = size.width / 4;
-  for (int y = 0; y < size.height; ++y) copyBytes(at(src, 0, y, 0), at(dst, 0, y, 0), size.width, false);
+  copyLuma(src, dst, size.width, size.height, false);
   for (int i = 0; i < size.height / 2; ++i)
     for (int p = 1; p <= 2; ++p) filter411To420Row(at(src, p, 2 * i, 0), at(dst, p, i, 0), n);
   return StatusOk;
@@ -368,7 +378,7 @@ Status filter420To411(const Side& src, const Side& dst, ImageSize size) {
   if (size.width < 4 || size.height < 2 || (size.width & 3) || (size.height & 1)) return StatusSizeError;
   const int n = size.width / 4;
   const int rows = size.height / 2;
-  for (int y = 0; y < size.height; ++y) copyBytes(at(src, 0, y, 0), at(dst, 0, y, 0), size.width, false);
+  copyLuma(src, dst, size.width, size.height, false);
   for (int i = 0; i < rows; ++i)
     for (int p = 1; p <= 2; ++p)
       filter420To411Rows(at(src, p, i, 0), i + 1 < rows ? at(src, p, i + 1, 0) : nullptr, at(dst, p, 2 * i, 0),
@@ -560,6 +570,11 @@ ZEL_PUBLIC Status zeliYCbCr422ToGray_8u_C2C1R(const uint8_t* src, int srcStep, u
                                               ImageSize size) {
   if (!src || !dst) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
+  // Luma sits at every second byte, so gapless rows read as one long row.
+  if (srcStep == 2 * size.width && dstStep == size.width && int64_t(size.width) * size.height <= kLongestRow) {
+    lumaOfPairs(src, PairOrder::YCbCr, dst, size.width * size.height);
+    return StatusOk;
+  }
   zel::plainWalk(size.height, [&](int y) {
     lumaOfPairs(zel::rowAt(src, srcStep, y), PairOrder::YCbCr, zel::rowAt(dst, dstStep, y), size.width);
   });

@@ -9,6 +9,7 @@
 #include "frame/image_layout.h"
 #include "frame/scalar_ops.h"
 #include "frame/simd.h"
+#include "luma_chroma/repack_rows.h"
 
 namespace zel::slices {
 
@@ -49,6 +50,41 @@ struct Frame {
   }
 };
 
+// The vector luma forms: rounded means of means.
+ZEL_AVX2 ZEL_INLINE __m256i lumaForm(Form form, __m256i v, __m256i u, __m256i d) {
+  if (form == Form::First) return _mm256_avg_epu8(v, _mm256_avg_epu8(v, d));
+  if (form == Form::Last) return _mm256_avg_epu8(v, _mm256_avg_epu8(v, u));
+  return _mm256_avg_epu8(_mm256_avg_epu8(v, u), _mm256_avg_epu8(v, d));
+}
+
+ZEL_AVX2 int lumaBodyAvx(const uint8_t* y, const uint8_t* up, const uint8_t* down, Form form, int bodyEnd,
+                         uint8_t* out) {
+  int x = 0;
+  for (; x + 32 <= bodyEnd; x += 32) store256(out + x, lumaForm(form, load256(y + x), load256(up + x), load256(down + x)));
+  return x;
+}
+
+ZEL_AVX2 int chromaBodyAvx(const uint8_t* a, const uint8_t* b, int bodyEnd, uint8_t* out) {
+  int x = 0;
+  for (; x + 32 <= bodyEnd; x += 32) store256(out + x, _mm256_avg_epu8(load256(a + x), load256(b + x)));
+  return x;
+}
+
+// Inner rows of the interleaved output in one pass, 32 pixels a step:
+// luma form, chroma blend and the Y0 Cb Y1 Cr weave.
+ZEL_AVX2 int innerInterleavedAvx(const uint8_t* y, const uint8_t* up, const uint8_t* down, const uint8_t* ca,
+                                 const uint8_t* cb, int bodyEnd, uint8_t* out) {
+  int x = 0;
+  for (; x + 32 <= bodyEnd; x += 32) {
+    const __m256i luma = lumaForm(Form::Inner, load256(y + x), load256(up + x), load256(down + x));
+    const __m256i chroma = _mm256_avg_epu8(load256(ca + x), load256(cb + x));
+    const __m256i lo = _mm256_unpacklo_epi8(luma, chroma), hi = _mm256_unpackhi_epi8(luma, chroma);
+    store256(out + 2 * x, _mm256_permute2x128_si256(lo, hi, 0x20));
+    store256(out + 2 * x + 32, _mm256_permute2x128_si256(lo, hi, 0x31));
+  }
+  return x;
+}
+
 // Luma of one output row in the vector form below `bodyEnd` (16 a step)
 // and the tail form after it.
 void lumaRow(const Frame& f, int r, Form form, int bodyEnd, uint8_t* out) {
@@ -60,7 +96,7 @@ void lumaRow(const Frame& f, int r, Form form, int bodyEnd, uint8_t* out) {
     if (form == Form::Last) return _mm_avg_epu8(v, _mm_avg_epu8(v, u));
     return _mm_avg_epu8(_mm_avg_epu8(v, u), _mm_avg_epu8(v, d));
   };
-  int x = 0;
+  int x = hasAvx2() ? lumaBodyAvx(y, up, down, form, bodyEnd, out) : 0;
   for (; x + 16 <= bodyEnd; x += 16) store128(out + x, body(load128(y + x), load128(up + x), load128(down + x)));
   for (; x < bodyEnd; x += 8) store64(out + x, body(load64(y + x), load64(up + x), load64(down + x)));
   for (; x < f.width; ++x)
@@ -71,7 +107,7 @@ void lumaRow(const Frame& f, int r, Form form, int bodyEnd, uint8_t* out) {
 
 // Chroma pair bytes of one blend: rounded below `bodyEnd` bytes, truncated after.
 void chromaBlend(const uint8_t* a, const uint8_t* b, int bodyEnd, int bytes, uint8_t* out) {
-  int x = 0;
+  int x = hasAvx2() ? chromaBodyAvx(a, b, bodyEnd, out) : 0;
   for (; x + 16 <= bodyEnd; x += 16) store128(out + x, _mm_avg_epu8(load128(a + x), load128(b + x)));
   for (; x < bodyEnd; x += 8) store64(out + x, _mm_avg_epu8(load64(a + x), load64(b + x)));
   for (; x < bytes; ++x) out[x] = uint8_t(TruncatedMean(a[x], b[x]));
@@ -83,6 +119,10 @@ constexpr int kChunk = 2048;  // pixels a step
 
 // Luma and chroma pair rows merged into Y0 Cb Y1 Cr.
 void mergeRow(const uint8_t* y, const uint8_t* c, uint8_t* out, int width) {
+  if (!(width & 1)) {
+    repack::mergePairsCbCr(y, c, repack::PairOrder::YCbCr, out, width, false);
+    return;
+  }
   int x = 0;
   for (; x + 16 <= width; x += 16) {
     const __m128i luma = load128(y + x), chroma = load128(c + x);
@@ -145,7 +185,8 @@ void frameInnerRowInterleaved(const Frame& f, int r, uint8_t* out) {
   const uint8_t *ca, *cb;
   f.blendRows(r >> 1, ca, cb);
   alignas(16) uint8_t luma[kChunk + 16], chroma[kChunk + 16];
-  for (int x0 = 0; x0 < bodyEnd; x0 += kChunk) {
+  const int fused = hasAvx2() ? innerInterleavedAvx(f.Y(r), f.Y(r - 1), f.Y(r + 1), ca, cb, bodyEnd, out) : 0;
+  for (int x0 = fused; x0 < bodyEnd; x0 += kChunk) {
     const int n = std::min(kChunk, bodyEnd - x0);
     Frame part = f;
     part.y = f.y + x0;
@@ -219,10 +260,7 @@ void filterPlanar(const Frame& f, uint8_t* const dst[3], const int dstStep[3], i
       chromaBlend(a + 2 * k0, b + 2 * k0, 2 * body, 2 * m, pairs);
       uint8_t* p1 = chromaOut(1, j) + k0;
       uint8_t* p2 = chromaOut(2, j) + k0;
-      for (int k = 0; k < m; ++k) {
-        p1[k] = pairs[2 * k];
-        p2[k] = pairs[2 * k + 1];
-      }
+      repack::unzip(pairs, p1, p2, m);
     }
   };
 

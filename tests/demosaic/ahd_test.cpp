@@ -198,7 +198,8 @@ void expectLikeReference(const TestImage<T>& m, int grid, CfaRegion region) {
 
 template <typename T>
 void wholeFrames() {
-  const int sizes[][2] = {{5, 5}, {6, 5}, {5, 7}, {11, 11}, {12, 13}, {16, 9}, {23, 18}, {40, 12}};
+  // The widest rows cross the column chunks of the luma-chroma rows.
+  const int sizes[][2] = {{5, 5}, {6, 5}, {5, 7}, {11, 11}, {12, 13}, {16, 9}, {23, 18}, {40, 12}, {273, 9}, {301, 12}};
   for (const auto& sz : sizes)
     for (int grid = 0; grid < 4; ++grid) {
       TestImage<T> m(sz[0], sz[1], 1, sizeof(T) == 1 ? 3 : 0);

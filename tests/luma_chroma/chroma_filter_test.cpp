@@ -486,7 +486,7 @@ void bgrModel(int Y, int cr, int cb, bool wide, int* bgr) {
 }
 
 TEST(ChromaFilters, BgrFromInterpolatedChroma) {
-  for (int w : {1, 2, 3, 17, 18, 19, 34, 35, 70})
+  for (int w : {1, 2, 3, 17, 18, 19, 34, 35, 50, 70, 100})
     for (int h : {1, 2, 3, 4})
       for (int offset : {0, 1}) {
         const int room = std::max(w, 2);
