@@ -465,6 +465,15 @@ inline int64_t alignPixels(const float* src, float* dst, int64_t x, int64_t pixe
   return x;
 }
 
+// A streamed run is far larger than the caches: its source is asked for
+// this many bytes ahead of the block being read (an address past the end
+// of the source is only a hint, never touched).
+constexpr uintptr_t kStreamPrefetchBytes = 4096;
+
+inline void prefetchAhead(const float* s) {
+  _mm_prefetch(reinterpret_cast<const char*>(reinterpret_cast<uintptr_t>(s) + kStreamPrefetchBytes), _MM_HINT_T0);
+}
+
 // Eight pixels per block, pixels x..x+3 in the low lanes and x+4..x+7 in
 // the high lanes of every register, 32-byte stores (streamed: dst + 3 * x
 // on a 32-byte boundary). Returns where the blocks stop.
@@ -475,6 +484,7 @@ ZEL_AVX2 int64_t wide32fC3(const float* src, float* dst, int64_t x, int64_t pixe
     for (int j = 0; j < 4; ++j) t[i][j] = _mm256_set1_ps(m.t[i][j]);
   for (; x + 8 <= pixels; x += 8) {
     const float* s = src + x * 3;
+    if constexpr (Stream) prefetchAhead(s);
     const __m256 l0 = _mm256_loadu_ps(s), l1 = _mm256_loadu_ps(s + 8), l2 = _mm256_loadu_ps(s + 16);
     // Samples 0..11 of the block in the low lanes, 12..23 in the high lanes.
     const __m256 p0 = _mm256_blend_ps(l0, l1, 0xF0), p1 = _mm256_permute2f128_ps(l0, l2, 0x21),
@@ -522,6 +532,7 @@ void row32fC3(const float* src, float* dst, int64_t pixels, const Matrix& m, boo
   if (wide) x = streamed ? wide32fC3<true>(src, dst, x, pixels, m) : wide32fC3<false>(src, dst, x, pixels, m);
   for (; x + 4 <= pixels; x += 4) {
     const float* s = src + x * 3;
+    if (streamed) prefetchAhead(s);
     const Lanes3 v = split32fC3(_mm_loadu_ps(s), _mm_loadu_ps(s + 4), _mm_loadu_ps(s + 8));
     const Pixels3 q = merge32fC3(output4(c, 0, v), output4(c, 1, v), output4(c, 2, v));
     float* d = dst + x * 3;
