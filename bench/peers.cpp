@@ -99,6 +99,12 @@ const CvtRow kCvtRows[] = {
     {"zeliRGBToYCC_16u_C3R", "OpenCV cvtColor RGB2YCrCb 16u", CV_16UC3, CV_16UC3, cv::COLOR_RGB2YCrCb},
     {"zeliYCCToRGB_16u_C3R", "OpenCV cvtColor YCrCb2RGB 16u", CV_16UC3, CV_16UC3, cv::COLOR_YCrCb2RGB},
     {"zeliRGBToYCC_16s_C3R", "OpenCV cvtColor RGB2YCrCb 16u", CV_16UC3, CV_16UC3, cv::COLOR_RGB2YCrCb},
+    {"zeliYCCToRGB_16s_C3R", "OpenCV cvtColor YCrCb2RGB 16u", CV_16UC3, CV_16UC3, cv::COLOR_YCrCb2RGB},
+    // The 16-bit Photo YCC bodies work in single precision: the float rows too.
+    {"zeliRGBToYCC_16u_C3R", "OpenCV cvtColor RGB2YCrCb 32f", CV_32FC3, CV_32FC3, cv::COLOR_RGB2YCrCb},
+    {"zeliYCCToRGB_16u_C3R", "OpenCV cvtColor YCrCb2RGB 32f", CV_32FC3, CV_32FC3, cv::COLOR_YCrCb2RGB},
+    {"zeliRGBToYCC_16s_C3R", "OpenCV cvtColor RGB2YCrCb 32f", CV_32FC3, CV_32FC3, cv::COLOR_RGB2YCrCb},
+    {"zeliYCCToRGB_16s_C3R", "OpenCV cvtColor YCrCb2RGB 32f", CV_32FC3, CV_32FC3, cv::COLOR_YCrCb2RGB},
     {"zeliRGBToYCC_32f_C3R", "OpenCV cvtColor RGB2YCrCb 32f", CV_32FC3, CV_32FC3, cv::COLOR_RGB2YCrCb},
     {"zeliYCCToRGB_32f_C3R", "OpenCV cvtColor YCrCb2RGB 32f", CV_32FC3, CV_32FC3, cv::COLOR_YCrCb2RGB},
 };

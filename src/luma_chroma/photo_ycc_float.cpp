@@ -84,6 +84,22 @@ struct Read16 {
     };
     return {channel(0), channel(1), channel(2)};
   }
+  // Eight pixels: pixels 0..3 in the low 128-bit lane, 4..7 in the high one.
+  ZEL_AVX2 ZEL_INLINE FloatTrio<Ps8> get8(int x) const {
+    const uint16_t* s = p + Channels * x;
+    const __m256i a = _mm256_inserti128_si256(_mm256_castsi128_si256(load128(s)), load128(s + 4 * Channels), 1);
+    const __m256i b =
+        Channels == 3
+            ? _mm256_inserti128_si256(_mm256_castsi128_si256(load64(s + 8)), load64(s + 8 + 4 * Channels), 1)
+            : _mm256_inserti128_si256(_mm256_castsi128_si256(load128(s + 8)), load128(s + 8 + 4 * Channels), 1);
+    return {channel8(a, b, 0), channel8(a, b, 1), channel8(a, b, 2)};
+  }
+  ZEL_AVX2 ZEL_INLINE static __m256 channel8(__m256i a, __m256i b, int c) {
+    using M = WordMasks<Channels>;
+    const __m256i v = _mm256_or_si256(_mm256_shuffle_epi8(a, broadcast128(M::gather[c][0].b)),
+                                      _mm256_shuffle_epi8(b, broadcast128(M::gather[c][1].b)));
+    return _mm256_cvtepi32_ps(_mm256_xor_si256(v, _mm256_set1_epi32(Signed ? 0x8000 : 0)));
+  }
   // Samples as the tails take them: unsigned, or signed values.
   Samples3 pixel(int x) const {
     const uint16_t* s = p + Channels * x;
@@ -114,6 +130,30 @@ struct Write16 {
       store128(d + 8, _mm_blend_epi16(out1, load128(d + 8), 0x88));
     }
   }
+  // Eight pixels as put4 stores four, from the two 128-bit lanes.
+  ZEL_AVX2 ZEL_INLINE void put8(int x, __m256i c0, __m256i c1, __m256i c2) const {
+    using M = WordMasks<Channels>;
+    const __m256i flip = _mm256_set1_epi16(Signed ? int16_t(-32768) : 0);
+    const __m256i P = _mm256_xor_si256(_mm256_packus_epi32(c0, c1), flip);
+    const __m256i Q = _mm256_xor_si256(_mm256_packus_epi32(c2, c2), flip);
+    const __m256i out0 = _mm256_or_si256(_mm256_shuffle_epi8(P, broadcast128(M::scatter[0][0].b)),
+                                         _mm256_shuffle_epi8(Q, broadcast128(M::scatter[0][1].b)));
+    const __m256i out1 = _mm256_or_si256(_mm256_shuffle_epi8(P, broadcast128(M::scatter[1][0].b)),
+                                         _mm256_shuffle_epi8(Q, broadcast128(M::scatter[1][1].b)));
+    uint16_t* d = p + Channels * x;
+    if constexpr (Channels == 3) {
+      store128(d, _mm256_castsi256_si128(out0));
+      store64(d + 8, _mm256_castsi256_si128(out1));
+      store128(d + 12, _mm256_extracti128_si256(out0, 1));
+      store64(d + 20, _mm256_extracti128_si256(out1, 1));
+    } else {
+      auto* v = reinterpret_cast<__m256i*>(d);
+      const __m256i first = _mm256_permute2x128_si256(out0, out1, 0x20);
+      const __m256i second = _mm256_permute2x128_si256(out0, out1, 0x31);
+      _mm256_storeu_si256(v, _mm256_blend_epi16(first, _mm256_loadu_si256(v), 0x88));
+      _mm256_storeu_si256(v + 1, _mm256_blend_epi16(second, _mm256_loadu_si256(v + 1), 0x88));
+    }
+  }
   void putWords(int x, Word3 w) const {
     uint16_t* d = p + Channels * x;
     storeSample(d, w.c0);
@@ -139,6 +179,30 @@ struct Read32f {
       _MM_TRANSPOSE4_PS(p0, p1, p2, p3);
       return {p0, p1, p2};
     }
+  }
+  // Eight pixels, 0..3 in the low 128-bit lane and 4..7 in the high one,
+  // split as get4 splits four.
+  ZEL_AVX2 ZEL_INLINE FloatTrio<Ps8> get8(int x) const {
+    const float* s = p + Channels * x;
+    if constexpr (Channels == 3) {
+      const __m256 a = pair8(s + 0), b = pair8(s + 4), c = pair8(s + 8);
+      const __m256 r = _mm256_blend_ps(_mm256_blend_ps(a, b, 0x44), c, 0x22);
+      const __m256 g = _mm256_blend_ps(_mm256_blend_ps(a, b, 0x99), c, 0x44);
+      const __m256 bl = _mm256_blend_ps(_mm256_blend_ps(a, b, 0x22), c, 0x99);
+      return {_mm256_shuffle_ps(r, r, _MM_SHUFFLE(1, 2, 3, 0)), _mm256_shuffle_ps(g, g, _MM_SHUFFLE(2, 3, 0, 1)),
+              _mm256_shuffle_ps(bl, bl, _MM_SHUFFLE(3, 0, 1, 2))};
+    } else {
+      const __m256 p0 = pair8(s + 0), p1 = pair8(s + 4), p2 = pair8(s + 8), p3 = pair8(s + 12);
+      const __m256 t0 = _mm256_unpacklo_ps(p0, p1), t1 = _mm256_unpacklo_ps(p2, p3);
+      const __m256 t2 = _mm256_unpackhi_ps(p0, p1), t3 = _mm256_unpackhi_ps(p2, p3);
+      return {_mm256_shuffle_ps(t0, t1, _MM_SHUFFLE(1, 0, 1, 0)), _mm256_shuffle_ps(t0, t1, _MM_SHUFFLE(3, 2, 3, 2)),
+              _mm256_shuffle_ps(t2, t3, _MM_SHUFFLE(1, 0, 1, 0))};
+    }
+  }
+  // Four floats at s in the low lane, four at s + 4 Channels (four pixels
+  // on) in the high one.
+  ZEL_AVX2 ZEL_INLINE static __m256 pair8(const float* s) {
+    return _mm256_insertf128_ps(_mm256_castps128_ps256(_mm_loadu_ps(s)), _mm_loadu_ps(s + 4 * Channels), 1);
   }
   Float3 pixel(int x) const {
     const float* s = p + Channels * x;
@@ -167,6 +231,30 @@ struct Write32f {
       _mm_storeu_ps(d + 12, _mm_blend_ps(p3, _mm_loadu_ps(d + 12), 0x8));
     }
   }
+  ZEL_AVX2 ZEL_INLINE void put8(int x, const FloatTrio<Ps8>& v) const {
+    float* d = p + Channels * x;
+    if constexpr (Channels == 3) {
+      const __m256 r = _mm256_shuffle_ps(v.c0, v.c0, _MM_SHUFFLE(1, 2, 3, 0));
+      const __m256 g = _mm256_shuffle_ps(v.c1, v.c1, _MM_SHUFFLE(2, 3, 0, 1));
+      const __m256 b = _mm256_shuffle_ps(v.c2, v.c2, _MM_SHUFFLE(3, 0, 1, 2));
+      storePair8(d + 0, _mm256_blend_ps(_mm256_blend_ps(r, g, 0x22), b, 0x44));
+      storePair8(d + 4, _mm256_blend_ps(_mm256_blend_ps(r, g, 0x99), b, 0x22));
+      storePair8(d + 8, _mm256_blend_ps(_mm256_blend_ps(r, b, 0x99), g, 0x44));
+    } else {
+      const __m256 t0 = _mm256_unpacklo_ps(v.c0, v.c1), t2 = _mm256_unpackhi_ps(v.c0, v.c1);
+      const __m256 t1 = _mm256_unpacklo_ps(v.c2, _mm256_setzero_ps()), t3 = _mm256_unpackhi_ps(v.c2, _mm256_setzero_ps());
+      const __m256 q[4] = {_mm256_shuffle_ps(t0, t1, _MM_SHUFFLE(1, 0, 1, 0)), _mm256_shuffle_ps(t0, t1, _MM_SHUFFLE(3, 2, 3, 2)),
+                           _mm256_shuffle_ps(t2, t3, _MM_SHUFFLE(1, 0, 1, 0)), _mm256_shuffle_ps(t2, t3, _MM_SHUFFLE(3, 2, 3, 2))};
+      for (int k = 0; k < 4; ++k) {
+        // The fourth sample of each pixel stays as it is.
+        storePair8(d + 4 * k, _mm256_blend_ps(q[k], Read32f<Channels>::pair8(d + 4 * k), 0x88));
+      }
+    }
+  }
+  ZEL_AVX2 ZEL_INLINE static void storePair8(float* d, __m256 w) {
+    _mm_storeu_ps(d, _mm256_castps256_ps128(w));
+    _mm_storeu_ps(d + 4 * Channels, _mm256_extractf128_ps(w, 1));
+  }
   void putPixel(int x, Float3 v) const {
     float* d = p + Channels * x;
     storeSample(d, v.c0);
@@ -175,14 +263,29 @@ struct Write32f {
   }
 };
 
+// Eight-pixel blocks of the 16-bit body below `end` (a multiple of 4), in
+// AVX2; returns where they stop.
+template <int Channels, bool Signed, typename Body>
+ZEL_AVX2 __attribute__((flatten)) int yccBlocks16Avx(const uint16_t* src, uint16_t* dst, int end, Body body) {
+  const Read16<Channels, Signed> in{src};
+  const Write16<Channels, Signed> out{dst};
+  int x = 0;
+  for (; x + 8 <= end; x += 8) {
+    const FloatTrio<Ps8> v = in.get8(x);
+    const FloatTrio<Ps8> r = body(v.c0, v.c1, v.c2);
+    out.put8(x, _mm256_cvtps_epi32(r.c0), _mm256_cvtps_epi32(r.c1), _mm256_cvtps_epi32(r.c2));
+  }
+  return x;
+}
+
 // A 16-bit row: the float body, rounded, over [0, width AND NOT 3), then
 // the tail.
 template <int Channels, bool Signed, typename Body, typename Tail>
-void yccRow16(const uint16_t* src, uint16_t* dst, int width, Body body, Tail tail) {
+void yccRow16(const uint16_t* src, uint16_t* dst, int width, Body body, Tail tail, bool avx2) {
   const Read16<Channels, Signed> in{src};
   const Write16<Channels, Signed> out{dst};
   const int end = bodyEnd(width, 4);
-  int x = 0;
+  int x = avx2 ? yccBlocks16Avx<Channels, Signed>(src, dst, end, body) : 0;
   for (; x < end; x += 4) {
     const Floats3 v = in.get4(x);
     const Floats3 r = body(v.c0, v.c1, v.c2);
@@ -195,10 +298,22 @@ void yccRow16(const uint16_t* src, uint16_t* dst, int width, Body body, Tail tai
 }
 
 template <int Channels, typename Form>
-void yccRow32f(const float* src, float* dst, int width, Form form) {
+ZEL_AVX2 __attribute__((flatten)) int yccBlocks32fAvx(const float* src, float* dst, int width, Form form) {
   const Read32f<Channels> in{src};
   const Write32f<Channels> out{dst};
   int x = 0;
+  for (; x + 8 <= width; x += 8) {
+    const FloatTrio<Ps8> v = in.get8(x);
+    out.put8(x, form(v.c0, v.c1, v.c2));
+  }
+  return x;
+}
+
+template <int Channels, typename Form>
+void yccRow32f(const float* src, float* dst, int width, Form form, bool avx2) {
+  const Read32f<Channels> in{src};
+  const Write32f<Channels> out{dst};
+  int x = avx2 ? yccBlocks32fAvx<Channels>(src, dst, width, form) : 0;
   for (; x + 4 <= width; x += 4) {
     const Floats3 v = in.get4(x);
     out.put4(x, form(v.c0, v.c1, v.c2));
@@ -212,39 +327,37 @@ void yccRow32f(const float* src, float* dst, int width, Form form) {
 }  // namespace
 
 template <int Channels, bool Signed>
-void rgbToYcc16Row(const uint16_t* src, uint16_t* dst, int width) {
-  yccRow16<Channels, Signed>(src, dst, width, [](__m128 r, __m128 g, __m128 b) { return rgbToYccBody16(r, g, b); },
-                             Signed ? rgbToYccTail16s : rgbToYccTail16u);
+void rgbToYcc16Row(const uint16_t* src, uint16_t* dst, int width, bool avx2) {
+  yccRow16<Channels, Signed>(src, dst, width, RgbToYccBody16Form{}, Signed ? rgbToYccTail16s : rgbToYccTail16u, avx2);
 }
 
 template <int Channels, bool Signed>
-void yccToRgb16Row(const uint16_t* src, uint16_t* dst, int width) {
-  yccRow16<Channels, Signed>(src, dst, width, [](__m128 y, __m128 c1, __m128 c2) { return yccToRgbBody16(y, c1, c2); },
-                             Signed ? yccToRgbTail16s : yccToRgbTail16u);
+void yccToRgb16Row(const uint16_t* src, uint16_t* dst, int width, bool avx2) {
+  yccRow16<Channels, Signed>(src, dst, width, YccToRgbBody16Form{}, Signed ? yccToRgbTail16s : yccToRgbTail16u, avx2);
 }
 
 template <int Channels>
-void rgbToYcc32fRow(const float* src, float* dst, int width) {
-  yccRow32f<Channels>(src, dst, width, [](auto r, auto g, auto b) { return rgbToYcc32f(r, g, b); });
+void rgbToYcc32fRow(const float* src, float* dst, int width, bool avx2) {
+  yccRow32f<Channels>(src, dst, width, RgbToYcc32fForm{}, avx2);
 }
 
 template <int Channels>
-void yccToRgb32fRow(const float* src, float* dst, int width) {
-  yccRow32f<Channels>(src, dst, width, [](auto y, auto c1, auto c2) { return yccToRgb32f(y, c1, c2); });
+void yccToRgb32fRow(const float* src, float* dst, int width, bool avx2) {
+  yccRow32f<Channels>(src, dst, width, YccToRgb32fForm{}, avx2);
 }
 
-template void rgbToYcc16Row<3, false>(const uint16_t*, uint16_t*, int);
-template void rgbToYcc16Row<4, false>(const uint16_t*, uint16_t*, int);
-template void rgbToYcc16Row<3, true>(const uint16_t*, uint16_t*, int);
-template void rgbToYcc16Row<4, true>(const uint16_t*, uint16_t*, int);
-template void yccToRgb16Row<3, false>(const uint16_t*, uint16_t*, int);
-template void yccToRgb16Row<4, false>(const uint16_t*, uint16_t*, int);
-template void yccToRgb16Row<3, true>(const uint16_t*, uint16_t*, int);
-template void yccToRgb16Row<4, true>(const uint16_t*, uint16_t*, int);
-template void rgbToYcc32fRow<3>(const float*, float*, int);
-template void rgbToYcc32fRow<4>(const float*, float*, int);
-template void yccToRgb32fRow<3>(const float*, float*, int);
-template void yccToRgb32fRow<4>(const float*, float*, int);
+template void rgbToYcc16Row<3, false>(const uint16_t*, uint16_t*, int, bool);
+template void rgbToYcc16Row<4, false>(const uint16_t*, uint16_t*, int, bool);
+template void rgbToYcc16Row<3, true>(const uint16_t*, uint16_t*, int, bool);
+template void rgbToYcc16Row<4, true>(const uint16_t*, uint16_t*, int, bool);
+template void yccToRgb16Row<3, false>(const uint16_t*, uint16_t*, int, bool);
+template void yccToRgb16Row<4, false>(const uint16_t*, uint16_t*, int, bool);
+template void yccToRgb16Row<3, true>(const uint16_t*, uint16_t*, int, bool);
+template void yccToRgb16Row<4, true>(const uint16_t*, uint16_t*, int, bool);
+template void rgbToYcc32fRow<3>(const float*, float*, int, bool);
+template void rgbToYcc32fRow<4>(const float*, float*, int, bool);
+template void yccToRgb32fRow<3>(const float*, float*, int, bool);
+template void yccToRgb32fRow<4>(const float*, float*, int, bool);
 
 }  // namespace zel::lc
 
@@ -255,47 +368,54 @@ namespace {
 // Signed samples travel as their 16-bit patterns.
 const uint16_t* words(const int16_t* p) { return reinterpret_cast<const uint16_t*>(p); }
 uint16_t* words(int16_t* p) { return reinterpret_cast<uint16_t*>(p); }
+const uint16_t* words(const uint16_t* p) { return p; }
+uint16_t* words(uint16_t* p) { return p; }
+const float* words(const float* p) { return p; }
+float* words(float* p) { return p; }
+
+// A plain walk of one row kernel, on the vector width of the processor.
+template <auto Row, typename T>
+Status walk(const T* src, int srcStep, T* dst, int dstStep, ImageSize size) {
+  const bool avx2 = zel::hasAvx2();
+  return walkElements(src, srcStep, dst, dstStep, size,
+                      [avx2](const T* s, T* d, int w) { Row(words(s), words(d), w, avx2); });
+}
 
 }  // namespace
 
 ZEL_PUBLIC Status zeliRGBToYCC_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size) {
-  return walkElements(src, srcStep, dst, dstStep, size, rgbToYcc16Row<3, false>);
+  return walk<rgbToYcc16Row<3, false>>(src, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliRGBToYCC_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size) {
-  return walkElements(src, srcStep, dst, dstStep, size, rgbToYcc16Row<4, false>);
+  return walk<rgbToYcc16Row<4, false>>(src, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliRGBToYCC_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size) {
-  return walkElements(src, srcStep, dst, dstStep, size,
-                      [](const int16_t* s, int16_t* d, int w) { rgbToYcc16Row<3, true>(words(s), words(d), w); });
+  return walk<rgbToYcc16Row<3, true>>(src, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliRGBToYCC_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size) {
-  return walkElements(src, srcStep, dst, dstStep, size,
-                      [](const int16_t* s, int16_t* d, int w) { rgbToYcc16Row<4, true>(words(s), words(d), w); });
+  return walk<rgbToYcc16Row<4, true>>(src, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliRGBToYCC_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
-  return walkElements(src, srcStep, dst, dstStep, size, rgbToYcc32fRow<3>);
+  return walk<rgbToYcc32fRow<3>>(src, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliRGBToYCC_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
-  return walkElements(src, srcStep, dst, dstStep, size, rgbToYcc32fRow<4>);
+  return walk<rgbToYcc32fRow<4>>(src, srcStep, dst, dstStep, size);
 }
-
 ZEL_PUBLIC Status zeliYCCToRGB_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size) {
-  return walkElements(src, srcStep, dst, dstStep, size, yccToRgb16Row<3, false>);
+  return walk<yccToRgb16Row<3, false>>(src, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliYCCToRGB_16u_AC4R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep, ImageSize size) {
-  return walkElements(src, srcStep, dst, dstStep, size, yccToRgb16Row<4, false>);
+  return walk<yccToRgb16Row<4, false>>(src, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliYCCToRGB_16s_C3R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size) {
-  return walkElements(src, srcStep, dst, dstStep, size,
-                      [](const int16_t* s, int16_t* d, int w) { yccToRgb16Row<3, true>(words(s), words(d), w); });
+  return walk<yccToRgb16Row<3, true>>(src, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliYCCToRGB_16s_AC4R(const int16_t* src, int srcStep, int16_t* dst, int dstStep, ImageSize size) {
-  return walkElements(src, srcStep, dst, dstStep, size,
-                      [](const int16_t* s, int16_t* d, int w) { yccToRgb16Row<4, true>(words(s), words(d), w); });
+  return walk<yccToRgb16Row<4, true>>(src, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliYCCToRGB_32f_C3R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
-  return walkElements(src, srcStep, dst, dstStep, size, yccToRgb32fRow<3>);
+  return walk<yccToRgb32fRow<3>>(src, srcStep, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliYCCToRGB_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
-  return walkElements(src, srcStep, dst, dstStep, size, yccToRgb32fRow<4>);
+  return walk<yccToRgb32fRow<4>>(src, srcStep, dst, dstStep, size);
 }

@@ -81,9 +81,37 @@ inline Pixel8 yccToRgbWide(int Y, int C1, int C2) {
 struct Float3 {
   float c0, c1, c2;
 };
-struct Floats3 {
-  __m128 c0, c1, c2;
+
+// Float lanes at two widths, one operation per intrinsic, so the same form
+// gives the same bits lane by lane: Ps4 four lanes (SSE), Ps8 eight (AVX2,
+// lane k + 4 of a block is pixel k + 4).
+struct Ps4 {
+  using V = __m128;
+  static V set(float v) { return _mm_set1_ps(v); }
+  static V zero() { return _mm_setzero_ps(); }
+  static V add(V a, V b) { return _mm_add_ps(a, b); }
+  static V sub(V a, V b) { return _mm_sub_ps(a, b); }
+  static V mul(V a, V b) { return _mm_mul_ps(a, b); }
+  // MINPS and MAXPS return their second operand when either is NaN.
+  static V min(V a, V b) { return _mm_min_ps(a, b); }
+  static V max(V a, V b) { return _mm_max_ps(a, b); }
 };
+struct Ps8 {
+  using V = __m256;
+  ZEL_AVX2 static V set(float v) { return _mm256_set1_ps(v); }
+  ZEL_AVX2 static V zero() { return _mm256_setzero_ps(); }
+  ZEL_AVX2 static V add(V a, V b) { return _mm256_add_ps(a, b); }
+  ZEL_AVX2 static V sub(V a, V b) { return _mm256_sub_ps(a, b); }
+  ZEL_AVX2 static V mul(V a, V b) { return _mm256_mul_ps(a, b); }
+  ZEL_AVX2 static V min(V a, V b) { return _mm256_min_ps(a, b); }
+  ZEL_AVX2 static V max(V a, V b) { return _mm256_max_ps(a, b); }
+};
+
+template <class P>
+struct FloatTrio {
+  typename P::V c0, c1, c2;
+};
+using Floats3 = FloatTrio<Ps4>;
 // Three 16-bit results as stored: unsigned samples, or the bits of signed
 // ones.
 struct Word3 {
@@ -96,12 +124,11 @@ inline Float3 rgbToYccBody16(float R, float G, float B) {
   const float l = R * 0.299f + G * 0.587f + B * 0.114f;
   return {l * 0.7132668f, (B - l) * 0.4368627f + 40092.0f, (R - l) * 0.5319216f + 35209.0f};
 }
-inline Floats3 rgbToYccBody16(__m128 R, __m128 G, __m128 B) {
-  const __m128 l = _mm_add_ps(_mm_add_ps(_mm_mul_ps(R, _mm_set1_ps(0.299f)), _mm_mul_ps(G, _mm_set1_ps(0.587f))),
-                              _mm_mul_ps(B, _mm_set1_ps(0.114f)));
-  return {_mm_mul_ps(l, _mm_set1_ps(0.7132668f)),
-          _mm_add_ps(_mm_mul_ps(_mm_sub_ps(B, l), _mm_set1_ps(0.4368627f)), _mm_set1_ps(40092.0f)),
-          _mm_add_ps(_mm_mul_ps(_mm_sub_ps(R, l), _mm_set1_ps(0.5319216f)), _mm_set1_ps(35209.0f))};
+template <class P>
+ZEL_INLINE FloatTrio<P> rgbToYccBody16(typename P::V R, typename P::V G, typename P::V B) {
+  const typename P::V l = P::add(P::add(P::mul(R, P::set(0.299f)), P::mul(G, P::set(0.587f))), P::mul(B, P::set(0.114f)));
+  return {P::mul(l, P::set(0.7132668f)), P::add(P::mul(P::sub(B, l), P::set(0.4368627f)), P::set(40092.0f)),
+          P::add(P::mul(P::sub(R, l), P::set(0.5319216f)), P::set(35209.0f))};
 }
 
 // 16-bit body, inverse, on unsigned samples (signed ones plus 32768).
@@ -109,12 +136,14 @@ inline Float3 yccToRgbBody16(float Y, float C1, float C2) {
   const float c1 = (C1 - 40092.0f) * 2.2179f, c2 = (C2 - 35209.0f) * 1.8215f, y = Y * 1.3584f;
   return {y + c2, y - c1 * 0.194f - c2 * 0.509f, y + c1};
 }
-inline Floats3 yccToRgbBody16(__m128 Y, __m128 C1, __m128 C2) {
-  const __m128 c1 = _mm_mul_ps(_mm_sub_ps(C1, _mm_set1_ps(40092.0f)), _mm_set1_ps(2.2179f));
-  const __m128 c2 = _mm_mul_ps(_mm_sub_ps(C2, _mm_set1_ps(35209.0f)), _mm_set1_ps(1.8215f));
-  const __m128 y = _mm_mul_ps(Y, _mm_set1_ps(1.3584f));
-  const __m128 g = _mm_sub_ps(_mm_sub_ps(y, _mm_mul_ps(c1, _mm_set1_ps(0.194f))), _mm_mul_ps(c2, _mm_set1_ps(0.509f)));
-  return {_mm_add_ps(y, c2), g, _mm_add_ps(y, c1)};
+template <class P>
+ZEL_INLINE FloatTrio<P> yccToRgbBody16(typename P::V Y, typename P::V C1, typename P::V C2) {
+  using V = typename P::V;
+  const V c1 = P::mul(P::sub(C1, P::set(40092.0f)), P::set(2.2179f));
+  const V c2 = P::mul(P::sub(C2, P::set(35209.0f)), P::set(1.8215f));
+  const V y = P::mul(Y, P::set(1.3584f));
+  const V g = P::sub(P::sub(y, P::mul(c1, P::set(0.194f))), P::mul(c2, P::set(0.509f)));
+  return {P::add(y, c2), g, P::add(y, c1)};
 }
 
 // The body's rounding: nearest, ties to even, clamped to 0..65535; a signed
@@ -164,32 +193,48 @@ inline Float3 rgbToYcc32f(float R, float G, float B) {
   const float l = 0.299f * R + 0.587f * G + 0.114f * B;
   return {0.7132668f * l, 0.4368627f * (B - l) + 0.6117647f, (R - l) * 0.53192f + 0.5372549f};
 }
-inline Floats3 rgbToYcc32f(__m128 R, __m128 G, __m128 B) {
-  const __m128 l = _mm_add_ps(_mm_add_ps(_mm_mul_ps(_mm_set1_ps(0.299f), R), _mm_mul_ps(_mm_set1_ps(0.587f), G)),
-                              _mm_mul_ps(_mm_set1_ps(0.114f), B));
-  return {_mm_mul_ps(_mm_set1_ps(0.7132668f), l),
-          _mm_add_ps(_mm_mul_ps(_mm_set1_ps(0.4368627f), _mm_sub_ps(B, l)), _mm_set1_ps(0.6117647f)),
-          _mm_add_ps(_mm_mul_ps(_mm_sub_ps(R, l), _mm_set1_ps(0.53192f)), _mm_set1_ps(0.5372549f))};
+template <class P>
+ZEL_INLINE FloatTrio<P> rgbToYcc32f(typename P::V R, typename P::V G, typename P::V B) {
+  const typename P::V l = P::add(P::add(P::mul(P::set(0.299f), R), P::mul(P::set(0.587f), G)), P::mul(P::set(0.114f), B));
+  return {P::mul(P::set(0.7132668f), l), P::add(P::mul(P::set(0.4368627f), P::sub(B, l)), P::set(0.6117647f)),
+          P::add(P::mul(P::sub(R, l), P::set(0.53192f)), P::set(0.5372549f))};
 }
 
 // Below 0 gives 0, above 1 gives 1; anything else (NaN too) stays.
 inline float clampUnit(float x) { return x < 0.0f ? 0.0f : (x > 1.0f ? 1.0f : x); }
-inline __m128 clampUnit(__m128 x) {
+template <class P>
+ZEL_INLINE typename P::V clampUnit(typename P::V x) {
   // MINPS and MAXPS return their second operand when either is NaN.
-  return _mm_min_ps(_mm_set1_ps(1.0f), _mm_max_ps(_mm_setzero_ps(), x));
+  return P::min(P::set(1.0f), P::max(P::zero(), x));
 }
+inline __m128 clampUnit(__m128 x) { return clampUnit<Ps4>(x); }
 
 // 32f, inverse, clamped to 0..1.
 inline Float3 yccToRgb32f(float Y, float C1, float C2) {
   const float y = 1.3584f * Y, c1 = (C1 - 0.6117647f) * 2.2179f, c2 = 1.8215f * (C2 - 0.5372549f);
   return {clampUnit(y + c2), clampUnit(y - c1 * 0.194f - c2 * 0.509f), clampUnit(y + c1)};
 }
-inline Floats3 yccToRgb32f(__m128 Y, __m128 C1, __m128 C2) {
-  const __m128 y = _mm_mul_ps(_mm_set1_ps(1.3584f), Y);
-  const __m128 c1 = _mm_mul_ps(_mm_sub_ps(C1, _mm_set1_ps(0.6117647f)), _mm_set1_ps(2.2179f));
-  const __m128 c2 = _mm_mul_ps(_mm_set1_ps(1.8215f), _mm_sub_ps(C2, _mm_set1_ps(0.5372549f)));
-  const __m128 g = _mm_sub_ps(_mm_sub_ps(y, _mm_mul_ps(c1, _mm_set1_ps(0.194f))), _mm_mul_ps(c2, _mm_set1_ps(0.509f)));
-  return {clampUnit(_mm_add_ps(y, c2)), clampUnit(g), clampUnit(_mm_add_ps(y, c1))};
+template <class P>
+ZEL_INLINE FloatTrio<P> yccToRgb32f(typename P::V Y, typename P::V C1, typename P::V C2) {
+  using V = typename P::V;
+  const V y = P::mul(P::set(1.3584f), Y);
+  const V c1 = P::mul(P::sub(C1, P::set(0.6117647f)), P::set(2.2179f));
+  const V c2 = P::mul(P::set(1.8215f), P::sub(C2, P::set(0.5372549f)));
+  const V g = P::sub(P::sub(y, P::mul(c1, P::set(0.194f))), P::mul(c2, P::set(0.509f)));
+  return {clampUnit<P>(P::add(y, c2)), clampUnit<P>(g), clampUnit<P>(P::add(y, c1))};
 }
+
+// The four float forms as row forms, at either width.
+#define ZEL_PHOTO_YCC_FORM(Name, form)                                                                         \
+  struct Name {                                                                                                \
+    Float3 operator()(float a, float b, float c) const { return form(a, b, c); }                              \
+    Floats3 operator()(__m128 a, __m128 b, __m128 c) const { return form<Ps4>(a, b, c); }                     \
+    ZEL_AVX2 ZEL_INLINE FloatTrio<Ps8> operator()(__m256 a, __m256 b, __m256 c) const { return form<Ps8>(a, b, c); } \
+  };
+ZEL_PHOTO_YCC_FORM(RgbToYccBody16Form, rgbToYccBody16)
+ZEL_PHOTO_YCC_FORM(YccToRgbBody16Form, yccToRgbBody16)
+ZEL_PHOTO_YCC_FORM(RgbToYcc32fForm, rgbToYcc32f)
+ZEL_PHOTO_YCC_FORM(YccToRgb32fForm, yccToRgb32f)
+#undef ZEL_PHOTO_YCC_FORM
 
 }  // namespace zel::lc

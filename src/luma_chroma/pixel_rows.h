@@ -10,6 +10,7 @@
 
 #include <cstdint>
 #include <cstring>
+#include <type_traits>
 
 #include "luma_chroma/vector_units.h"
 
@@ -35,25 +36,39 @@ constexpr GatherPatterns<Stride> makeGather() {
   return p;
 }
 
-// scatter[k][c]: the bytes of channel c that land in the k-th 16 bytes of
-// 16 three-byte pixels.
-struct ScatterPatterns {
-  Shuffle16 scatter[3][3];
+// Three-byte pixels by rotation and blend. 3 is invertible modulo 16, so
+// byte j of the k-th 16 bytes of 16 pixels, which is channel (16k + j) mod 3
+// of pixel (16k + j) / 3, is also byte j of that channel rotated: pixel p of
+// channel c moved to byte (3p + c) mod 16. Splitting blends the three 16-byte
+// parts byte by byte into the rotated channels and rotates them back; merging
+// rotates and blends.
+//   rotate[c]  channel c, pixel order to rotated order;
+//   unrotate[c] rotated order back to pixel order;
+//   part[k][c] blend mask: the bytes of part k that belong to channel c;
+//   from[c][k] blend mask: the bytes of rotated channel c found in part k.
+struct RotatePatterns {
+  Shuffle16 rotate[3], unrotate[3], part[3][3], from[3][3];
 };
-constexpr ScatterPatterns makeScatter() {
-  ScatterPatterns p{};
+constexpr RotatePatterns makeRotate() {
+  RotatePatterns p{};
+  for (int c = 0; c < 3; ++c)
+    for (int i = 0; i < 16; ++i) {
+      const int j = (3 * i + c) % 16;
+      p.rotate[c].b[j] = static_cast<int8_t>(i);
+      p.unrotate[c].b[i] = static_cast<int8_t>(j);
+    }
   for (int k = 0; k < 3; ++k)
     for (int c = 0; c < 3; ++c)
       for (int j = 0; j < 16; ++j) {
-        const int at = 16 * k + j;
-        p.scatter[k][c].b[j] = static_cast<int8_t>(at % 3 == c ? at / 3 : -1);
+        p.part[k][c].b[j] = static_cast<int8_t>((16 * k + j) % 3 == c ? -128 : 0);
+        p.from[c][k].b[j] = static_cast<int8_t>(((c - j) % 3 + 3) % 3 == k ? -128 : 0);
       }
   return p;
 }
 
 template <int Stride>
 inline constexpr GatherPatterns<Stride> kGather = makeGather<Stride>();
-inline constexpr ScatterPatterns kScatter3 = makeScatter();
+inline constexpr RotatePatterns kRotate3 = makeRotate();
 
 // ---- sources ----
 
@@ -70,16 +85,27 @@ struct PackedIn {
   }
   template <class U>
   ZEL_INLINE Trio<U> block(int x) const {
-    const GatherPatterns<Stride>& g = kGather<Stride>;
     const uint8_t* q = p + Stride * x;
     typename U::V chunk[Stride];
     for (int k = 0; k < Stride; ++k) chunk[k] = U::loadUnits(q + 16 * k, 16 * Stride);
-    typename U::V out[3];
-    for (int c = 0; c < 3; ++c) {
-      out[c] = U::shuffle8(chunk[0], U::shuffleOf(g.gather[c][0]));
-      for (int k = 1; k < Stride; ++k) out[c] = U::or_(out[c], U::shuffle8(chunk[k], U::shuffleOf(g.gather[c][k])));
+    if constexpr (Stride == 3) {
+      const RotatePatterns& r = kRotate3;
+      typename U::V out[3];
+      for (int c = 0; c < 3; ++c) {
+        const typename U::V mixed = U::blend8(U::blend8(chunk[0], chunk[1], U::shuffleOf(r.from[c][1])), chunk[2],
+                                              U::shuffleOf(r.from[c][2]));
+        out[c] = U::shuffle8(mixed, U::shuffleOf(r.unrotate[c]));
+      }
+      return {out[0], out[1], out[2]};
+    } else {
+      const GatherPatterns<Stride>& g = kGather<Stride>;
+      typename U::V out[3];
+      for (int c = 0; c < 3; ++c) {
+        out[c] = U::shuffle8(chunk[0], U::shuffleOf(g.gather[c][0]));
+        for (int k = 1; k < Stride; ++k) out[c] = U::or_(out[c], U::shuffle8(chunk[k], U::shuffleOf(g.gather[c][k])));
+      }
+      return {out[0], out[1], out[2]};
     }
-    return {out[0], out[1], out[2]};
   }
 };
 
@@ -114,11 +140,13 @@ struct PackedOut3 {
   template <class U>
   ZEL_INLINE void block(int x, const Trio<U>& v) const {
     const typename U::V ch[3] = {Reverse ? v.c2 : v.c0, v.c1, Reverse ? v.c0 : v.c2};
+    const RotatePatterns& r = kRotate3;
+    typename U::V turned[3];
+    for (int c = 0; c < 3; ++c) turned[c] = U::shuffle8(ch[c], U::shuffleOf(r.rotate[c]));
     uint8_t* q = p + 3 * x;
     for (int k = 0; k < 3; ++k) {
-      typename U::V o = U::shuffle8(ch[0], U::shuffleOf(kScatter3.scatter[k][0]));
-      o = U::or_(o, U::shuffle8(ch[1], U::shuffleOf(kScatter3.scatter[k][1])));
-      o = U::or_(o, U::shuffle8(ch[2], U::shuffleOf(kScatter3.scatter[k][2])));
+      const typename U::V o = U::blend8(U::blend8(turned[0], turned[1], U::shuffleOf(r.part[k][1])), turned[2],
+                                        U::shuffleOf(r.part[k][2]));
       U::storeUnits(q + 16 * k, 48, o);
     }
   }
@@ -199,14 +227,26 @@ struct PlanesOut {
 // Samples3) in scalar code and, when kVector, `lanes<U>` (Trio of 16-bit
 // lanes to Trio of 16-bit lanes before SaturateU8).
 
+// A form may also offer `bytes<U>` (kBytes true): bytes of a block in,
+// bytes out, widening and narrowing its own way; it gives the bits of its
+// `pixel`.
+template <class Form, class = void>
+struct TakesBytes : std::false_type {};
+template <class Form>
+struct TakesBytes<Form, std::void_t<decltype(Form::kBytes)>> : std::bool_constant<Form::kBytes> {};
+
 template <class U, class In, class Out, class Form>
 ZEL_INLINE int formBlocks(const In& in, const Out& out, int x, int end, const Form& form) {
-  for (; x + U::kPixels <= end; x += U::kPixels) {
-    const Trio<U> s = in.template block<U>(x);
-    const Wide16<U> a = widen<U>(s.c0), b = widen<U>(s.c1), c = widen<U>(s.c2);
-    const Trio<U> lo = form.template lanes<U>(Trio<U>{a.lo, b.lo, c.lo});
-    const Trio<U> hi = form.template lanes<U>(Trio<U>{a.hi, b.hi, c.hi});
-    out.template block<U>(x, Trio<U>{U::packU8(lo.c0, hi.c0), U::packU8(lo.c1, hi.c1), U::packU8(lo.c2, hi.c2)});
+  if constexpr (TakesBytes<Form>::value) {
+    for (; x + U::kPixels <= end; x += U::kPixels) out.template block<U>(x, form.template bytes<U>(in.template block<U>(x)));
+  } else {
+    for (; x + U::kPixels <= end; x += U::kPixels) {
+      const Trio<U> s = in.template block<U>(x);
+      const Wide16<U> a = widen<U>(s.c0), b = widen<U>(s.c1), c = widen<U>(s.c2);
+      const Trio<U> lo = form.template lanes<U>(Trio<U>{a.lo, b.lo, c.lo});
+      const Trio<U> hi = form.template lanes<U>(Trio<U>{a.hi, b.hi, c.hi});
+      out.template block<U>(x, Trio<U>{U::packU8(lo.c0, hi.c0), U::packU8(lo.c1, hi.c1), U::packU8(lo.c2, hi.c2)});
+    }
   }
   return x;
 }

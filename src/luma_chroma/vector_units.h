@@ -57,6 +57,9 @@ struct Sse {
   template <int N>
   static V sll16(V a) { return _mm_slli_epi16(a, N); }
   static V or_(V a, V b) { return _mm_or_si128(a, b); }
+  static V xor_(V a, V b) { return _mm_xor_si128(a, b); }
+  // Bytes of b where the mask byte's top bit is set, else of a.
+  static V blend8(V a, V b, V m) { return _mm_blendv_epi8(a, b, m); }
   static V shuffle8(V a, V m) { return _mm_shuffle_epi8(a, m); }
   static V unpackLo8(V a, V b) { return _mm_unpacklo_epi8(a, b); }
   static V unpackHi8(V a, V b) { return _mm_unpackhi_epi8(a, b); }
@@ -64,6 +67,8 @@ struct Sse {
   static V unpackHi16(V a, V b) { return _mm_unpackhi_epi16(a, b); }
   // Signed 16-bit lanes to bytes clamped to 0..255: SaturateU8.
   static V packU8(V lo, V hi) { return _mm_packus_epi16(lo, hi); }
+  // Signed 16-bit lanes to bytes clamped to -128..127: SaturateS8.
+  static V packS8(V lo, V hi) { return _mm_packs_epi16(lo, hi); }
   // 32-bit lanes, for exact wide forms: pairs of 16-bit lanes times a pair
   // of constants summed (pmaddwd), and back to 16 bits with saturation.
   static V set32(int32_t v) { return _mm_set1_epi32(v); }
@@ -109,12 +114,15 @@ struct Avx {
   template <int N>
   ZEL_AVX2 static V sll16(V a) { return _mm256_slli_epi16(a, N); }
   ZEL_AVX2 static V or_(V a, V b) { return _mm256_or_si256(a, b); }
+  ZEL_AVX2 static V xor_(V a, V b) { return _mm256_xor_si256(a, b); }
+  ZEL_AVX2 static V blend8(V a, V b, V m) { return _mm256_blendv_epi8(a, b, m); }
   ZEL_AVX2 static V shuffle8(V a, V m) { return _mm256_shuffle_epi8(a, m); }
   ZEL_AVX2 static V unpackLo8(V a, V b) { return _mm256_unpacklo_epi8(a, b); }
   ZEL_AVX2 static V unpackHi8(V a, V b) { return _mm256_unpackhi_epi8(a, b); }
   ZEL_AVX2 static V unpackLo16(V a, V b) { return _mm256_unpacklo_epi16(a, b); }
   ZEL_AVX2 static V unpackHi16(V a, V b) { return _mm256_unpackhi_epi16(a, b); }
   ZEL_AVX2 static V packU8(V lo, V hi) { return _mm256_packus_epi16(lo, hi); }
+  ZEL_AVX2 static V packS8(V lo, V hi) { return _mm256_packs_epi16(lo, hi); }
   ZEL_AVX2 static V set32(int32_t v) { return _mm256_set1_epi32(v); }
   ZEL_AVX2 static V mulLo16(V a, V b) { return _mm256_mullo_epi16(a, b); }
   ZEL_AVX2 static V madd16(V a, V b) { return _mm256_madd_epi16(a, b); }
@@ -157,6 +165,19 @@ ZEL_INLINE Wide16<U> widen(typename U::V bytes) {
 template <class U>
 ZEL_INLINE typename U::V narrow(const Wide16<U>& w) {
   return U::packU8(w.lo, w.hi);
+}
+
+// Bytes of a unit as the high bytes of 16-bit lanes: sample << 8, read as
+// unsigned; after flipping the top bit of each byte, (sample - 128) << 8,
+// read as signed.
+template <class U>
+ZEL_INLINE Wide16<U> widenHigh(typename U::V bytes) {
+  const typename U::V z = U::zero();
+  return {U::unpackLo8(z, bytes), U::unpackHi8(z, bytes)};
+}
+template <class U>
+ZEL_INLINE Wide16<U> widenCentred(typename U::V bytes) {
+  return widenHigh<U>(U::xor_(bytes, U::set8(0x80)));
 }
 
 }  // namespace zel::lc

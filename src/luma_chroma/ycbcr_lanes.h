@@ -171,6 +171,46 @@ struct LaneSubtractedForm {
   }
 };
 
+// The added lane form straight from bytes, for sets whose luma gain is a
+// multiple of 32. With Y8 = Y << 8 and C8 = (C - 128) << 8 (the high bytes
+// of the lanes):
+//   MulHighS16((Y - 16) << 7, L) = floor((Y - 16) L / 512)
+//                                = MulHighU16(Y8, L / 2) - 16 L / 512,
+// exactly, as 16 L is a multiple of 512; a chroma term with an even
+// constant is MulHighS16(C8, c / 2), with an odd one MulHighS16(C8 >> 1, c).
+// The sums wrap, so their order does not matter.
+template <const LaneSet& S, int K>
+struct LaneAddedBytes {
+  static_assert(S.luma % 32 == 0, "the luma offset must leave no fraction");
+  static constexpr bool kVector = true;
+  static constexpr bool kBytes = true;
+  Samples3 pixel(const Samples3& s) const { return samplesOf(laneAdded(S, s.c0, s.c1, s.c2, K)); }
+
+  template <class U>
+  ZEL_INLINE LaneRgb<U> half(typename U::V y8, typename U::V u8, typename U::V v8) const {
+    using V = typename U::V;
+    auto term = [](V c8, int c) ZEL_LAMBDA_INLINE {
+      return c % 2 == 0 ? U::mulHighS16(c8, U::set16(c / 2)) : U::mulHighS16(U::template sra16<1>(c8), U::set16(c));
+    };
+    const V luma = U::add16(U::mulHighU16(y8, U::set16(S.luma / 2)), U::set16(K - 16 * S.luma / 512));
+    const V uOdd = U::template sra16<1>(u8);
+    auto uTerm = [&](int c) ZEL_LAMBDA_INLINE {
+      return c % 2 == 0 ? U::mulHighS16(u8, U::set16(c / 2)) : U::mulHighS16(uOdd, U::set16(c));
+    };
+    const V r = U::add16(luma, term(v8, S.vToR));
+    const V g = U::add16(U::add16(luma, uTerm(S.uToG)), term(v8, S.vToG));
+    const V b = U::add16(luma, uTerm(S.uToB));
+    return {U::template sra16<4>(r), U::template sra16<4>(g), U::template sra16<4>(b)};
+  }
+
+  template <class U>
+  ZEL_INLINE Trio<U> bytes(const Trio<U>& ycc) const {
+    const Wide16<U> y = widenHigh<U>(ycc.c0), u = widenCentred<U>(ycc.c1), v = widenCentred<U>(ycc.c2);
+    const LaneRgb<U> lo = half<U>(y.lo, u.lo, v.lo), hi = half<U>(y.hi, u.hi, v.hi);
+    return {U::packU8(lo.r, hi.r), U::packU8(lo.g, hi.g), U::packU8(lo.b, hi.b)};
+  }
+};
+
 // `round` 0: truncated; 32768: rounded.
 struct WideRgbForm {
   static constexpr bool kVector = false;

@@ -77,7 +77,7 @@ ZEL_PUBLIC Status zeliYCbCrToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_
 ZEL_PUBLIC Status zeliYCbCrToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
   if (!src || !dst) return StatusNullPointerError;
   if (badSize(size)) return StatusSizeError;
-  walkRows(size, size.width & ~3, LaneAddedForm{lanes601a, 8}, WideRgbForm{wide601a, 0},
+  walkRows(size, size.width & ~3, LaneAddedBytes<lanes601a, 8>{}, WideRgbForm{wide601a, 0},
            [&](int y) { return PackedIn<3>{zel::rowAt(src, srcStep, y)}; },
            [&](int y) { return PackedOut3<false>{zel::rowAt(dst, dstStep, y)}; });
   return StatusOk;
@@ -91,7 +91,7 @@ ZEL_PUBLIC Status zeliYCbCrToRGB_8u_P3R(const uint8_t* const srcPlanes[3], int s
   if (anyNull(srcPlanes)) return StatusNullPointerError;
   // Blocks of 16, 8 and 4 all compute the body form (no rounding term);
   // the last width AND 3 pixels round in the wide form.
-  walkRows(size, size.width & ~3, LaneAddedForm{lanes601a, 0}, WideRgbForm{wide601a, 32768},
+  walkRows(size, size.width & ~3, LaneAddedBytes<lanes601a, 0>{}, WideRgbForm{wide601a, 32768},
            [&](int y) { return planesIn(srcPlanes, srcStep, y); },
            [&](int y) {
              return PlanesOut{zel::rowAt(dstPlanes[0], dstStep, y), zel::rowAt(dstPlanes[1], dstStep, y),

@@ -11,12 +11,34 @@ namespace zel::lc {
 
 namespace {
 
-struct MatrixLanes {
+// The matrix lane form straight from bytes: samples land in the high bytes
+// of the lanes as S << 8, and S << 7 is that shifted right once. U and V are
+// clamped to -128..127 by a signed pack and moved up by 128 with the top bit
+// of each byte, which is SaturateU8 of the value plus 128.
+struct MatrixBytes {
   static constexpr bool kVector = true;
+  static constexpr bool kBytes = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(yuvMatrixLanes(s.c0, s.c1, s.c2)); }
+
   template <class U>
-  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
-    return yuvMatrixLanes<U>(s);
+  ZEL_INLINE Trio<U> half(typename U::V r8, typename U::V g8, typename U::V b8) const {
+    using V = typename U::V;
+    const V y = U::addSatU16(U::addSatU16(U::mulHighU16(r8, U::set16(19595)), U::mulHighU16(g8, U::set16(38469))),
+                             U::mulHighU16(b8, U::set16(7471)));
+    const V r7 = U::template srl16<1>(r8), g7 = U::template srl16<1>(g8), b7 = U::template srl16<1>(b8);
+    const V u = U::addSatS16(U::addSatS16(U::mulHighS16(r7, U::set16(-4816)), U::mulHighS16(g7, U::set16(-9469))),
+                             U::mulHighS16(b7, U::set16(14286)));
+    const V v = U::addSatS16(U::addSatS16(U::mulHighS16(r7, U::set16(20152)), U::mulHighS16(g7, U::set16(-16875))),
+                             U::mulHighS16(b7, U::set16(-3276)));
+    return {U::template srl16<8>(y), U::template sra16<6>(u), U::template sra16<6>(v)};
+  }
+
+  template <class U>
+  ZEL_INLINE Trio<U> bytes(const Trio<U>& rgb) const {
+    const Wide16<U> r = widenHigh<U>(rgb.c0), g = widenHigh<U>(rgb.c1), b = widenHigh<U>(rgb.c2);
+    const Trio<U> lo = half<U>(r.lo, g.lo, b.lo), hi = half<U>(r.hi, g.hi, b.hi);
+    const typename U::V top = U::set8(0x80);
+    return {U::packU8(lo.c0, hi.c0), U::xor_(U::packS8(lo.c1, hi.c1), top), U::xor_(U::packS8(lo.c2, hi.c2), top)};
   }
 };
 
@@ -61,17 +83,17 @@ inline __m128i fourthBytes(const uint8_t* p) {
 }  // namespace
 
 void rgbToYuvC3Row(const uint8_t* src, uint8_t* dst, int width, bool avx2) {
-  convertRow(PackedIn<3>{src}, PackedOut3<false>{dst}, width, width & ~15, MatrixLanes{}, DifferenceTruncated{}, avx2);
+  convertRow(PackedIn<3>{src}, PackedOut3<false>{dst}, width, width & ~15, MatrixBytes{}, DifferenceTruncated{}, avx2);
 }
 
 void rgbToYuvC3P3Row(const uint8_t* src, uint8_t* const dst[3], int width, bool avx2) {
-  convertRow(PackedIn<3>{src}, planesOut(dst), width, width & ~7, MatrixLanes{}, DifferenceTruncated{}, avx2);
+  convertRow(PackedIn<3>{src}, planesOut(dst), width, width & ~7, MatrixBytes{}, DifferenceTruncated{}, avx2);
 }
 
 // Y, U and V of a row come from one pass: with planes that do not overlap
 // (the only defined use) that is the same as a pass per output plane.
 void rgbToYuvP3Row(const uint8_t* const src[3], uint8_t* const dst[3], int width, bool avx2) {
-  convertRow(PlanesIn{src[0], src[1], src[2]}, planesOut(dst), width, width & ~15, MatrixLanes{}, MatrixWide{}, avx2);
+  convertRow(PlanesIn{src[0], src[1], src[2]}, planesOut(dst), width, width & ~15, MatrixBytes{}, MatrixWide{}, avx2);
 }
 
 // One exact formula for the whole row, in vector blocks and one by one.

@@ -210,18 +210,43 @@ std::function<std::array<T, 3>(const T*, int, int)> wordZones(Float3 (*body)(flo
   };
 }
 
+// The members again through their row kernels on each vector width, walked
+// here; `rows` are the kernels in member order, on the kernels' sample type W.
+template <typename W, typename T>
+void addRowKernels(std::vector<Member<T>>& out, const std::array<void (*)(const W*, W*, int, bool), 4>& rows) {
+  for (bool avx2 : vectorWidths())
+    for (int k = 0; k < 4; ++k) {
+      Member<T> m = out[k];
+      const auto row = rows[k];
+      m.run = [row, avx2](const T* src, int srcStep, T* dst, int dstStep, ImageSize size) {
+        for (int y = 0; y < size.height; ++y)
+          row(reinterpret_cast<const W*>(zel::rowAt(src, srcStep, y)), reinterpret_cast<W*>(zel::rowAt(dst, dstStep, y)),
+              size.width, avx2);
+        return StatusOk;
+      };
+      out.push_back(m);
+    }
+}
+
 std::vector<Member<uint16_t>> unsignedMembers() {
-  return {{"zeliRGBToYCC_16u_C3R", 3, zeliRGBToYCC_16u_C3R, wordZones<uint16_t>(rgbToYccBody16, rgbToYccTail16u)},
-          {"zeliRGBToYCC_16u_AC4R", 4, zeliRGBToYCC_16u_AC4R, wordZones<uint16_t>(rgbToYccBody16, rgbToYccTail16u)},
-          {"zeliYCCToRGB_16u_C3R", 3, zeliYCCToRGB_16u_C3R, wordZones<uint16_t>(yccToRgbBody16, yccToRgbTail16u)},
-          {"zeliYCCToRGB_16u_AC4R", 4, zeliYCCToRGB_16u_AC4R, wordZones<uint16_t>(yccToRgbBody16, yccToRgbTail16u)}};
+  std::vector<Member<uint16_t>> out = {
+      {"zeliRGBToYCC_16u_C3R", 3, zeliRGBToYCC_16u_C3R, wordZones<uint16_t>(rgbToYccBody16, rgbToYccTail16u)},
+      {"zeliRGBToYCC_16u_AC4R", 4, zeliRGBToYCC_16u_AC4R, wordZones<uint16_t>(rgbToYccBody16, rgbToYccTail16u)},
+      {"zeliYCCToRGB_16u_C3R", 3, zeliYCCToRGB_16u_C3R, wordZones<uint16_t>(yccToRgbBody16, yccToRgbTail16u)},
+      {"zeliYCCToRGB_16u_AC4R", 4, zeliYCCToRGB_16u_AC4R, wordZones<uint16_t>(yccToRgbBody16, yccToRgbTail16u)}};
+  addRowKernels<uint16_t>(out, {rgbToYcc16Row<3, false>, rgbToYcc16Row<4, false>, yccToRgb16Row<3, false>,
+                      yccToRgb16Row<4, false>});
+  return out;
 }
 
 std::vector<Member<int16_t>> signedMembers() {
-  return {{"zeliRGBToYCC_16s_C3R", 3, zeliRGBToYCC_16s_C3R, wordZones<int16_t>(rgbToYccBody16, rgbToYccTail16s)},
-          {"zeliRGBToYCC_16s_AC4R", 4, zeliRGBToYCC_16s_AC4R, wordZones<int16_t>(rgbToYccBody16, rgbToYccTail16s)},
-          {"zeliYCCToRGB_16s_C3R", 3, zeliYCCToRGB_16s_C3R, wordZones<int16_t>(yccToRgbBody16, yccToRgbTail16s)},
-          {"zeliYCCToRGB_16s_AC4R", 4, zeliYCCToRGB_16s_AC4R, wordZones<int16_t>(yccToRgbBody16, yccToRgbTail16s)}};
+  std::vector<Member<int16_t>> out = {
+      {"zeliRGBToYCC_16s_C3R", 3, zeliRGBToYCC_16s_C3R, wordZones<int16_t>(rgbToYccBody16, rgbToYccTail16s)},
+      {"zeliRGBToYCC_16s_AC4R", 4, zeliRGBToYCC_16s_AC4R, wordZones<int16_t>(rgbToYccBody16, rgbToYccTail16s)},
+      {"zeliYCCToRGB_16s_C3R", 3, zeliYCCToRGB_16s_C3R, wordZones<int16_t>(yccToRgbBody16, yccToRgbTail16s)},
+      {"zeliYCCToRGB_16s_AC4R", 4, zeliYCCToRGB_16s_AC4R, wordZones<int16_t>(yccToRgbBody16, yccToRgbTail16s)}};
+  addRowKernels<uint16_t>(out, {rgbToYcc16Row<3, true>, rgbToYcc16Row<4, true>, yccToRgb16Row<3, true>, yccToRgb16Row<4, true>});
+  return out;
 }
 
 std::vector<Member<float>> floatMembers() {
@@ -231,10 +256,12 @@ std::vector<Member<float>> floatMembers() {
       return std::array<float, 3>{f.c0, f.c1, f.c2};
     };
   };
-  return {{"zeliRGBToYCC_32f_C3R", 3, zeliRGBToYCC_32f_C3R, all(rgbToYcc32f)},
-          {"zeliRGBToYCC_32f_AC4R", 4, zeliRGBToYCC_32f_AC4R, all(rgbToYcc32f)},
-          {"zeliYCCToRGB_32f_C3R", 3, zeliYCCToRGB_32f_C3R, all(yccToRgb32f)},
-          {"zeliYCCToRGB_32f_AC4R", 4, zeliYCCToRGB_32f_AC4R, all(yccToRgb32f)}};
+  std::vector<Member<float>> out = {{"zeliRGBToYCC_32f_C3R", 3, zeliRGBToYCC_32f_C3R, all(rgbToYcc32f)},
+                                    {"zeliRGBToYCC_32f_AC4R", 4, zeliRGBToYCC_32f_AC4R, all(rgbToYcc32f)},
+                                    {"zeliYCCToRGB_32f_C3R", 3, zeliYCCToRGB_32f_C3R, all(yccToRgb32f)},
+                                    {"zeliYCCToRGB_32f_AC4R", 4, zeliYCCToRGB_32f_AC4R, all(yccToRgb32f)}};
+  addRowKernels<float>(out, {rgbToYcc32fRow<3>, rgbToYcc32fRow<4>, yccToRgb32fRow<3>, yccToRgb32fRow<4>});
+  return out;
 }
 
 template <typename T>

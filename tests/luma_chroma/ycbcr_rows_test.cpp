@@ -107,6 +107,8 @@ TEST(YCbCrKernels, ForwardBlocksMatchTheScalarForms) {
 TEST(YCbCrKernels, InverseBlocksMatchTheScalarForms) {
   kernelMatchesScalar(LaneAddedForm{lanes601a, 8}, 3, 3, packedIn<3>, packedOut<false>);
   kernelMatchesScalar(LaneAddedForm{lanes601a, 0}, 3, 3, planesIn, planesOut);
+  kernelMatchesScalar(LaneAddedBytes<lanes601a, 8>{}, 3, 3, packedIn<3>, packedOut<false>);
+  kernelMatchesScalar(LaneAddedBytes<lanes601a, 0>{}, 3, 3, planesIn, planesOut);
   kernelMatchesScalar(LaneAddedForm{lanes601b, 8}, 3, 3, planesIn, packedOut<false>);
   kernelMatchesScalar(LaneAddedForm{lanes709, 8}, 3, 3, planesIn, packedOut<true>);
   kernelMatchesScalar(LaneSubtractedForm{lanes601b}, 3, 4, planesIn, alphaOut<false>);
@@ -115,6 +117,32 @@ TEST(YCbCrKernels, InverseBlocksMatchTheScalarForms) {
     keepAlphaMatchesScalar(WideRgbForm{wide601a, round});
     keepAlphaMatchesScalar(WideRgbForm{wide601b, round});
   }
+}
+
+// The byte forms regroup the arithmetic of the lane form; every sample
+// triple takes the same bits. Rows of every Y at each Cb and Cr.
+template <class Form>
+void everyTripleMatches(const Form& form) {
+  std::vector<uint8_t> src(256 * 3), got(256 * 3), want(256 * 3);
+  for (bool avx2 : {false, true}) {
+    if (avx2 && !zel::hasAvx2()) continue;
+    for (int cb = 0; cb < 256; ++cb)
+      for (int cr = 0; cr < 256; ++cr) {
+        for (int y = 0; y < 256; ++y) {
+          src[3 * y] = uint8_t(y);
+          src[3 * y + 1] = uint8_t(cb);
+          src[3 * y + 2] = uint8_t(cr);
+        }
+        convertRow(PackedIn<3>{src.data()}, PackedOut3<false>{got.data()}, 256, 256, form, form, avx2);
+        formPixels(PackedIn<3>{src.data()}, PackedOut3<false>{want.data()}, 0, 256, form);
+        ASSERT_TRUE(got == want) << "Cb " << cb << " Cr " << cr << " avx2 " << avx2;
+      }
+  }
+}
+
+TEST(YCbCrKernels, ByteFormsGiveTheLaneFormForEverySample) {
+  everyTripleMatches(LaneAddedBytes<lanes601a, 8>{});
+  everyTripleMatches(LaneAddedBytes<lanes601a, 0>{});
 }
 
 // ---- exports: zones, layouts, alpha ----

@@ -232,3 +232,28 @@ TEST(YuvMembers, PixelsWhoseZoneShows) {
 }
 
 }  // namespace
+
+namespace {
+
+// The matrix body regroups the lane form's shifts and its final clamp; every
+// sample triple takes the lane form's bits. Rows of every R at each G and B.
+TEST(YuvMembers, MatrixBodyGivesTheLaneFormForEverySample) {
+  std::vector<uint8_t> planes(3 * 256), out(3 * 256);
+  const uint8_t* const src[3] = {planes.data(), planes.data() + 256, planes.data() + 512};
+  uint8_t* const dst[3] = {out.data(), out.data() + 256, out.data() + 512};
+  for (int r = 0; r < 256; ++r) planes[r] = uint8_t(r);
+  for (bool avx2 : zel::lc::test::vectorWidths())
+    for (int g = 0; g < 256; ++g)
+      for (int b = 0; b < 256; ++b) {
+        std::fill(planes.begin() + 256, planes.begin() + 512, uint8_t(g));
+        std::fill(planes.begin() + 512, planes.end(), uint8_t(b));
+        rgbToYuvP3Row(src, dst, 256, avx2);
+        for (int r = 0; r < 256; ++r) {
+          const Pixel8 want = yuvMatrixLanes(r, g, b);
+          ASSERT_TRUE(dst[0][r] == want.c0 && dst[1][r] == want.c1 && dst[2][r] == want.c2)
+              << r << "," << g << "," << b << " avx2 " << avx2;
+        }
+      }
+}
+
+}  // namespace
