@@ -264,37 +264,53 @@ ZEL_INLINE typename U::V assembleLanes(typename U::V low, typename U::V mid, typ
   return U::or_(U::or_(low, U::template sll16<L::kMidShift>(mid)), U::template sll16<L::kTopShift>(top));
 }
 
-// The word writer of one row: Truncating or Dithering, for unit U.
+// The thresholds of a row's dither: of the low and top fields, and of green.
+template <class U>
+struct Thresholds {
+  typename U::V outer, mid;
+};
+
+// The word writer of one row: Truncating or Dithering, for unit U. A call
+// may name the thresholds of another row (the other row of a 4:2:0 pair).
 template <class U, class Writer>
 struct RowWords;
 
 template <class U, class L>
 struct RowWords<U, Truncating<L>> {
   RowWords(const Truncating<L>&, int) {}
+  static Thresholds<U> thresholds(int) { return {U::zero(), U::zero()}; }
   ZEL_INLINE typename U::V operator()(typename U::V low, typename U::V mid, typename U::V top) const {
     return assembleLanes<U, L>(truncateLanes<U, L::kLowBits>(low), truncateLanes<U, L::kMidBits>(mid),
                                truncateLanes<U, L::kTopBits>(top));
+  }
+  ZEL_INLINE typename U::V operator()(typename U::V low, typename U::V mid, typename U::V top,
+                                      const Thresholds<U>&) const {
+    return (*this)(low, mid, top);
   }
 };
 
 template <class U, class L>
 struct RowWords<U, Dithering<L>> {
-  typename U::V outer, mid;  // thresholds of the low and top fields, and of green
+  Thresholds<U> own;
   DitherConstants<U, L::kLowBits> outerLevel;
   DitherConstants<U, L::kMidBits> midLevel;
-  ZEL_INLINE RowWords(const Dithering<L>&, int y) {
+  ZEL_INLINE static Thresholds<U> thresholds(int y) {
     const int16_t* row = L::kLowBits == 4 ? kDitherMatrix4[y & 3] : kDitherMatrix5[y & 3];
-    outer = U::repeated(repeat4(row, 0));
-    mid = U::repeated(repeat4(row, L::kMidBits == 6 ? 1 : 0));
+    return {U::repeated(repeat4(row, 0)), U::repeated(repeat4(row, L::kMidBits == 6 ? 1 : 0))};
+  }
+  ZEL_INLINE RowWords(const Dithering<L>&, int y) : own(thresholds(y)) {}
+  ZEL_INLINE typename U::V operator()(typename U::V low, typename U::V g, typename U::V top) const {
+    return (*this)(low, g, top, own);
   }
   // Colours before or after their clamp: the unsigned packs saturate them
   // to bytes, and unpacking the bytes above zeros gives each as c * 256.
-  ZEL_INLINE typename U::V operator()(typename U::V low, typename U::V g, typename U::V top) const {
+  ZEL_INLINE typename U::V operator()(typename U::V low, typename U::V g, typename U::V top,
+                                      const Thresholds<U>& t) const {
     const typename U::V outerBytes = U::packU8(low, top), greenBytes = U::packU8(g, g);
     static_assert(L::kLowBits == L::kTopBits, "the low and top fields share their width");
-    return assembleLanes<U, L>(ditherLanes<U, L::kLowBits>(U::unpackLo8(U::zero(), outerBytes), outer, outerLevel),
-                               ditherLanes<U, L::kMidBits>(U::unpackLo8(U::zero(), greenBytes), mid, midLevel),
-                               ditherLanes<U, L::kTopBits>(U::unpackHi8(U::zero(), outerBytes), outer, outerLevel));
+    return assembleLanes<U, L>(ditherLanes<U, L::kLowBits>(U::unpackLo8(U::zero(), outerBytes), t.outer, outerLevel),
+                               ditherLanes<U, L::kMidBits>(U::unpackLo8(U::zero(), greenBytes), t.mid, midLevel),
+                               ditherLanes<U, L::kTopBits>(U::unpackHi8(U::zero(), outerBytes), t.outer, outerLevel));
   }
 };
 
@@ -331,6 +347,67 @@ ZEL_AVX2 __attribute__((flatten)) int wordBlocksAvx(const Src& src, const Form& 
   return wordBlocks<AvxWords>(src, form, writer, y, dst, 0, end);
 }
 
+// ---- 4:2:0 row pairs ----
+
+// The chroma part of the YCbCr lane form, shared by the two rows of a pair:
+// the R and B products, and the two green products added, which 16-bit
+// wrapping makes the same as subtracting them one after the other.
+template <class U>
+struct ChromaTerms {
+  typename U::V r, g, b;
+};
+
+template <class U>
+ZEL_INLINE ChromaTerms<U> ycbcrChromaTerms(typename U::V cb, typename U::V cr) {
+  const lc::LaneSet& s = lc::lanes601b;
+  const typename U::V ul = lc::chromaLanes<U>(cb), vl = lc::chromaLanes<U>(cr);
+  return {U::mulHighS16(vl, U::set16(s.vToR)),
+          U::add16(U::mulHighS16(vl, U::set16(int16_t(-s.vToG))), U::mulHighS16(ul, U::set16(int16_t(-s.uToG)))),
+          U::mulHighS16(ul, U::set16(s.uToB))};
+}
+
+// One row's words of a block from its luma samples and the pair's terms:
+// R, G, B sums as YCbCrLanes gives them (no rounding term), clamped for the
+// truncating writers.
+template <class U, class Writer>
+ZEL_INLINE typename U::V pairRowWords(typename U::V y, const ChromaTerms<U>& t, const Writer& writer,
+                                      const RowWords<U, Writer>& words, const Thresholds<U>& thresholds) {
+  const typename U::V luma = U::mulHighS16(lc::lumaLanes<U>(y), U::set16(lc::lanes601b.luma));
+  typename U::V r = U::template sra16<4>(U::add16(luma, t.r)), g = U::template sra16<4>(U::sub16(luma, t.g)),
+                b = U::template sra16<4>(U::add16(luma, t.b));
+  if constexpr (!Writer::kDither) {
+    r = U::clampU8(r);
+    g = U::clampU8(g);
+    b = U::clampU8(b);
+  }
+  return writer.redHigh ? words(b, g, r, thresholds) : words(r, g, b, thresholds);
+}
+
+// Blocks of both rows of a pair (rows y and y + 1, one chroma row) from x
+// while they fit below `end`; returns where it stopped.
+template <class U, class Writer>
+ZEL_INLINE int pairBlocks(const HalfPlanes& upper, const HalfPlanes& lower, const Writer& writer, int y,
+                          uint16_t* dstTop, uint16_t* dstBottom, int x, int end) {
+  // One set of level constants; each row its thresholds.
+  const RowWords<U, Writer> words(writer, y);
+  const Thresholds<U> top = RowWords<U, Writer>::thresholds(y), bottom = RowWords<U, Writer>::thresholds(y + 1);
+  const HalfPlanes a = upper, b = lower;
+  const Writer target = writer;
+  for (; x + U::kWords <= end; x += U::kWords) {
+    const ChromaTerms<U> t = ycbcrChromaTerms<U>(U::halves(a.cb + (x >> 1)), U::halves(a.cr + (x >> 1)));
+    U::storeWords(dstTop + x, pairRowWords<U>(U::bytes(a.y + x), t, target, words, top));
+    U::storeWords(dstBottom + x, pairRowWords<U>(U::bytes(b.y + x), t, target, words, bottom));
+  }
+  return x;
+}
+
+template <class Writer>
+ZEL_AVX2 __attribute__((flatten)) int pairBlocksAvx(const HalfPlanes& top, const HalfPlanes& bottom,
+                                                    const Writer& writer, int y, uint16_t* dstTop,
+                                                    uint16_t* dstBottom, int end) {
+  return pairBlocks<AvxWords>(top, bottom, writer, y, dstTop, dstBottom, 0, end);
+}
+
 // Pixels [x, end) one at a time through a scalar form.
 template <class Src, class FormFn, class Writer>
 inline void wordPixels(const Src& src, FormFn form, const Writer& writer, int y, uint16_t* dst, int x, int end) {
@@ -345,6 +422,20 @@ inline void formRun(const Src& src, const Form& form, const Writer& writer, int 
   if (avx2) x = wordBlocksAvx(src, form, writer, y, dst, end);
   x = wordBlocks<SseWords>(src, form, writer, y, dst, x, end);
   wordPixels(src, [&](const Samples3& s) { return form.pixel(s); }, writer, y, dst, x, end);
+}
+
+// Pixels [0, end) of rows y and y + 1 of a 4:2:0 YCbCr pair by the lane
+// form: AVX2 blocks when `avx2`, SSE4.1 blocks, then the last pixels of each
+// row one by one.
+template <class Writer>
+inline void ycbcrPairRun(const HalfPlanes& top, const HalfPlanes& bottom, const Writer& writer, int y,
+                         uint16_t* dstTop, uint16_t* dstBottom, int end, bool avx2) {
+  int x = 0;
+  if (avx2) x = pairBlocksAvx(top, bottom, writer, y, dstTop, dstBottom, end);
+  x = pairBlocks<SseWords>(top, bottom, writer, y, dstTop, dstBottom, x, end);
+  const YCbCrLanes form;
+  wordPixels(top, [&](const Samples3& s) { return form.pixel(s); }, writer, y, dstTop, x, end);
+  wordPixels(bottom, [&](const Samples3& s) { return form.pixel(s); }, writer, y + 1, dstBottom, x, end);
 }
 
 }  // namespace zel::pack

@@ -45,6 +45,19 @@ Rgb scalarForm(const Samples3& s) {
 void ycbcrPlanesToWords(PlaneChroma chroma, const uint8_t* const planes[3], const int steps[3], WordRows dst,
                         ImageSize size, PackedTarget target, bool dither, bool avx2) {
   withWords(target, dither, [&](const auto& writer) {
+    if (chroma == PlaneChroma::HalfBoth) {
+      // Row pairs share their chroma terms; a last odd row goes alone.
+      rowPairWalk(size.height, [&](int y, int c) {
+        ycbcrPairRun(planesRow<HalfPlanes>(planes, steps, y, c), planesRow<HalfPlanes>(planes, steps, y + 1, c),
+                     writer, y, dst.row(y), dst.row(y + 1), size.width, avx2);
+      });
+      if (size.height & 1) {
+        const int y = size.height - 1;
+        formRun(planesRow<HalfPlanes>(planes, steps, y, y >> 1), YCbCrLanes{}, writer, y, dst.row(y), size.width,
+                avx2);
+      }
+      return;
+    }
     plainWalk(size.height, [&](int y) {
       uint16_t* out = dst.row(y);
       switch (chroma) {
@@ -54,8 +67,7 @@ void ycbcrPlanesToWords(PlaneChroma chroma, const uint8_t* const planes[3], cons
         case PlaneChroma::Half:
           formRun(planesRow<HalfPlanes>(planes, steps, y, y), YCbCrLanes{}, writer, y, out, size.width, avx2);
           break;
-        case PlaneChroma::HalfBoth:
-          formRun(planesRow<HalfPlanes>(planes, steps, y, y >> 1), YCbCrLanes{}, writer, y, out, size.width, avx2);
+        case PlaneChroma::HalfBoth:  // walked in pairs above
           break;
       }
     });

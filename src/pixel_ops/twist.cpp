@@ -363,7 +363,7 @@ void row(const T* const src[3], T* const dst[3], int width, const Matrix& m, boo
   const Columns c(m);
   int x = 0;
   if constexpr (std::is_same_v<T, float> && K == C3) {
-    row32fC3(src[0], dst[0], width, m, false);
+    row32fC3(src[0], dst[0], width, m, false, wide);
     return;
   } else if constexpr (std::is_same_v<T, float>) {
     for (; x + 4 <= width; x += 4) {
@@ -421,42 +421,132 @@ ZEL_TWIST_ROWS(int16_t)
 ZEL_TWIST_ROWS(float)
 #undef ZEL_TWIST_ROWS
 
-void row32fC3(const float* src, float* dst, int64_t pixels, const Matrix& m, bool stream) {
-  const Columns c(m);
-  const bool streamed = stream && isAligned16(dst);
-  int64_t x = 0;
-  for (; x + 4 <= pixels; x += 4) {
+namespace {
+
+// ---- three-channel floats: four pixels (12 samples) per 128-bit lane ----
+//
+// Split p0 p1 p2 = r0 g0 b0 r1 | g1 b1 r2 g2 | b2 r3 g3 b3 into channels:
+// blends gather a channel's four samples in some order, one shuffle puts
+// them in pixel order. Each shuffle swaps two pairs of places or none, so
+// the same shuffle takes a channel back, and the same blends put the three
+// channels together again. The AVX2 form does the same in each 128-bit lane.
+
+inline Lanes3 split32fC3(__m128 p0, __m128 p1, __m128 p2) {
+  const __m128 ra = _mm_blend_ps(_mm_blend_ps(p0, p1, 0x4), p2, 0x2);
+  const __m128 rb = _mm_blend_ps(_mm_blend_ps(p0, p1, 0x9), p2, 0x4);
+  const __m128 rc = _mm_blend_ps(_mm_blend_ps(p0, p1, 0x2), p2, 0x9);
+  return {_mm_shuffle_ps(ra, ra, _MM_SHUFFLE(1, 2, 3, 0)), _mm_shuffle_ps(rb, rb, _MM_SHUFFLE(2, 3, 0, 1)),
+          _mm_shuffle_ps(rc, rc, _MM_SHUFFLE(3, 0, 1, 2))};
+}
+
+struct Pixels3 {
+  __m128 q0, q1, q2;
+};
+
+inline Pixels3 merge32fC3(__m128 o0, __m128 o1, __m128 o2) {
+  const __m128 ra = _mm_shuffle_ps(o0, o0, _MM_SHUFFLE(1, 2, 3, 0));
+  const __m128 rb = _mm_shuffle_ps(o1, o1, _MM_SHUFFLE(2, 3, 0, 1));
+  const __m128 rc = _mm_shuffle_ps(o2, o2, _MM_SHUFFLE(3, 0, 1, 2));
+  return {_mm_blend_ps(_mm_blend_ps(ra, rb, 0x2), rc, 0x4), _mm_blend_ps(_mm_blend_ps(rb, rc, 0x2), ra, 0x4),
+          _mm_blend_ps(_mm_blend_ps(rc, ra, 0x2), rb, 0x4)};
+}
+
+inline void pixel32fC3(const float* src, float* dst, int64_t x, const Matrix& m) {
+  const float* s = src + x * 3;
+  const float a = s[0], b = s[1], c = s[2];  // the whole pixel before any write
+  for (int i = 0; i < 3; ++i) dst[x * 3 + i] = output(m, i, a, b, c);
+}
+
+// Pixels from x on, a pixel at a time, until dst + 3 * x lies on an
+// `align`-byte boundary (never past `pixels`). Whole floats reach every
+// 32-byte boundary within eight pixels.
+inline int64_t alignPixels(const float* src, float* dst, int64_t x, int64_t pixels, const Matrix& m, unsigned align) {
+  while (x < pixels && (reinterpret_cast<uintptr_t>(dst + x * 3) & (align - 1)) != 0) pixel32fC3(src, dst, x++, m);
+  return x;
+}
+
+// A streamed run is far larger than the caches: its source is asked for
+// this many bytes ahead of the block being read (an address past the end
+// of the source is only a hint, never touched).
+constexpr uintptr_t kStreamPrefetchBytes = 4096;
+
+inline void prefetchAhead(const float* s) {
+  _mm_prefetch(reinterpret_cast<const char*>(reinterpret_cast<uintptr_t>(s) + kStreamPrefetchBytes), _MM_HINT_T0);
+}
+
+// Eight pixels per block, pixels x..x+3 in the low lanes and x+4..x+7 in
+// the high lanes of every register, 32-byte stores (streamed: dst + 3 * x
+// on a 32-byte boundary). Returns where the blocks stop.
+template <bool Stream>
+ZEL_AVX2 int64_t wide32fC3(const float* src, float* dst, int64_t x, int64_t pixels, const Matrix& m) {
+  __m256 t[3][4];
+  for (int i = 0; i < 3; ++i)
+    for (int j = 0; j < 4; ++j) t[i][j] = _mm256_set1_ps(m.t[i][j]);
+  for (; x + 8 <= pixels; x += 8) {
     const float* s = src + x * 3;
-    const __m128 p0 = _mm_loadu_ps(s), p1 = _mm_loadu_ps(s + 4), p2 = _mm_loadu_ps(s + 8);
-    // Split: a = p0[0] p0[3] p1[2] p2[1], b = p0[1] p1[0] p1[3] p2[2], c = p0[2] p1[1] p2[0] p2[3].
-    const __m128 ra = _mm_blend_ps(_mm_blend_ps(p0, p1, 0x4), p2, 0x2);
-    const __m128 rb = _mm_blend_ps(_mm_blend_ps(p0, p1, 0x9), p2, 0x4);
-    const __m128 rc = _mm_blend_ps(_mm_blend_ps(p0, p1, 0x2), p2, 0x9);
-    const Lanes3 v = {_mm_shuffle_ps(ra, ra, _MM_SHUFFLE(1, 2, 3, 0)), _mm_shuffle_ps(rb, rb, _MM_SHUFFLE(2, 3, 0, 1)),
-                      _mm_shuffle_ps(rc, rc, _MM_SHUFFLE(3, 0, 1, 2))};
-    const __m128 o0 = output4(c, 0, v), o1 = output4(c, 1, v), o2 = output4(c, 2, v);
-    // Merge back: r0 g0 b0 r1 | g1 b1 r2 g2 | b2 r3 g3 b3.
-    const __m128 lo = _mm_unpacklo_ps(o0, o1), hi = _mm_unpackhi_ps(o0, o1);
-    const __m128 q0 = _mm_shuffle_ps(lo, _mm_shuffle_ps(o2, lo, _MM_SHUFFLE(2, 2, 0, 0)), _MM_SHUFFLE(2, 0, 1, 0));
-    const __m128 q1 = _mm_shuffle_ps(_mm_shuffle_ps(lo, o2, _MM_SHUFFLE(1, 1, 3, 3)), hi, _MM_SHUFFLE(1, 0, 2, 0));
-    const __m128 q2 = _mm_shuffle_ps(_mm_shuffle_ps(o2, hi, _MM_SHUFFLE(3, 2, 2, 2)),
-                                     _mm_shuffle_ps(hi, o2, _MM_SHUFFLE(3, 3, 3, 3)), _MM_SHUFFLE(2, 0, 2, 0));
+    if constexpr (Stream) prefetchAhead(s);
+    const __m256 l0 = _mm256_loadu_ps(s), l1 = _mm256_loadu_ps(s + 8), l2 = _mm256_loadu_ps(s + 16);
+    // Samples 0..11 of the block in the low lanes, 12..23 in the high lanes.
+    const __m256 p0 = _mm256_blend_ps(l0, l1, 0xF0), p1 = _mm256_permute2f128_ps(l0, l2, 0x21),
+                 p2 = _mm256_blend_ps(l1, l2, 0xF0);
+    const __m256 ra = _mm256_blend_ps(_mm256_blend_ps(p0, p1, 0x44), p2, 0x22);
+    const __m256 rb = _mm256_blend_ps(_mm256_blend_ps(p0, p1, 0x99), p2, 0x44);
+    const __m256 rc = _mm256_blend_ps(_mm256_blend_ps(p0, p1, 0x22), p2, 0x99);
+    const __m256 v[3] = {_mm256_permute_ps(ra, _MM_SHUFFLE(1, 2, 3, 0)), _mm256_permute_ps(rb, _MM_SHUFFLE(2, 3, 0, 1)),
+                         _mm256_permute_ps(rc, _MM_SHUFFLE(3, 0, 1, 2))};
+    __m256 o[3];
+    for (int i = 0; i < 3; ++i)
+      o[i] = _mm256_add_ps(_mm256_add_ps(t[i][3], _mm256_mul_ps(v[0], t[i][0])),
+                           _mm256_add_ps(_mm256_mul_ps(v[2], t[i][2]), _mm256_mul_ps(v[1], t[i][1])));
+    const __m256 sa = _mm256_permute_ps(o[0], _MM_SHUFFLE(1, 2, 3, 0));
+    const __m256 sb = _mm256_permute_ps(o[1], _MM_SHUFFLE(2, 3, 0, 1));
+    const __m256 sc = _mm256_permute_ps(o[2], _MM_SHUFFLE(3, 0, 1, 2));
+    const __m256 q0 = _mm256_blend_ps(_mm256_blend_ps(sa, sb, 0x22), sc, 0x44);
+    const __m256 q1 = _mm256_blend_ps(_mm256_blend_ps(sb, sc, 0x22), sa, 0x44);
+    const __m256 q2 = _mm256_blend_ps(_mm256_blend_ps(sc, sa, 0x22), sb, 0x44);
+    const __m256 w0 = _mm256_permute2f128_ps(q0, q1, 0x20), w1 = _mm256_blend_ps(q2, q0, 0xF0),
+                 w2 = _mm256_permute2f128_ps(q1, q2, 0x31);
     float* d = dst + x * 3;
-    if (streamed) {
-      _mm_stream_ps(d, q0);
-      _mm_stream_ps(d + 4, q1);
-      _mm_stream_ps(d + 8, q2);
+    if constexpr (Stream) {
+      _mm256_stream_ps(d, w0);
+      _mm256_stream_ps(d + 8, w1);
+      _mm256_stream_ps(d + 16, w2);
     } else {
-      _mm_storeu_ps(d, q0);
-      _mm_storeu_ps(d + 4, q1);
-      _mm_storeu_ps(d + 8, q2);
+      _mm256_storeu_ps(d, w0);
+      _mm256_storeu_ps(d + 8, w1);
+      _mm256_storeu_ps(d + 16, w2);
     }
   }
-  for (; x < pixels; ++x) {
+  return x;
+}
+
+}  // namespace
+
+void row32fC3(const float* src, float* dst, int64_t pixels, const Matrix& m, bool stream, bool wide) {
+  const Columns c(m);
+  // Streaming needs whole floats; the first pixels then go one by one until
+  // the stores are aligned, and every block store is a whole aligned one.
+  const bool streamed = stream && (reinterpret_cast<uintptr_t>(dst) & 3) == 0;
+  int64_t x = 0;
+  if (streamed) x = alignPixels(src, dst, x, pixels, m, wide ? 32 : 16);
+  if (wide) x = streamed ? wide32fC3<true>(src, dst, x, pixels, m) : wide32fC3<false>(src, dst, x, pixels, m);
+  for (; x + 4 <= pixels; x += 4) {
     const float* s = src + x * 3;
-    const float a = s[0], b = s[1], cc = s[2];
-    for (int i = 0; i < 3; ++i) dst[x * 3 + i] = output(m, i, a, b, cc);
+    if (streamed) prefetchAhead(s);
+    const Lanes3 v = split32fC3(_mm_loadu_ps(s), _mm_loadu_ps(s + 4), _mm_loadu_ps(s + 8));
+    const Pixels3 q = merge32fC3(output4(c, 0, v), output4(c, 1, v), output4(c, 2, v));
+    float* d = dst + x * 3;
+    if (streamed) {
+      _mm_stream_ps(d, q.q0);
+      _mm_stream_ps(d + 4, q.q1);
+      _mm_stream_ps(d + 8, q.q2);
+    } else {
+      _mm_storeu_ps(d, q.q0);
+      _mm_storeu_ps(d + 4, q.q1);
+      _mm_storeu_ps(d + 8, q.q2);
+    }
   }
+  for (; x < pixels; ++x) pixel32fC3(src, dst, x, m);
   if (stream) _mm_sfence();
 }
 
@@ -586,13 +676,13 @@ ZEL_PUBLIC Status zeliColorTwist_32f_C3R(const float* src, int srcStep, float* d
   if (size.width < 1 || size.height < 1) return StatusSizeError;
   if (srcStep < 1 || dstStep < 1) return StatusStepError;
   const Matrix m = matrix3(twist);
-  const bool stream = streamsC3(size.width, size.height);
+  const bool stream = streamsC3(size.width, size.height), wide = zel::hasAvx2();
   if (mergesC3(srcStep, dstStep, size.width)) {
-    row32fC3(src, dst, int64_t(size.width) * size.height, m, stream);
+    row32fC3(src, dst, int64_t(size.width) * size.height, m, stream, wide);
     return StatusOk;
   }
   plainWalk(size.height,
-            [&](int y) { row32fC3(rowAt(src, srcStep, y), rowAt(dst, dstStep, y), size.width, m, stream); });
+            [&](int y) { row32fC3(rowAt(src, srcStep, y), rowAt(dst, dstStep, y), size.width, m, stream, wide); });
   return StatusOk;
 }
 ZEL_PUBLIC Status zeliColorTwist_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,

@@ -18,9 +18,10 @@ template <typename T, int K>
 void row(const T* const src[3], T* const dst[3], int width, const Matrix& m, bool wide);
 
 // Three-channel floats over `pixels` pixels; `stream` writes the blocks
-// with non-temporal stores (where the destination is 16-byte aligned)
-// and ends with a store fence.
-void row32fC3(const float* src, float* dst, int64_t pixels, const Matrix& m, bool stream);
+// with non-temporal stores (where the destination holds whole floats) and
+// ends with a store fence; `wide` takes blocks of eight pixels (the caller
+// having checked for AVX2).
+void row32fC3(const float* src, float* dst, int64_t pixels, const Matrix& m, bool stream, bool wide);
 // Four-channel floats over `pixels` pixels.
 void row32fC4(const float* src, float* dst, int64_t pixels, const Matrix& m);
 

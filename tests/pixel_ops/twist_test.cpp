@@ -87,7 +87,7 @@ void checkKernel(float weight, float constant, bool inPlace, bool wide) {
 template <typename T>
 void checkAllLayouts(float weight, float constant) {
   for (bool wide : {false, true}) {
-    if (wide && (std::is_same_v<T, float> || !zel::hasAvx2())) continue;
+    if (wide && !zel::hasAvx2()) continue;
     for (bool inPlace : {false, true}) {
       checkKernel<T, C3>(weight, constant, inPlace, wide);
       checkKernel<T, AC4>(weight, constant, inPlace, wide);
@@ -115,19 +115,29 @@ TEST(TwistKernels, NonFiniteAndHugeEntriesClampAlikeInBlocksAndTails) {
 TEST(TwistKernels, FloatRunsMatchTheFormula) {
   std::mt19937 rng(9);
   for (int pixels = 1; pixels <= 70; ++pixels)
-    for (int offset : {0, 4, 8}) {
+    for (int offset : {0, 4, 8, 12}) {
       const Matrix m = randomMatrix(rng, 2.0f, 1.0f);
-      TestImage<float> src(pixels * 4, 1, offset), dst(pixels * 4, 1, 0);
+      TestImage<float> src(pixels * 4, 1, offset);
       src.fillRandom(rng(), -1, 2);
-      // Three channels, with and without streaming stores.
-      for (bool stream : {false, true}) {
-        row32fC3(src.data(), dst.data(), pixels, m, stream);
-        for (int x = 0; x < pixels * 3; ++x) {
-          const float* p = src.data() + (x / 3) * 3;
-          ASSERT_EQ(dst.get(x, 0), output(m, x % 3, p[0], p[1], p[2])) << pixels << " " << x;
+      // Three channels, with and without streaming stores, four and eight
+      // pixels a block, the destination at every 4-byte place of a 32-byte
+      // block (the first pixels go one by one to a boundary).
+      for (int dstOffset : {0, 4, 8, 12, 16, 20, 28})
+        for (bool wide : {false, true}) {
+          if (wide && !zel::hasAvx2()) continue;
+          for (bool stream : {false, true}) {
+            TestImage<float> dst(pixels * 3, 1, dstOffset);
+            row32fC3(src.data(), dst.data(), pixels, m, stream, wide);
+            for (int x = 0; x < pixels * 3; ++x) {
+              const float* p = src.data() + (x / 3) * 3;
+              const float got = dst.get(x, 0), want = output(m, x % 3, p[0], p[1], p[2]);
+              ASSERT_EQ(std::memcmp(&got, &want, 4), 0) << pixels << " " << x << " at " << dstOffset;
+            }
+            ASSERT_TRUE(dst.guardsIntact());
+          }
         }
-      }
       // Four channels.
+      TestImage<float> dst(pixels * 4, 1, 0);
       row32fC4(src.data(), dst.data(), pixels, m);
       for (int x = 0; x < pixels * 4; ++x) {
         const float* p = src.data() + (x / 4) * 4;
