@@ -10,10 +10,10 @@
 namespace zel::spaces {
 
 // c is close to the cube root of the upper end of cell i, w to 1 / c^3.
-extern const float CubeRootTable[128][2];
+extern const float (&CubeRootTable)[128][2];
 // The same rows but for 124..127: the table of the float and 16-bit forward
 // forms of LUV.
-extern const float CubeRootTableLuv[128][2];
+extern const float (&CubeRootTableLuv)[128][2];
 
 // t in 0..1 to its cell.
 inline constexpr float kCubeIndexScale = 127.998047f;  // 0x42FFFF00
