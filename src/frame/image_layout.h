@@ -21,4 +21,12 @@ inline bool isAligned16(int step) { return (step & 15) == 0; }
 // rest one by one. `block` is a power of two.
 inline int bodyEnd(int width, int block) { return width & ~(block - 1); }
 
+// True when one of the first `count` plane pointers of an array is null.
+template <typename T>
+inline bool anyPlaneNull(T* const* planes, int count = 3) {
+  for (int k = 0; k < count; ++k)
+    if (!planes[k]) return true;
+  return false;
+}
+
 }  // namespace zel

@@ -150,12 +150,10 @@ struct OutPlanes3 {
   uint8_t* row(int plane, int y) const { return rowAt(p[plane], step[plane], y); }
 };
 
-bool anyNull3(const void* const* planes) { return !planes[0] || !planes[1] || !planes[2]; }
-
 // A plane set is missing when its array, its steps or any plane is null.
 template <typename T>
 bool missingPlanes(T* const* planes, const int* steps) {
-  return !planes || !steps || anyNull3(reinterpret_cast<const void* const*>(planes));
+  return !planes || !steps || anyPlaneNull(planes);
 }
 
 // Luma rows copied, as one row when no gap lies between them.
@@ -489,7 +487,7 @@ ZEL_PUBLIC Status zeliYCrCb420ToBGR_Filter_8u_P3C4R(const uint8_t* const src[3],
                                                     int dstStep, ImageSize size, uint8_t alpha) {
   if (!src || !srcStep || !dst) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyNull3(reinterpret_cast<const void* const*>(src))) return StatusNullPointerError;
+  if (zel::anyPlaneNull(src)) return StatusNullPointerError;
   // A last odd column and row stay unwritten, but a one-pixel-wide image
   // still gets a closing pair.
   const int pairs = std::max(size.width >> 1, 1);

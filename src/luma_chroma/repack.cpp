@@ -399,8 +399,6 @@ Side planeSide(const uint8_t* const* p, const int* steps, bool crFirst) {
               3};
 }
 
-bool anyNull(const uint8_t* const* planes) { return !planes[0] || !planes[1] || !planes[2]; }
-
 constexpr Layout pairsOf(PairOrder o) { return Layout{Kind::Pairs, o, false, Scheme::S422}; }
 constexpr Layout twoPlanes(Scheme s) { return Layout{Kind::TwoPlanes, PairOrder::YCbCr, false, s}; }
 constexpr Layout planes(Scheme s, bool crFirst = false) { return Layout{Kind::Planes, PairOrder::YCbCr, crFirst, s}; }
@@ -433,6 +431,7 @@ constexpr Layout kYCbCrPairs = pairsOf(PairOrder::YCbCr), kYCrCbPairs = pairsOf(
 }  // namespace zel::repack
 
 using namespace zel::repack;
+using zel::anyPlaneNull;
 
 // Public frames by layout pair: pointers and plane entries, then the
 // member's size rule, then the work.
@@ -441,11 +440,11 @@ using namespace zel::repack;
     if (!src || !dst) return StatusNullPointerError;                                                \
     return run(m, pairSide(src, srcStep), pairSide(dst, dstStep), size);                           \
   }
-#define REPACK_C2P3(name, m)                                                                        \
+#define REPACK_C2P3(name, m)                                                                                \
   ZEL_PUBLIC Status name(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3],      \
-                         ImageSize size) {                                                                   \
-    if (!src || !dst || !dstStep || anyNull(dst)) return StatusNullPointerError;                             \
-    return run(m, pairSide(src, srcStep), planeSide(dst, dstStep, (m).dst.crFirst), size);                          \
+                         ImageSize size) {                                                                  \
+    if (!src || !dst || !dstStep || anyPlaneNull(dst)) return StatusNullPointerError;                       \
+    return run(m, pairSide(src, srcStep), planeSide(dst, dstStep, (m).dst.crFirst), size);                  \
   }
 #define REPACK_C2P2(name, m)                                                                                 \
   ZEL_PUBLIC Status name(const uint8_t* src, int srcStep, uint8_t* dstY, int dstYStep, uint8_t* dstCbCr,    \
@@ -453,22 +452,22 @@ using namespace zel::repack;
     if (!src || !dstY || !dstCbCr) return StatusNullPointerError;                                           \
     return run(m, pairSide(src, srcStep), twoPlaneSide(dstY, dstYStep, dstCbCr, dstCbCrStep), size);        \
   }
-#define REPACK_P3C2(name, m)                                                                        \
+#define REPACK_P3C2(name, m)                                                                                \
   ZEL_PUBLIC Status name(const uint8_t* const src[3], const int srcStep[3], uint8_t* dst, int dstStep,      \
-                         ImageSize size) {                                                                   \
-    if (!src || !srcStep || anyNull(src) || !dst) return StatusNullPointerError;                            \
-    return run(m, planeSide(src, srcStep, (m).src.crFirst), pairSide(dst, dstStep), size);                          \
+                         ImageSize size) {                                                                  \
+    if (!src || !srcStep || anyPlaneNull(src) || !dst) return StatusNullPointerError;                       \
+    return run(m, planeSide(src, srcStep, (m).src.crFirst), pairSide(dst, dstStep), size);                  \
   }
-#define REPACK_P3P3(name, m)                                                         \
-  ZEL_PUBLIC Status name(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3],         \
-                         const int dstStep[3], ImageSize size) {                                             \
-    if (!src || !srcStep || anyNull(src) || !dst || !dstStep || anyNull(dst)) return StatusNullPointerError; \
-    return run(m, planeSide(src, srcStep, (m).src.crFirst), planeSide(dst, dstStep, (m).dst.crFirst), size);          \
+#define REPACK_P3P3(name, m)                                                                                           \
+  ZEL_PUBLIC Status name(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3],                     \
+                         const int dstStep[3], ImageSize size) {                                                       \
+    if (!src || !srcStep || anyPlaneNull(src) || !dst || !dstStep || anyPlaneNull(dst)) return StatusNullPointerError; \
+    return run(m, planeSide(src, srcStep, (m).src.crFirst), planeSide(dst, dstStep, (m).dst.crFirst), size);           \
   }
-#define REPACK_P3P2(name, m)                                                                        \
-  ZEL_PUBLIC Status name(const uint8_t* const src[3], const int srcStep[3], uint8_t* dstY, int dstYStep,    \
-                         uint8_t* dstCbCr, int dstCbCrStep, ImageSize size) {                                \
-    if (!src || !srcStep || anyNull(src) || !dstY || !dstCbCr) return StatusNullPointerError;               \
+#define REPACK_P3P2(name, m)                                                                                           \
+  ZEL_PUBLIC Status name(const uint8_t* const src[3], const int srcStep[3], uint8_t* dstY, int dstYStep,               \
+                         uint8_t* dstCbCr, int dstCbCrStep, ImageSize size) {                                          \
+    if (!src || !srcStep || anyPlaneNull(src) || !dstY || !dstCbCr) return StatusNullPointerError;                     \
     return run(m, planeSide(src, srcStep, (m).src.crFirst), twoPlaneSide(dstY, dstYStep, dstCbCr, dstCbCrStep), size); \
   }
 #define REPACK_P2C2(name, m)                                                                                 \
@@ -477,10 +476,10 @@ using namespace zel::repack;
     if (!srcY || !srcCbCr || !dst) return StatusNullPointerError;                                           \
     return run(m, twoPlaneSide(srcY, srcYStep, srcCbCr, srcCbCrStep), pairSide(dst, dstStep), size);        \
   }
-#define REPACK_P2P3(name, m)                                                                        \
-  ZEL_PUBLIC Status name(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep,        \
-                         uint8_t* const dst[3], const int dstStep[3], ImageSize size) {                      \
-    if (!srcY || !srcCbCr || !dst || !dstStep || anyNull(dst)) return StatusNullPointerError;               \
+#define REPACK_P2P3(name, m)                                                                                           \
+  ZEL_PUBLIC Status name(const uint8_t* srcY, int srcYStep, const uint8_t* srcCbCr, int srcCbCrStep,                   \
+                         uint8_t* const dst[3], const int dstStep[3], ImageSize size) {                                \
+    if (!srcY || !srcCbCr || !dst || !dstStep || anyPlaneNull(dst)) return StatusNullPointerError;                     \
     return run(m, twoPlaneSide(srcY, srcYStep, srcCbCr, srcCbCrStep), planeSide(dst, dstStep, (m).dst.crFirst), size); \
   }
 
@@ -555,13 +554,13 @@ REPACK_P3P2(zeliYCbCr411_8u_P3P2R, member(planes(S411), twoPlanes(S411)))
 // Filtered resampling between 4:1:1 and 4:2:0.
 ZEL_PUBLIC Status zeliYCbCr411To420_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3],
                                            const int dstStep[3], ImageSize size) {
-  if (!src || !srcStep || anyNull(src) || !dst || !dstStep || anyNull(dst)) return StatusNullPointerError;
+  if (!src || !srcStep || anyPlaneNull(src) || !dst || !dstStep || anyPlaneNull(dst)) return StatusNullPointerError;
   return filter411To420(planeSide(src, srcStep, false), planeSide(dst, dstStep, false), size);
 }
 
 ZEL_PUBLIC Status zeliYCbCr420To411_8u_P3R(const uint8_t* const src[3], const int srcStep[3], uint8_t* const dst[3],
                                            const int dstStep[3], ImageSize size) {
-  if (!src || !srcStep || anyNull(src) || !dst || !dstStep || anyNull(dst)) return StatusNullPointerError;
+  if (!src || !srcStep || anyPlaneNull(src) || !dst || !dstStep || anyPlaneNull(dst)) return StatusNullPointerError;
   return filter420To411(planeSide(src, srcStep, false), planeSide(dst, dstStep, false), size);
 }
 

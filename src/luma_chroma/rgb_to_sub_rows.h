@@ -12,6 +12,7 @@
 #include <cstdint>
 #include <type_traits>
 
+#include "frame/image_layout.h"
 #include "frame/simd.h"
 #include "luma_chroma/pixel_rows.h"
 #include "luma_chroma/repack_rows.h"
@@ -43,6 +44,22 @@ struct RgbSource {
 template <int Stride, bool Bgr>
 using PackedSource = RgbSource<PackedIn<Stride>, Bgr>;
 using PlanesSource = RgbSource<PlanesIn, false>;
+
+// The source row y of an interleaved image or of three planes.
+template <int Stride, bool Bgr>
+struct PackedRows {
+  const uint8_t* src;
+  int step;
+  PackedSource<Stride, Bgr> operator()(int y) const { return {PackedIn<Stride>{rowAt(src, step, y)}}; }
+};
+
+struct PlaneRows {
+  const uint8_t* const* planes;
+  int step;
+  PlanesSource operator()(int y) const {
+    return {PlanesIn{rowAt(planes[0], step, y), rowAt(planes[1], step, y), rowAt(planes[2], step, y)}};
+  }
+};
 
 // ---- destinations ----
 //

@@ -12,27 +12,6 @@ namespace zel::lc::sub {
 
 namespace {
 
-template <int Stride, bool Bgr>
-struct PackedRows {
-  const uint8_t* src;
-  int step;
-  PackedSource<Stride, Bgr> operator()(int y) const { return {PackedIn<Stride>{rowAt(src, step, y)}}; }
-};
-
-struct PlaneRows {
-  const uint8_t* const* planes;
-  int step;
-  PlanesSource operator()(int y) const {
-    return {PlanesIn{rowAt(planes[0], step, y), rowAt(planes[1], step, y), rowAt(planes[2], step, y)}};
-  }
-};
-
-bool anyNull(const void* const* planes, int count) {
-  for (int i = 0; i < count; ++i)
-    if (!planes[i]) return true;
-  return false;
-}
-
 Status oddWarning(ImageSize size, bool rows) {
   return ((size.width & 1) || (rows && (size.height & 1))) ? StatusOddSizeWarning : StatusOk;
 }
@@ -65,7 +44,7 @@ Status lanes420(const uint8_t* src, int srcStep, uint8_t* const dst[3], const in
                 int minimum) {
   if (!src || !dst || !dstStep) return StatusNullPointerError;
   if (size.width < minimum || size.height < minimum) return StatusSizeError;
-  if (anyNull(reinterpret_cast<const void* const*>(dst), 3)) return StatusNullPointerError;
+  if (anyPlaneNull(dst, 3)) return StatusNullPointerError;
   const int a = CrFirst ? 2 : 1, b = CrFirst ? 1 : 2;
   walk420<LanesBody<S, 4>, WideTail<S, 4>>(PackedRows<Stride, Bgr>{src, srcStep}, dst[0], dstStep[0], dst[a],
                                            dstStep[a], dst[b], dstStep[b], size, bodyBy16Then4(size.width));
@@ -77,7 +56,7 @@ template <int Stride>
 Status rounded420Planes(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size) {
   if (!src || !dst || !dstStep) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyNull(reinterpret_cast<const void* const*>(dst), 3)) return StatusNullPointerError;
+  if (anyPlaneNull(dst, 3)) return StatusNullPointerError;
   walk420<RoundedBody<false>, WideTail<set601, 4>>(PackedRows<Stride, false>{src, srcStep}, dst[0], dstStep[0], dst[1],
                                                    dstStep[1], dst[2], dstStep[2], size, bodyByHalfWidth(size.width));
   return oddWarning(size, true);
@@ -122,7 +101,7 @@ template <int Stride, bool Bgr>
 Status lanes422Planes(const uint8_t* src, int srcStep, uint8_t* const dst[3], const int dstStep[3], ImageSize size) {
   if (!src || !dst || !dstStep) return StatusNullPointerError;
   if (size.width < 2 || size.height < 1) return StatusSizeError;
-  if (anyNull(reinterpret_cast<const void* const*>(dst), 3)) return StatusNullPointerError;
+  if (anyPlaneNull(dst, 3)) return StatusNullPointerError;
   walkRows<2, LanesBody<set601, 2>, WideTail<set601, 2>>(
       PackedRows<Stride, Bgr>{src, srcStep}, PlaneOutRows<2>{dst, dstStep}, size, bodyBy32Then8(size.width));
   return StatusOk;
@@ -158,6 +137,7 @@ Status cbycrPairs(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, Im
 }  // namespace zel::lc::sub
 
 using namespace zel::lc::sub;
+using zel::anyPlaneNull;
 using zel::lc::PackedIn;
 
 // ---- 4:2:0, lane bodies ----
@@ -234,7 +214,7 @@ ZEL_PUBLIC Status zeliBGRToYCbCr411_8u_C3P3R(const uint8_t* src, int srcStep, ui
                                              const int dstSteps[3], ImageSize size) {
   if (!src || !dstPlanes || !dstSteps) return StatusNullPointerError;
   if (size.width < 4 || size.height < 1) return StatusSizeError;
-  if (anyNull(reinterpret_cast<const void* const*>(dstPlanes), 3)) return StatusNullPointerError;
+  if (anyPlaneNull(dstPlanes, 3)) return StatusNullPointerError;
   walkRows<4, RoundedBody<true>, WideTail<set601, 4>>(PackedRows<3, true>{src, srcStep},
                                                       PlaneOutRows<4>{dstPlanes, dstSteps}, size, size.width & ~15);
   return (size.width & 3) ? StatusOddSizeWarning : StatusOk;
@@ -243,7 +223,7 @@ ZEL_PUBLIC Status zeliBGRToYCbCr411_8u_AC4P3R(const uint8_t* src, int srcStep, u
                                               const int dstSteps[3], ImageSize size) {
   if (!src || !dstPlanes || !dstSteps) return StatusNullPointerError;
   if (size.width < 4 || size.height < 1) return StatusSizeError;
-  if (anyNull(reinterpret_cast<const void* const*>(dstPlanes), 3)) return StatusNullPointerError;
+  if (anyPlaneNull(dstPlanes, 3)) return StatusNullPointerError;
   walkRows<4, LanesBody<set601, 4>, WideTail<set601, 4>>(PackedRows<4, true>{src, srcStep},
                                                          PlaneOutRows<4>{dstPlanes, dstSteps}, size, size.width & ~31);
   return (size.width & 3) ? StatusOddSizeWarning : StatusOk;
@@ -291,14 +271,14 @@ ZEL_PUBLIC Status zeliRGBToYCbCr422_8u_P3C2R(const uint8_t* const srcPlanes[3], 
                                              ImageSize size) {
   if (!srcPlanes || !dst) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyNull(reinterpret_cast<const void* const*>(srcPlanes), 3)) return StatusNullPointerError;
+  if (anyPlaneNull(srcPlanes, 3)) return StatusNullPointerError;
   return exactPairs<PairOrder::YCbCr>(PlaneRows{srcPlanes, srcStep}, dst, dstStep, size);
 }
 ZEL_PUBLIC Status zeliRGBToYCrCb422_8u_P3C2R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
                                              ImageSize size) {
   if (!srcPlanes || !dst) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyNull(reinterpret_cast<const void* const*>(srcPlanes), 3)) return StatusNullPointerError;
+  if (anyPlaneNull(srcPlanes, 3)) return StatusNullPointerError;
   return exactPairs<PairOrder::YCrCb>(PlaneRows{srcPlanes, srcStep}, dst, dstStep, size);
 }
 

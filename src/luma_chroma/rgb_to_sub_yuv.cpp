@@ -17,23 +17,6 @@ namespace zel::lc::sub {
 
 namespace {
 
-bool anyNull(const void* const* planes) { return !planes[0] || !planes[1] || !planes[2]; }
-
-template <int Stride, bool Bgr>
-struct PackedRows {
-  const uint8_t* src;
-  int step;
-  PackedSource<Stride, Bgr> operator()(int y) const { return {PackedIn<Stride>{rowAt(src, step, y)}}; }
-};
-
-struct PlaneRows {
-  const uint8_t* const* planes;
-  int step;
-  PlanesSource operator()(int y) const {
-    return {PlanesIn{rowAt(planes[0], step, y), rowAt(planes[1], step, y), rowAt(planes[2], step, y)}};
-  }
-};
-
 Status oddWarning420(ImageSize size) { return ((size.width | size.height) & 1) ? StatusOddSizeWarning : StatusOk; }
 
 // ---- 4:2:0 ----
@@ -120,6 +103,7 @@ void packedOrRows(ImageSize size, Image image, Rows rows) {
 }  // namespace zel::lc::sub
 
 using namespace zel::lc::sub;
+using zel::anyPlaneNull;
 using zel::lc::PackedIn;
 using zel::lc::PlanesIn;
 
@@ -129,7 +113,7 @@ ZEL_PUBLIC Status zeliBGRToYUV420_8u_AC4P3R(const uint8_t* src, int srcStep, uin
                                             const int dstSteps[3], ImageSize size) {
   if (!src || !dstPlanes || !dstSteps) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyNull(reinterpret_cast<const void* const*>(dstPlanes))) return StatusNullPointerError;
+  if (anyPlaneNull(dstPlanes)) return StatusNullPointerError;
   walk420<DifferenceBody<4>, WideDifference420Tail>(PackedRows<4, true>{src, srcStep}, dstPlanes, dstSteps, size,
                                                     size.width & ~15);
   return oddWarning420(size);
@@ -139,8 +123,8 @@ ZEL_PUBLIC Status zeliRGBToYUV420_8u_P3R(const uint8_t* const srcPlanes[3], int 
                                          const int dstSteps[3], ImageSize size) {
   if (!srcPlanes || !dstPlanes || !dstSteps) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyNull(reinterpret_cast<const void* const*>(srcPlanes)) ||
-      anyNull(reinterpret_cast<const void* const*>(dstPlanes)))
+  if (anyPlaneNull(srcPlanes) ||
+      anyPlaneNull(dstPlanes))
     return StatusNullPointerError;
   planes420(srcPlanes, srcStep, dstPlanes, dstSteps, size);
   return oddWarning420(size);
@@ -150,8 +134,8 @@ ZEL_PUBLIC Status zeliRGBToYUV420_8u_P3(const uint8_t* const srcPlanes[3], uint8
                                         ImageSize size) {
   if (!srcPlanes || !dstPlanes) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyNull(reinterpret_cast<const void* const*>(srcPlanes)) ||
-      anyNull(reinterpret_cast<const void* const*>(dstPlanes)))
+  if (anyPlaneNull(srcPlanes) ||
+      anyPlaneNull(dstPlanes))
     return StatusNullPointerError;
   const int steps[3] = {size.width, size.width >> 1, size.width >> 1};
   planes420(srcPlanes, size.width, dstPlanes, steps, size);
@@ -162,7 +146,7 @@ ZEL_PUBLIC Status zeliRGBToYUV420_8u_C3P3R(const uint8_t* src, int srcStep, uint
                                            const int dstSteps[3], ImageSize size) {
   if (!src || !dstPlanes || !dstSteps) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyNull(reinterpret_cast<const void* const*>(dstPlanes))) return StatusNullPointerError;
+  if (anyPlaneNull(dstPlanes)) return StatusNullPointerError;
   // Aligned planes would take aligned stores; the bytes are the same.
   packed420(src, srcStep, dstPlanes, dstSteps, size);
   return oddWarning420(size);
@@ -171,7 +155,7 @@ ZEL_PUBLIC Status zeliRGBToYUV420_8u_C3P3R(const uint8_t* src, int srcStep, uint
 ZEL_PUBLIC Status zeliRGBToYUV420_8u_C3P3(const uint8_t* src, uint8_t* const dstPlanes[3], ImageSize size) {
   if (!src || !dstPlanes) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyNull(reinterpret_cast<const void* const*>(dstPlanes))) return StatusNullPointerError;
+  if (anyPlaneNull(dstPlanes)) return StatusNullPointerError;
   const int steps[3] = {size.width, size.width >> 1, size.width >> 1};
   packed420(src, 3 * size.width, dstPlanes, steps, size);
   return oddWarning420(size);
@@ -196,7 +180,7 @@ ZEL_PUBLIC Status zeliRGBToYUV422_8u_C3P3R(const uint8_t* src, int srcStep, uint
                                            const int dstSteps[3], ImageSize size) {
   if (!src || !dstPlanes || !dstSteps) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyNull(reinterpret_cast<const void* const*>(dstPlanes))) return StatusNullPointerError;
+  if (anyPlaneNull(dstPlanes)) return StatusNullPointerError;
   walk422(PackedRows<3, false>{src, srcStep}, dstPlanes, dstSteps, size,
           allAligned16(src, srcStep, dstPlanes, dstSteps));
   return StatusOk;
@@ -205,7 +189,7 @@ ZEL_PUBLIC Status zeliRGBToYUV422_8u_C3P3R(const uint8_t* src, int srcStep, uint
 ZEL_PUBLIC Status zeliRGBToYUV422_8u_C3P3(const uint8_t* src, uint8_t* const dstPlanes[3], ImageSize size) {
   if (!src || !dstPlanes) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyNull(reinterpret_cast<const void* const*>(dstPlanes))) return StatusNullPointerError;
+  if (anyPlaneNull(dstPlanes)) return StatusNullPointerError;
   const int w = size.width;
   const int steps[3] = {w, w / 2 + (w & 1), w / 2 + (w & 1)};
   packedOrRows(
@@ -224,8 +208,8 @@ ZEL_PUBLIC Status zeliRGBToYUV422_8u_P3R(const uint8_t* const srcPlanes[3], int 
                                          const int dstSteps[3], ImageSize size) {
   if (!srcPlanes || !dstPlanes || !dstSteps) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyNull(reinterpret_cast<const void* const*>(srcPlanes)) ||
-      anyNull(reinterpret_cast<const void* const*>(dstPlanes)))
+  if (anyPlaneNull(srcPlanes) ||
+      anyPlaneNull(dstPlanes))
     return StatusNullPointerError;
   walk422(PlaneRows{srcPlanes, srcStep}, dstPlanes, dstSteps, size, false);
   return StatusOk;
@@ -235,8 +219,8 @@ ZEL_PUBLIC Status zeliRGBToYUV422_8u_P3(const uint8_t* const srcPlanes[3], uint8
                                         ImageSize size) {
   if (!srcPlanes || !dstPlanes) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyNull(reinterpret_cast<const void* const*>(srcPlanes)) ||
-      anyNull(reinterpret_cast<const void* const*>(dstPlanes)))
+  if (anyPlaneNull(srcPlanes) ||
+      anyPlaneNull(dstPlanes))
     return StatusNullPointerError;
   const int w = size.width;
   const int steps[3] = {w, w / 2 + (w & 1), w / 2 + (w & 1)};

@@ -68,6 +68,7 @@ void pairsThenWide(const uint8_t* src, int srcStep, MakeOut out, ImageSize size)
 }  // namespace zel::lc::expand
 
 using namespace zel::lc::expand;
+using zel::anyPlaneNull;
 using zel::lc::lanes601a;
 using zel::lc::lanes601b;
 using zel::lc::wide601a;

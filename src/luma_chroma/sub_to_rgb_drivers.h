@@ -13,9 +13,6 @@
 
 namespace zel::lc::expand {
 
-inline bool anyPlaneNull(const uint8_t* const planes[3]) { return !planes[0] || !planes[1] || !planes[2]; }
-inline bool anyPlaneNull(uint8_t* const planes[3]) { return !planes[0] || !planes[1] || !planes[2]; }
-
 inline bool sizeBelow(ImageSize size, int minWidth, int minHeight) {
   return size.width < minWidth || size.height < minHeight;
 }

@@ -44,13 +44,11 @@ PackedOutAlpha<Reverse> out4(uint8_t* row, uint8_t alpha) {
   return {row, alpha};
 }
 
-bool anyNull(const uint8_t* const planes[3]) { return !planes[0] || !planes[1] || !planes[2]; }
-
 // The BGR names: pointers and plane entries, then the size; one form.
 template <class Out, class Body>
 Status bgrMember(const uint8_t* const srcPlanes[3], int srcStep, Out (*outRow)(uint8_t*, uint8_t), uint8_t* dst,
                  int dstStep, uint8_t alpha, ImageSize size, const Body& body) {
-  if (!srcPlanes || !dst || anyNull(srcPlanes)) return StatusNullPointerError;
+  if (!srcPlanes || !dst || anyPlaneNull(srcPlanes)) return StatusNullPointerError;
   if (badSize(size)) return StatusSizeError;
   planesToPacked(srcPlanes, srcStep, outRow, dst, dstStep, alpha, size, size.width, body, body);
   return StatusOk;
@@ -61,6 +59,7 @@ Status bgrMember(const uint8_t* const srcPlanes[3], int srcStep, Out (*outRow)(u
 }  // namespace zel::lc
 
 using namespace zel::lc;
+using zel::anyPlaneNull;
 
 ZEL_PUBLIC Status zeliYCbCrToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep,
                                          ImageSize size) {
@@ -88,7 +87,7 @@ ZEL_PUBLIC Status zeliYCbCrToRGB_8u_P3R(const uint8_t* const srcPlanes[3], int s
   if (!srcPlanes || !dstPlanes) return StatusNullPointerError;
   if (badSize(size)) return StatusSizeError;
   if (!dstPlanes[0] || !dstPlanes[1] || !dstPlanes[2]) return StatusNullPointerError;
-  if (anyNull(srcPlanes)) return StatusNullPointerError;
+  if (anyPlaneNull(srcPlanes)) return StatusNullPointerError;
   // Blocks of 16, 8 and 4 all compute the body form (no rounding term);
   // the last width AND 3 pixels round in the wide form.
   walkRows(size, size.width & ~3, LaneAddedBytes<lanes601a, 0>{}, WideRgbForm{wide601a, 32768},
@@ -104,7 +103,7 @@ ZEL_PUBLIC Status zeliYCbCrToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], int
                                           ImageSize size) {
   if (!srcPlanes || !dst) return StatusNullPointerError;
   if (badSize(size)) return StatusSizeError;
-  if (anyNull(srcPlanes)) return StatusNullPointerError;
+  if (anyPlaneNull(srcPlanes)) return StatusNullPointerError;
   planesToPacked(srcPlanes, srcStep, &out3<false>, dst, dstStep, 0, size, size.width & ~7,
                  LaneAddedForm{lanes601b, 8}, WideRgbForm{wide601b, 0});
   return StatusOk;
@@ -114,7 +113,7 @@ ZEL_PUBLIC Status zeliYCbCrToRGB_8u_P3C4R(const uint8_t* const srcPlanes[3], int
                                           ImageSize size, uint8_t alpha) {
   if (!srcPlanes || !dst) return StatusNullPointerError;
   if (badSize(size)) return StatusSizeError;
-  if (anyNull(srcPlanes)) return StatusNullPointerError;
+  if (anyPlaneNull(srcPlanes)) return StatusNullPointerError;
   planesToPacked(srcPlanes, srcStep, &out4<false>, dst, dstStep, alpha, size, size.width & ~7,
                  LaneSubtractedForm{lanes601b}, WideRgbForm{wide601b, 32768});
   return StatusOk;

@@ -22,13 +22,6 @@ struct PlaneRows {
   }
 };
 
-template <typename T>
-inline bool anyNull(T* const* planes, int count) {
-  for (int k = 0; k < count; ++k)
-    if (!planes[k]) return true;
-  return false;
-}
-
 // Interleaved source and destination: the pointers, the size, then a plain
 // walk; `row(src, dst, width, avx2)` converts one row.
 template <typename Row>

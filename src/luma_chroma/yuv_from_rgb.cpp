@@ -112,6 +112,7 @@ void rgbToYuvAC4P4Row(const uint8_t* src, uint8_t* const dst[4], int width, bool
 }  // namespace zel::lc
 
 using namespace zel::lc;
+using zel::anyPlaneNull;
 
 ZEL_PUBLIC Status zeliRGBToYUV_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
   return walkInterleaved(src, srcStep, dst, dstStep, size, rgbToYuvC3Row);
@@ -125,7 +126,7 @@ ZEL_PUBLIC Status zeliRGBToYUV_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t
                                         ImageSize size) {
   if (!src || !dstPlanes) return StatusNullPointerError;
   if (sizeBelowOne(size)) return StatusSizeError;
-  if (anyNull(dstPlanes, 3)) return StatusNullPointerError;
+  if (anyPlaneNull(dstPlanes, 3)) return StatusNullPointerError;
   const bool avx2 = zel::hasAvx2();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<uint8_t, 3> d(dstPlanes, dstStep, y);
@@ -139,7 +140,7 @@ ZEL_PUBLIC Status zeliRGBToYUV_8u_AC4P4R(const uint8_t* src, int srcStep, uint8_
                                          ImageSize size) {
   if (!src || !dstPlanes) return StatusNullPointerError;
   if (sizeBelowOne(size)) return StatusSizeError;
-  if (anyNull(dstPlanes, 3)) return StatusNullPointerError;
+  if (anyPlaneNull(dstPlanes, 3)) return StatusNullPointerError;
   const bool avx2 = zel::hasAvx2();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<uint8_t, 4> d(dstPlanes, dstStep, y);
@@ -152,8 +153,8 @@ ZEL_PUBLIC Status zeliRGBToYUV_8u_P3R(const uint8_t* const srcPlanes[3], int src
                                       int dstStep, ImageSize size) {
   if (!srcPlanes || !dstPlanes) return StatusNullPointerError;
   if (sizeBelowOne(size)) return StatusSizeError;
-  if (anyNull(srcPlanes, 3)) return StatusNullPointerError;
-  if (anyNull(dstPlanes, 3)) return StatusNullPointerError;
+  if (anyPlaneNull(srcPlanes, 3)) return StatusNullPointerError;
+  if (anyPlaneNull(dstPlanes, 3)) return StatusNullPointerError;
   const bool avx2 = zel::hasAvx2();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<const uint8_t, 3> s(srcPlanes, srcStep, y);

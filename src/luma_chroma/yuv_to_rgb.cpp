@@ -83,6 +83,7 @@ void yuvToRgbP3Row(const uint8_t* const src[3], uint8_t* const dst[3], int width
 }  // namespace zel::lc
 
 using namespace zel::lc;
+using zel::anyPlaneNull;
 
 ZEL_PUBLIC Status zeliYUVToRGB_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
   return walkInterleaved(src, srcStep, dst, dstStep, size, yuvToRgbC3Row);
@@ -103,7 +104,7 @@ ZEL_PUBLIC Status zeliYUVToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], int s
                                         ImageSize size) {
   if (!srcPlanes || !dst) return StatusNullPointerError;
   if (sizeBelowOne(size)) return StatusSizeError;
-  if (anyNull(srcPlanes, 3)) return StatusNullPointerError;
+  if (anyPlaneNull(srcPlanes, 3)) return StatusNullPointerError;
   const bool avx2 = zel::hasAvx2();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<const uint8_t, 3> s(srcPlanes, srcStep, y);
@@ -117,8 +118,8 @@ ZEL_PUBLIC Status zeliYUVToRGB_8u_P3R(const uint8_t* const srcPlanes[3], int src
                                       int dstStep, ImageSize size) {
   if (!srcPlanes || !dstPlanes) return StatusNullPointerError;
   if (sizeBelowOne(size)) return StatusSizeError;
-  if (anyNull(dstPlanes, 3)) return StatusNullPointerError;
-  if (anyNull(srcPlanes, 3)) return StatusNullPointerError;
+  if (anyPlaneNull(dstPlanes, 3)) return StatusNullPointerError;
+  if (anyPlaneNull(srcPlanes, 3)) return StatusNullPointerError;
   const bool avx2 = zel::hasAvx2();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<const uint8_t, 3> s(srcPlanes, srcStep, y);

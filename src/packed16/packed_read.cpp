@@ -17,8 +17,6 @@ namespace zel::unpack {
 
 namespace {
 
-inline bool anyPlaneNull(uint8_t* const dst[3]) { return !dst[0] || !dst[1] || !dst[2]; }
-
 // Null source, then the plane array and its entries, then the minima.
 inline Status checkPlanes(const uint16_t* src, uint8_t* const dst[3], ImageSize size, int minWidth, int minHeight) {
   if (!src || !dst || anyPlaneNull(dst)) return StatusNullPointerError;

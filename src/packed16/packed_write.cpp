@@ -6,6 +6,7 @@
 #include "packed16/packed_write_members.h"
 
 using namespace zel::pack;
+using zel::anyPlaneNull;
 
 ZEL_PACKED_SIX(ZEL_PACKED_PLANES, zeliYCbCrTo, _8u16u_P3C3R, Full, false)
 ZEL_PACKED_SIX(ZEL_PACKED_PIXELS, zeliYCbCrTo, _8u16u_C3R, false)
@@ -21,7 +22,7 @@ namespace {
 // they fall on).
 Status ycbcr411Member(const uint8_t* const srcPlanes[3], const int srcSteps[3], uint16_t* dst, int dstStep,
                       ImageSize size, PackedTarget target) {
-  if (!srcPlanes || anyNull(srcPlanes) || !dst) return StatusNullPointerError;
+  if (!srcPlanes || anyPlaneNull(srcPlanes) || !dst) return StatusNullPointerError;
   if (size.width < 4 || size.height < 1) return StatusSizeError;
   ycbcr411ToWords(srcPlanes, srcSteps, wordRows(dst, dstStep), size, target, zel::hasAvx2());
   return (size.width & 3) ? StatusOddSizeWarning : StatusOk;

@@ -5,6 +5,7 @@
 #include <cstdint>
 
 #include "frame/export.h"
+#include "frame/image_layout.h"
 #include "frame/simd.h"
 #include "packed16/packed_write_rows.h"
 #include "zelcc/zelcc.h"
@@ -12,7 +13,6 @@
 namespace zel::pack {
 
 inline bool badSize(ImageSize size) { return size.width < 1 || size.height < 1; }
-inline bool anyNull(const uint8_t* const planes[3]) { return !planes[0] || !planes[1] || !planes[2]; }
 inline WordRows wordRows(uint16_t* dst, int dstStep) { return {dst, dstStep >> 1}; }
 
 // Planes to words: the array and the destination, the size, then the plane
@@ -21,7 +21,7 @@ inline Status planesMember(PlaneChroma chroma, const uint8_t* const srcPlanes[3]
                            uint16_t* dst, int dstStep, ImageSize size, PackedTarget target, bool dither) {
   if (!srcPlanes || !dst) return StatusNullPointerError;
   if (badSize(size)) return StatusSizeError;
-  if (anyNull(srcPlanes)) return StatusNullPointerError;
+  if (anyPlaneNull(srcPlanes)) return StatusNullPointerError;
   ycbcrPlanesToWords(chroma, srcPlanes, srcSteps, wordRows(dst, dstStep), size, target, dither, hasAvx2());
   return StatusOk;
 }
@@ -30,7 +30,7 @@ inline Status yuv420Member(const uint8_t* const srcPlanes[3], const int srcSteps
                            ImageSize size, PackedTarget target, bool dither) {
   if (!srcPlanes || !dst) return StatusNullPointerError;
   if (badSize(size)) return StatusSizeError;
-  if (anyNull(srcPlanes)) return StatusNullPointerError;
+  if (anyPlaneNull(srcPlanes)) return StatusNullPointerError;
   yuv420ToWords(srcPlanes, srcSteps, wordRows(dst, dstStep), size, target, dither, hasAvx2());
   return StatusOk;
 }

@@ -10,10 +10,6 @@ namespace zel::ycocg {
 namespace {
 
 bool anyNull(const void* image, const void* planes) { return !image || !planes; }
-template <typename P>
-bool anyPlaneNull(P* const* planes) {
-  return !planes[0] || !planes[1] || !planes[2];
-}
 bool badSize(ImageSize size) { return size.width < 1 || size.height < 1; }
 
 // Rows of 32-bit planes go through the vector body with non-temporal
