@@ -1,6 +1,7 @@
 // Thin wrappers over the vector instructions: SSE4.1 is the baseline of the
 // build, AVX2 bodies are compiled per function with ZEL_AVX2 and chosen at
-// run time when the processor has them. Both give the same bits.
+// run time when the processor has them. A few compute-bound kernels have a
+// third, 512-bit tier (ZEL_AVX512). Every tier gives the same bits.
 #pragma once
 
 #include <immintrin.h>
@@ -8,6 +9,10 @@
 #include <cstdint>
 
 #define ZEL_AVX2 __attribute__((target("avx2")))
+// The 512-bit tier: foundation, byte and word, 128/256-bit forms, and double
+// and quad words. The byte permutes come with ZEL_AVX512_VBMI.
+#define ZEL_AVX512 __attribute__((target("avx2,avx512f,avx512bw,avx512vl,avx512dq")))
+#define ZEL_AVX512_VBMI __attribute__((target("avx2,avx512f,avx512bw,avx512vl,avx512dq,avx512vbmi")))
 
 // Generic helpers that take or return vector values of a unit type chosen by
 // template parameter: always inlined, so that a 256-bit value never crosses a
@@ -19,7 +24,20 @@
 
 namespace zel {
 
-inline bool hasAvx2() { return __builtin_cpu_supports("avx2"); }
+// The widest tier the kernels may take: what the processor has, lowered by
+// setVectorTierCap (tests run every tier on one machine, and benchmarks
+// compare them).
+enum class VectorTier { Sse41 = 0, Avx2 = 1, Avx512 = 2 };
+void setVectorTierCap(VectorTier cap);
+VectorTier vectorTierCap();
+
+inline bool hasAvx2() { return vectorTierCap() >= VectorTier::Avx2 && __builtin_cpu_supports("avx2"); }
+inline bool hasAvx512() {
+  return vectorTierCap() >= VectorTier::Avx512 && __builtin_cpu_supports("avx512f") &&
+         __builtin_cpu_supports("avx512bw") && __builtin_cpu_supports("avx512vl") &&
+         __builtin_cpu_supports("avx512dq");
+}
+inline bool hasAvx512Vbmi() { return hasAvx512() && __builtin_cpu_supports("avx512vbmi"); }
 
 inline __m128i load128(const void* p) { return _mm_loadu_si128(static_cast<const __m128i*>(p)); }
 inline __m128i load64(const void* p) { return _mm_loadl_epi64(static_cast<const __m128i*>(p)); }
