@@ -83,7 +83,8 @@ int zelGetMaxCacheSizeB(int* size) {
     *size = gCacheSize.load();
     return 0;
   }
-  long best = largestCache();
+  // The hardware does not change while the process runs: read it once.
+  static const long best = largestCache();
   if (best <= 0) return 1;
   *size = best > 0x7fffffffL ? 0x7fffffff : int(best);
   return 0;

@@ -1,4 +1,5 @@
 #include "frame/fill_bytes.h"
+#include "frame/stream_stores.h"
 
 #include "core/zelcore.h"
 #include "frame/image_layout.h"
@@ -38,6 +39,13 @@ void fillRow(uint8_t* p, int64_t length, __m128i v, uint8_t value, bool nonTempo
 }
 
 }  // namespace
+
+bool streamsBeyondCache(int64_t bytesTouched) {
+  if (bytesTouched <= 1048576) return false;
+  int cacheSize = 0;
+  if (zelGetMaxCacheSizeB(&cacheSize) != 0) return false;
+  return bytesTouched > cacheSize;
+}
 
 bool fillBytesNonTemporal(int64_t total) {
   if (total <= 1048576) return false;
