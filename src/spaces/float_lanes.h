@@ -18,9 +18,11 @@
 #include <type_traits>
 
 #include "frame/simd.h"
+#include "spaces/row_stores.h"
 
 #define ZEL_LANE inline __attribute__((always_inline))
 #define ZEL_LANE_AVX2 ZEL_AVX2 inline __attribute__((always_inline))
+#define ZEL_LANE_AVX512 ZEL_AVX512 inline __attribute__((always_inline))
 
 namespace zel::lanes {
 
@@ -33,6 +35,7 @@ struct I4 {
 
 struct F4 {
   using Int = I4;
+  using Mask = F4;  // comparisons give all-ones lanes
   static constexpr int kLanes = 4;
   __m128 v;
   static ZEL_LANE F4 splat(float x) { return {_mm_set1_ps(x)}; }
@@ -236,6 +239,20 @@ ZEL_LANE void storePixels(float* p, F4 c0, F4 c1, F4 c2) {
   storeRaw<Stride, false>(p, asInt(c0), asInt(c1), asInt(c2));
 }
 
+// Float pixels as `how` says (see row_stores.h); only three-sample pixels
+// are ever streamed or cut to a head.
+template <int Stride>
+ZEL_LANE void putPixels(const spaces::RowStores& how, float* p, F4 c0, F4 c1, F4 c2) {
+  if (Stride != 3 || how.kind == spaces::RowStores::Plain) return storePixels<Stride>(p, c0, c1, c2);
+  alignas(16) float v[12];
+  storePixels<3>(v, c0, c1, c2);
+  if (how.kind == spaces::RowStores::Head) {
+    std::memcpy(p, v, sizeof(float) * 3 * size_t(how.keep));
+    return;
+  }
+  for (int k = 0; k < 3; ++k) _mm_stream_ps(p + 4 * k, _mm_load_ps(v + 4 * k));
+}
+
 // ---------------------------------------------------------------- 8 lanes
 
 struct I8 {
@@ -245,6 +262,7 @@ struct I8 {
 
 struct F8 {
   using Int = I8;
+  using Mask = F8;
   static constexpr int kLanes = 8;
   __m256 v;
   static ZEL_LANE_AVX2 F8 splat(float x) { return {_mm256_set1_ps(x)}; }
@@ -412,6 +430,33 @@ ZEL_LANE_AVX2 void storePixels(float* p, F8 c0, F8 c1, F8 c2) {
   else storeRaw<Stride, false>(p, asInt(c0), asInt(c1), asInt(c2));
 }
 
+// The three vectors of storeFloat3 streamed (p aligned to 32), or the
+// samples of the first `keep` pixels alone.
+ZEL_LANE_AVX2 void interleaveFloat3(F8 c0, F8 c1, F8 c2, __m256* out) {
+  const __m256 a = _mm256_permutevar8x32_ps(c0.v, _mm256_setr_epi32(0, 3, 6, 1, 4, 7, 2, 5));
+  const __m256 b = _mm256_permutevar8x32_ps(c1.v, _mm256_setr_epi32(5, 0, 3, 6, 1, 4, 7, 2));
+  const __m256 c = _mm256_permutevar8x32_ps(c2.v, _mm256_setr_epi32(2, 5, 0, 3, 6, 1, 4, 7));
+  out[0] = _mm256_blend_ps(_mm256_blend_ps(a, b, 0x92), c, 0x24);
+  out[1] = _mm256_blend_ps(_mm256_blend_ps(c, a, 0x92), b, 0x24);
+  out[2] = _mm256_blend_ps(_mm256_blend_ps(b, c, 0x92), a, 0x24);
+}
+
+template <int Stride>
+ZEL_LANE_AVX2 void putPixels(const spaces::RowStores& how, float* p, F8 c0, F8 c1, F8 c2) {
+  if (Stride != 3 || how.kind == spaces::RowStores::Plain) return storePixels<Stride>(p, c0, c1, c2);
+  __m256 v[3];
+  interleaveFloat3(c0, c1, c2, v);
+  if (how.kind == spaces::RowStores::Stream) {
+    for (int k = 0; k < 3; ++k) _mm256_stream_ps(p + 8 * k, v[k]);
+    return;
+  }
+  const __m256i lane = _mm256_setr_epi32(0, 1, 2, 3, 4, 5, 6, 7);
+  for (int k = 0; k < 3; ++k) {
+    const __m256i mask = _mm256_cmpgt_epi32(_mm256_set1_epi32(3 * how.keep - 8 * k), lane);
+    _mm256_maskstore_ps(p + 8 * k, mask, v[k]);
+  }
+}
+
 // Integer lanes stored as bytes saturated to 0..255 (SaturateS16 then
 // SaturateU8, which together clamp any int32 to 0..255). Eight pixels of
 // three bytes pack with saturation and take one shuffle; other shapes clamp
@@ -445,6 +490,264 @@ ZEL_LANE_AVX2 void storeClampedBytes(uint8_t* p, I8 c0, I8 c1, I8 c2) {
     _mm_storel_epi64(reinterpret_cast<__m128i*>(p + 16), _mm_srli_si128(hi, 4));
   } else {
     storeRaw<Stride, false>(p, clampToByte(c0), clampToByte(c1), clampToByte(c2));
+  }
+}
+
+// ---------------------------------------------------------------- 16 lanes
+//
+// The 512-bit tier. Comparisons give a mask register (M16) rather than
+// all-ones lanes; select and the masked forms read it. ApproxRcp stays
+// RCPPS: the sixteen lanes take two 256-bit reciprocals, lane by lane the
+// same bits as every other width.
+
+struct I16 {
+  __m512i v;
+  static ZEL_LANE_AVX512 I16 splat(int32_t x) { return {_mm512_set1_epi32(x)}; }
+};
+
+struct M16 {
+  __mmask16 k;
+};
+
+struct F16 {
+  using Int = I16;
+  using Mask = M16;
+  static constexpr int kLanes = 16;
+  __m512 v;
+  static ZEL_LANE_AVX512 F16 splat(float x) { return {_mm512_set1_ps(x)}; }
+};
+
+ZEL_LANE_AVX512 F16 operator+(F16 a, F16 b) { return {_mm512_add_ps(a.v, b.v)}; }
+ZEL_LANE_AVX512 F16 operator-(F16 a, F16 b) { return {_mm512_sub_ps(a.v, b.v)}; }
+ZEL_LANE_AVX512 F16 operator*(F16 a, F16 b) { return {_mm512_mul_ps(a.v, b.v)}; }
+ZEL_LANE_AVX512 F16 operator/(F16 a, F16 b) { return {_mm512_div_ps(a.v, b.v)}; }
+// VMINPS / VMAXPS keep the legacy rule: the second operand when the
+// comparison fails. (Written with a full mask: the plain forms start from
+// an undefined vector, which the compiler warns about.)
+ZEL_LANE_AVX512 F16 vmin(F16 a, F16 b) { return {_mm512_maskz_min_ps(0xFFFF, a.v, b.v)}; }
+ZEL_LANE_AVX512 F16 vmax(F16 a, F16 b) { return {_mm512_maskz_max_ps(0xFFFF, a.v, b.v)}; }
+ZEL_LANE_AVX512 F16 approxRcp(F16 a) {
+  const __m256 lo = _mm256_rcp_ps(_mm512_castps512_ps256(a.v));
+  const __m256 hi = _mm256_rcp_ps(_mm512_extractf32x8_ps(a.v, 1));
+  return {_mm512_insertf32x8(_mm512_castps256_ps512(lo), hi, 1)};
+}
+ZEL_LANE_AVX512 F16 refinedRcp(F16 x) {
+  const F16 r = approxRcp(x);
+  return (r + r) - ((x * r) * r);
+}
+ZEL_LANE_AVX512 F16 vabs(F16 a) { return {_mm512_abs_ps(a.v)}; }
+ZEL_LANE_AVX512 M16 eq(F16 a, F16 b) { return {_mm512_cmp_ps_mask(a.v, b.v, _CMP_EQ_OQ)}; }
+ZEL_LANE_AVX512 M16 lt(F16 a, F16 b) { return {_mm512_cmp_ps_mask(a.v, b.v, _CMP_LT_OS)}; }
+ZEL_LANE_AVX512 M16 le(F16 a, F16 b) { return {_mm512_cmp_ps_mask(a.v, b.v, _CMP_LE_OS)}; }
+ZEL_LANE_AVX512 M16 gt(F16 a, F16 b) { return {_mm512_cmp_ps_mask(a.v, b.v, _CMP_GT_OS)}; }
+ZEL_LANE_AVX512 M16 ge(F16 a, F16 b) { return {_mm512_cmp_ps_mask(a.v, b.v, _CMP_GE_OS)}; }
+ZEL_LANE_AVX512 M16 maskOr(M16 a, M16 b) { return {__mmask16(a.k | b.k)}; }
+ZEL_LANE_AVX512 M16 maskAnd(M16 a, M16 b) { return {__mmask16(a.k & b.k)}; }
+// The value where the mask is set, zero elsewhere (as maskAnd of an
+// all-ones mask and a value).
+ZEL_LANE_AVX512 F16 maskAnd(M16 m, F16 a) { return {_mm512_maskz_mov_ps(m.k, a.v)}; }
+ZEL_LANE_AVX512 F16 select(M16 m, F16 a, F16 b) { return {_mm512_mask_blend_ps(m.k, b.v, a.v)}; }
+ZEL_LANE_AVX512 F16 clearWhere(M16 m, F16 a) { return {_mm512_maskz_mov_ps(__mmask16(~m.k), a.v)}; }
+ZEL_LANE_AVX512 M16 clearWhere(M16 m, M16 a) { return {__mmask16(a.k & ~m.k)}; }
+ZEL_LANE_AVX512 I16 roundEven(F16 a) { return {_mm512_cvtps_epi32(a.v)}; }
+ZEL_LANE_AVX512 I16 truncate(F16 a) { return {_mm512_cvttps_epi32(a.v)}; }
+ZEL_LANE_AVX512 F16 toFloat(I16 a) { return {_mm512_cvtepi32_ps(a.v)}; }
+ZEL_LANE_AVX512 F16 asFloat(I16 a) { return {_mm512_castsi512_ps(a.v)}; }
+ZEL_LANE_AVX512 I16 asInt(F16 a) { return {_mm512_castps_si512(a.v)}; }
+
+ZEL_LANE_AVX512 I16 operator+(I16 a, I16 b) { return {_mm512_add_epi32(a.v, b.v)}; }
+ZEL_LANE_AVX512 I16 operator-(I16 a, I16 b) { return {_mm512_sub_epi32(a.v, b.v)}; }
+ZEL_LANE_AVX512 I16 operator|(I16 a, I16 b) { return {_mm512_or_si512(a.v, b.v)}; }
+ZEL_LANE_AVX512 I16 operator&(I16 a, I16 b) { return {_mm512_and_si512(a.v, b.v)}; }
+ZEL_LANE_AVX512 I16 operator^(I16 a, I16 b) { return {_mm512_xor_si512(a.v, b.v)}; }
+template <int N>
+ZEL_LANE_AVX512 I16 shiftRightArith(I16 a) {
+  return {_mm512_srai_epi32(a.v, N)};
+}
+template <int N>
+ZEL_LANE_AVX512 I16 shiftLeft(I16 a) {
+  return {_mm512_slli_epi32(a.v, N)};
+}
+ZEL_LANE_AVX512 I16 imin(I16 a, I16 b) { return {_mm512_min_epi32(a.v, b.v)}; }
+ZEL_LANE_AVX512 I16 imax(I16 a, I16 b) { return {_mm512_max_epi32(a.v, b.v)}; }
+ZEL_LANE_AVX512 M16 ieq(I16 a, I16 b) { return {_mm512_cmpeq_epi32_mask(a.v, b.v)}; }
+ZEL_LANE_AVX512 I16 iselect(M16 m, I16 a, I16 b) { return {_mm512_mask_blend_epi32(m.k, b.v, a.v)}; }
+ZEL_LANE_AVX512 I16 multiplyAddPairs(I16 a, I16 b) { return {_mm512_madd_epi16(a.v, b.v)}; }
+ZEL_LANE_AVX512 I16 clampToByte(I16 x) { return imax(imin(x, I16::splat(255)), I16::splat(0)); }
+ZEL_LANE_AVX512 I16 clampToWord(I16 x) { return imax(imin(x, I16::splat(65535)), I16::splat(0)); }
+
+// Sixteen (c, w) pairs, each one 64-bit read, as the narrower forms.
+ZEL_LANE_AVX512 void gatherPairs(const float (*table)[2], I16 index, F16& c, F16& w) {
+  alignas(64) int32_t at[16];
+  _mm512_store_si512(at, index.v);
+  auto pair = [&](int k) { return _mm_castpd_ps(_mm_load_sd(reinterpret_cast<const double*>(table[at[k]]))); };
+  auto high = [&](__m128 lo, int k) { return _mm_loadh_pi(lo, reinterpret_cast<const __m64*>(table[at[k]])); };
+  // Quarters [c0 w0 c1 w1 | c4 w4 c5 w5 | c8 .. | c12 ..] and the same
+  // from pixels 2, 3, 6, 7, ...
+  __m512 a = _mm512_castps128_ps512(high(pair(0), 1)), b = _mm512_castps128_ps512(high(pair(2), 3));
+  a = _mm512_insertf32x4(a, high(pair(4), 5), 1), b = _mm512_insertf32x4(b, high(pair(6), 7), 1);
+  a = _mm512_insertf32x4(a, high(pair(8), 9), 2), b = _mm512_insertf32x4(b, high(pair(10), 11), 2);
+  a = _mm512_insertf32x4(a, high(pair(12), 13), 3), b = _mm512_insertf32x4(b, high(pair(14), 15), 3);
+  c.v = _mm512_shuffle_ps(a, b, _MM_SHUFFLE(2, 0, 2, 0));
+  w.v = _mm512_shuffle_ps(a, b, _MM_SHUFFLE(3, 1, 3, 1));
+}
+
+// Lane indices of the three-sample shuffles: 48 samples in three vectors,
+// sample 3k + c the channel c of pixel k.
+struct Float3Order {
+  // Channel c from (v0, v1) into pixels whose sample lies there, then the
+  // rest from v2.
+  int32_t first[3][16], second[3][16];
+  // Output vector o from (c0, c1) where its sample is of channel 0 or 1,
+  // then channel 2 from c2.
+  int32_t mergeFirst[3][16], mergeSecond[3][16];
+  static constexpr Float3Order make() {
+    Float3Order m{};
+    for (int c = 0; c < 3; ++c)
+      for (int k = 0; k < 16; ++k) {
+        const int at = 3 * k + c;
+        m.first[c][k] = at < 32 ? at : 0;
+        m.second[c][k] = at < 32 ? k : 16 + at - 32;
+      }
+    for (int o = 0; o < 3; ++o)
+      for (int i = 0; i < 16; ++i) {
+        const int at = 16 * o + i, k = at / 3, c = at % 3;
+        m.mergeFirst[o][i] = c == 0 ? k : (c == 1 ? 16 + k : 0);
+        m.mergeSecond[o][i] = c == 2 ? 16 + k : i;
+      }
+    return m;
+  }
+};
+inline constexpr Float3Order kFloat3Order = Float3Order::make();
+
+ZEL_LANE_AVX512 __m512i indexVector(const int32_t* at) { return _mm512_loadu_si512(at); }
+
+// Sixteen float pixels of three samples: three whole vectors, each channel
+// collected by two two-source permutes.
+ZEL_LANE_AVX512 void loadFloat3(const float* p, F16& c0, F16& c1, F16& c2) {
+  const __m512 v0 = _mm512_loadu_ps(p), v1 = _mm512_loadu_ps(p + 16), v2 = _mm512_loadu_ps(p + 32);
+  F16* out[3] = {&c0, &c1, &c2};
+  for (int c = 0; c < 3; ++c) {
+    const __m512 t = _mm512_permutex2var_ps(v0, indexVector(kFloat3Order.first[c]), v1);
+    out[c]->v = _mm512_permutex2var_ps(t, indexVector(kFloat3Order.second[c]), v2);
+  }
+}
+
+ZEL_LANE_AVX512 void interleaveFloat3(F16 c0, F16 c1, F16 c2, __m512* out) {
+  for (int o = 0; o < 3; ++o) {
+    const __m512 t = _mm512_permutex2var_ps(c0.v, indexVector(kFloat3Order.mergeFirst[o]), c1.v);
+    out[o] = _mm512_permutex2var_ps(t, indexVector(kFloat3Order.mergeSecond[o]), c2.v);
+  }
+}
+
+ZEL_LANE_AVX512 void storeFloat3(float* p, F16 c0, F16 c1, F16 c2) {
+  __m512 v[3];
+  interleaveFloat3(c0, c1, c2, v);
+  for (int k = 0; k < 3; ++k) _mm512_storeu_ps(p + 16 * k, v[k]);
+}
+
+// Sixteen byte pixels of three samples (48 bytes, read exactly): each
+// 128-bit lane takes the 12 bytes of four pixels, then one byte shuffle a
+// channel as in the 8-lane form.
+ZEL_LANE_AVX512 __m512i bytes3ToLanes(const uint8_t* p) {
+  const __m512i raw = _mm512_maskz_loadu_epi32(0x0FFF, p);
+  return _mm512_permutexvar_epi32(_mm512_setr_epi32(0, 1, 2, 0, 3, 4, 5, 0, 6, 7, 8, 0, 9, 10, 11, 0), raw);
+}
+ZEL_LANE_AVX512 void loadBytes3(const uint8_t* p, I16& c0, I16& c1, I16& c2) {
+  const __m512i v = bytes3ToLanes(p);
+  c0.v = _mm512_shuffle_epi8(v, _mm512_broadcast_i32x4(_mm_setr_epi8(0, -1, -1, -1, 3, -1, -1, -1, 6, -1, -1, -1, 9, -1, -1, -1)));
+  c1.v = _mm512_shuffle_epi8(v, _mm512_broadcast_i32x4(_mm_setr_epi8(1, -1, -1, -1, 4, -1, -1, -1, 7, -1, -1, -1, 10, -1, -1, -1)));
+  c2.v = _mm512_shuffle_epi8(v, _mm512_broadcast_i32x4(_mm_setr_epi8(2, -1, -1, -1, 5, -1, -1, -1, 8, -1, -1, -1, 11, -1, -1, -1)));
+}
+// Twelve bytes at the start of each 128-bit lane back to 48 bytes, written
+// exactly.
+ZEL_LANE_AVX512 void storeLanesAsBytes3(uint8_t* p, __m512i v) {
+  const __m512i packed =
+      _mm512_permutexvar_epi32(_mm512_setr_epi32(0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, 0, 0, 0, 0), v);
+  _mm512_mask_storeu_epi32(p, 0x0FFF, packed);
+}
+// The low byte of each lane to its place.
+ZEL_LANE_AVX512 void storeBytes3(uint8_t* p, I16 c0, I16 c1, I16 c2) {
+  const __m512i v = _mm512_or_si512(
+      _mm512_or_si512(
+          _mm512_shuffle_epi8(c0.v, _mm512_broadcast_i32x4(_mm_setr_epi8(0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1, -1, -1))),
+          _mm512_shuffle_epi8(c1.v, _mm512_broadcast_i32x4(_mm_setr_epi8(-1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1, -1)))),
+      _mm512_shuffle_epi8(c2.v, _mm512_broadcast_i32x4(_mm_setr_epi8(-1, -1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1))));
+  storeLanesAsBytes3(p, v);
+}
+
+// Four-byte pixels: the first three bytes of each as lanes; back, the
+// three bytes alone are written and the fourth is not touched.
+ZEL_LANE_AVX512 void loadBytes4(const uint8_t* p, I16& c0, I16& c1, I16& c2) {
+  const __m512i v = _mm512_loadu_si512(p), low = _mm512_set1_epi32(0xFF);
+  c0.v = _mm512_and_si512(v, low);
+  c1.v = _mm512_and_si512(_mm512_srli_epi32(v, 8), low);
+  c2.v = _mm512_and_si512(_mm512_srli_epi32(v, 16), low);
+}
+ZEL_LANE_AVX512 void storeBytes4(uint8_t* p, I16 c0, I16 c1, I16 c2) {
+  const __m512i low = _mm512_set1_epi32(0xFF);
+  const __m512i v = _mm512_or_si512(_mm512_or_si512(_mm512_and_si512(c0.v, low), _mm512_slli_epi32(_mm512_and_si512(c1.v, low), 8)),
+                                    _mm512_slli_epi32(c2.v, 16));
+  _mm512_mask_storeu_epi8(p, 0x7777777777777777ull, v);
+}
+
+template <int Stride, bool Bias16, typename T>
+ZEL_LANE_AVX512 void loadRaw(const T* p, I16& c0, I16& c1, I16& c2) {
+  static_assert(sizeof(T) == 1 && !Bias16, "the 16-lane forms read bytes");
+  if constexpr (Stride == 3) loadBytes3(p, c0, c1, c2);
+  else loadBytes4(p, c0, c1, c2);
+}
+
+template <int Stride, bool Bias16, typename T>
+ZEL_LANE_AVX512 void loadPixels(const T* p, F16& c0, F16& c1, F16& c2) {
+  if constexpr (std::is_same_v<T, float>) {
+    static_assert(Stride == 3, "the 16-lane forms read three-float pixels");
+    loadFloat3(p, c0, c1, c2);
+  } else {
+    I16 r0, r1, r2;
+    loadRaw<Stride, Bias16>(p, r0, r1, r2);
+    c0 = toFloat(r0), c1 = toFloat(r1), c2 = toFloat(r2);
+  }
+}
+
+template <int Stride, bool Bias16, typename T>
+ZEL_LANE_AVX512 void storeRaw(T* p, I16 c0, I16 c1, I16 c2) {
+  static_assert(sizeof(T) == 1 && !Bias16, "the 16-lane forms write bytes");
+  if constexpr (Stride == 3) storeBytes3(p, c0, c1, c2);
+  else storeBytes4(p, c0, c1, c2);
+}
+
+template <int Stride>
+ZEL_LANE_AVX512 void storeClampedBytes(uint8_t* p, I16 c0, I16 c1, I16 c2) {
+  if constexpr (Stride == 3) {
+    // Per 128-bit lane: c0 of four pixels, c1, c2, c2 again, as saturated
+    // bytes, then put in pixel order.
+    const __m512i bytes = _mm512_packus_epi16(_mm512_packs_epi32(c0.v, c1.v), _mm512_packs_epi32(c2.v, c2.v));
+    storeLanesAsBytes3(p, _mm512_shuffle_epi8(bytes, _mm512_broadcast_i32x4(_mm_setr_epi8(0, 4, 8, 1, 5, 9, 2, 6, 10, 3, 7, 11, -1, -1, -1, -1))));
+  } else {
+    storeBytes4(p, clampToByte(c0), clampToByte(c1), clampToByte(c2));
+  }
+}
+
+template <int Stride>
+ZEL_LANE_AVX512 void storePixels(float* p, F16 c0, F16 c1, F16 c2) {
+  static_assert(Stride == 3, "the 16-lane forms write three-float pixels");
+  storeFloat3(p, c0, c1, c2);
+}
+
+template <int Stride>
+ZEL_LANE_AVX512 void putPixels(const spaces::RowStores& how, float* p, F16 c0, F16 c1, F16 c2) {
+  static_assert(Stride == 3, "the 16-lane forms write three-float pixels");
+  __m512 v[3];
+  interleaveFloat3(c0, c1, c2, v);
+  if (how.kind == spaces::RowStores::Plain) {
+    for (int k = 0; k < 3; ++k) _mm512_storeu_ps(p + 16 * k, v[k]);
+  } else if (how.kind == spaces::RowStores::Stream) {
+    for (int k = 0; k < 3; ++k) _mm512_stream_ps(p + 16 * k, v[k]);
+  } else {
+    const uint64_t samples = uint64_t(3 * how.keep);  // below 48
+    const uint64_t bits = (uint64_t(1) << samples) - 1;
+    for (int k = 0; k < 3; ++k) _mm512_mask_storeu_ps(p + 16 * k, __mmask16(bits >> (16 * k)), v[k]);
   }
 }
 

@@ -11,22 +11,22 @@ namespace zel::spaces::hsv {
 #include "spaces/both_widths.inc"
 
 template <int Stride>
-int rgbToHsvBlocks8u(Lanes lanes, const uint8_t* src, uint8_t* dst, int n) {
-  return lanes == Lanes::Avx2 ? avx2::rgbToHsvBlocks8u<lanes::F8, Stride>(src, dst, n)
+int rgbToHsvBlocks8u(Lanes lanes, const uint8_t* src, uint8_t* dst, int n, RowStores) {
+  return lanes != Lanes::Sse4 ? avx2::rgbToHsvBlocks8u<lanes::F8, Stride>(src, dst, n)
                               : sse::rgbToHsvBlocks8u<lanes::F4, Stride>(src, dst, n);
 }
 template <int Stride, typename T>
-int hsvToRgbBlocks(Lanes lanes, const T* src, T* dst, int n) {
-  return lanes == Lanes::Avx2 ? avx2::hsvToRgbBlocks<lanes::F8, Stride>(src, dst, n)
+int hsvToRgbBlocks(Lanes lanes, const T* src, T* dst, int n, RowStores) {
+  return lanes != Lanes::Sse4 ? avx2::hsvToRgbBlocks<lanes::F8, Stride>(src, dst, n)
                               : sse::hsvToRgbBlocks<lanes::F4, Stride>(src, dst, n);
 }
 
-template int rgbToHsvBlocks8u<3>(Lanes, const uint8_t*, uint8_t*, int);
-template int rgbToHsvBlocks8u<4>(Lanes, const uint8_t*, uint8_t*, int);
-template int hsvToRgbBlocks<3, uint8_t>(Lanes, const uint8_t*, uint8_t*, int);
-template int hsvToRgbBlocks<4, uint8_t>(Lanes, const uint8_t*, uint8_t*, int);
-template int hsvToRgbBlocks<3, uint16_t>(Lanes, const uint16_t*, uint16_t*, int);
-template int hsvToRgbBlocks<4, uint16_t>(Lanes, const uint16_t*, uint16_t*, int);
+template int rgbToHsvBlocks8u<3>(Lanes, const uint8_t*, uint8_t*, int, RowStores);
+template int rgbToHsvBlocks8u<4>(Lanes, const uint8_t*, uint8_t*, int, RowStores);
+template int hsvToRgbBlocks<3, uint8_t>(Lanes, const uint8_t*, uint8_t*, int, RowStores);
+template int hsvToRgbBlocks<4, uint8_t>(Lanes, const uint8_t*, uint8_t*, int, RowStores);
+template int hsvToRgbBlocks<3, uint16_t>(Lanes, const uint16_t*, uint16_t*, int, RowStores);
+template int hsvToRgbBlocks<4, uint16_t>(Lanes, const uint16_t*, uint16_t*, int, RowStores);
 
 namespace {
 
@@ -38,18 +38,18 @@ inline void levelPixel(const T* s, T* d, Formula f) {
 
 // Blocks of 4 pixels in both layouts.
 template <int Stride>
-void rgbToHsvRow8u(const uint8_t* s, uint8_t* d, int width) {
-  splitRow<Stride, Stride>(s, d, width, 4, rgbToHsvBlocks8u<Stride>,
+void rgbToHsvRow8u(const uint8_t* s, uint8_t* d, int width, const RowContext& c) {
+  splitRow<Stride, Stride>(s, d, width, 4, c, rgbToHsvBlocks8u<Stride>,
                            [](const uint8_t* p, uint8_t* q) { levelPixel(p, q, rgbToHsvTail8u); });
 }
 // No vector form.
 template <int Stride>
-void rgbToHsvRow16u(const uint16_t* s, uint16_t* d, int width) {
+void rgbToHsvRow16u(const uint16_t* s, uint16_t* d, int width, const RowContext&) {
   for (int x = 0; x < width; ++x) levelPixel(s + x * Stride, d + x * Stride, rgbToHsv16u);
 }
 template <int Stride, typename T>
-void hsvToRgbRow(const T* s, T* d, int width) {
-  splitRow<Stride, Stride>(s, d, width, 4, hsvToRgbBlocks<Stride, T>, [](const T* p, T* q) {
+void hsvToRgbRow(const T* s, T* d, int width, const RowContext& c) {
+  splitRow<Stride, Stride>(s, d, width, 4, c, hsvToRgbBlocks<Stride, T>, [](const T* p, T* q) {
     levelPixel(p, q, sizeof(T) == 1 ? hsvToRgb8u : hsvToRgb16u);
   });
 }
