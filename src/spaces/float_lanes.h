@@ -239,14 +239,26 @@ ZEL_LANE void storePixels(float* p, F4 c0, F4 c1, F4 c2) {
   storeRaw<Stride, false>(p, asInt(c0), asInt(c1), asInt(c2));
 }
 
-// Float pixels as `how` says (see row_stores.h); only three-sample pixels
-// are ever streamed or cut to a head.
+// Float pixels read and written as `how` says (see row_stores.h); only
+// three-sample pixels are ever streamed or cut to a part.
+template <int Stride, bool Bias16, typename T>
+ZEL_LANE void getPixels(const spaces::RowStores& how, const T* p, F4& c0, F4& c1, F4& c2) {
+  if constexpr (Stride == 3 && std::is_same_v<T, float>) {
+    if (how.kind == spaces::RowStores::Part) {
+      alignas(16) float v[12] = {};
+      std::memcpy(v, p, sizeof(float) * 3 * size_t(how.keep));
+      loadPixels<3, false>(v, c0, c1, c2);
+      return;
+    }
+  }
+  loadPixels<Stride, Bias16>(p, c0, c1, c2);
+}
 template <int Stride>
 ZEL_LANE void putPixels(const spaces::RowStores& how, float* p, F4 c0, F4 c1, F4 c2) {
   if (Stride != 3 || how.kind == spaces::RowStores::Plain) return storePixels<Stride>(p, c0, c1, c2);
   alignas(16) float v[12];
   storePixels<3>(v, c0, c1, c2);
-  if (how.kind == spaces::RowStores::Head) {
+  if (how.kind == spaces::RowStores::Part) {
     std::memcpy(p, v, sizeof(float) * 3 * size_t(how.keep));
     return;
   }
@@ -380,14 +392,16 @@ ZEL_LANE_AVX2 void loadRaw(const T* p, I8& c0, I8& c1, I8& c2) {
 // channel is picked from the three by two blends (its samples sit at
 // distinct places of the three) and put in pixel order by one permute.
 // Storing is the same the other way round.
-ZEL_LANE_AVX2 void loadFloat3(const float* p, F8& c0, F8& c1, F8& c2) {
-  const __m256 v0 = _mm256_loadu_ps(p), v1 = _mm256_loadu_ps(p + 8), v2 = _mm256_loadu_ps(p + 16);
+ZEL_LANE_AVX2 void deinterleaveFloat3(__m256 v0, __m256 v1, __m256 v2, F8& c0, F8& c1, F8& c2) {
   const __m256 a = _mm256_blend_ps(_mm256_blend_ps(v0, v1, 0x92), v2, 0x24);
   const __m256 b = _mm256_blend_ps(_mm256_blend_ps(v0, v1, 0x24), v2, 0x49);
   const __m256 c = _mm256_blend_ps(_mm256_blend_ps(v0, v1, 0x49), v2, 0x92);
   c0.v = _mm256_permutevar8x32_ps(a, _mm256_setr_epi32(0, 3, 6, 1, 4, 7, 2, 5));
   c1.v = _mm256_permutevar8x32_ps(b, _mm256_setr_epi32(1, 4, 7, 2, 5, 0, 3, 6));
   c2.v = _mm256_permutevar8x32_ps(c, _mm256_setr_epi32(2, 5, 0, 3, 6, 1, 4, 7));
+}
+ZEL_LANE_AVX2 void loadFloat3(const float* p, F8& c0, F8& c1, F8& c2) {
+  deinterleaveFloat3(_mm256_loadu_ps(p), _mm256_loadu_ps(p + 8), _mm256_loadu_ps(p + 16), c0, c1, c2);
 }
 
 ZEL_LANE_AVX2 void storeFloat3(float* p, F8 c0, F8 c1, F8 c2) {
@@ -431,7 +445,10 @@ ZEL_LANE_AVX2 void storePixels(float* p, F8 c0, F8 c1, F8 c2) {
 }
 
 // The three vectors of storeFloat3 streamed (p aligned to 32), or the
-// samples of the first `keep` pixels alone.
+// samples of the first `keep` pixels alone; and those read alone.
+ZEL_LANE_AVX2 __m256i firstSamples(int samples, int k) {
+  return _mm256_cmpgt_epi32(_mm256_set1_epi32(samples - 8 * k), _mm256_setr_epi32(0, 1, 2, 3, 4, 5, 6, 7));
+}
 ZEL_LANE_AVX2 void interleaveFloat3(F8 c0, F8 c1, F8 c2, __m256* out) {
   const __m256 a = _mm256_permutevar8x32_ps(c0.v, _mm256_setr_epi32(0, 3, 6, 1, 4, 7, 2, 5));
   const __m256 b = _mm256_permutevar8x32_ps(c1.v, _mm256_setr_epi32(5, 0, 3, 6, 1, 4, 7, 2));
@@ -450,11 +467,21 @@ ZEL_LANE_AVX2 void putPixels(const spaces::RowStores& how, float* p, F8 c0, F8 c
     for (int k = 0; k < 3; ++k) _mm256_stream_ps(p + 8 * k, v[k]);
     return;
   }
-  const __m256i lane = _mm256_setr_epi32(0, 1, 2, 3, 4, 5, 6, 7);
-  for (int k = 0; k < 3; ++k) {
-    const __m256i mask = _mm256_cmpgt_epi32(_mm256_set1_epi32(3 * how.keep - 8 * k), lane);
-    _mm256_maskstore_ps(p + 8 * k, mask, v[k]);
+  for (int k = 0; k < 3; ++k) _mm256_maskstore_ps(p + 8 * k, firstSamples(3 * how.keep, k), v[k]);
+}
+
+template <int Stride, bool Bias16, typename T>
+ZEL_LANE_AVX2 void getPixels(const spaces::RowStores& how, const T* p, F8& c0, F8& c1, F8& c2) {
+  if constexpr (Stride == 3 && std::is_same_v<T, float>) {
+    if (how.kind == spaces::RowStores::Part) {
+      const __m256 v0 = _mm256_maskload_ps(p, firstSamples(3 * how.keep, 0));
+      const __m256 v1 = _mm256_maskload_ps(p + 8, firstSamples(3 * how.keep, 1));
+      const __m256 v2 = _mm256_maskload_ps(p + 16, firstSamples(3 * how.keep, 2));
+      deinterleaveFloat3(v0, v1, v2, c0, c1, c2);
+      return;
+    }
   }
+  loadPixels<Stride, Bias16>(p, c0, c1, c2);
 }
 
 // Integer lanes stored as bytes saturated to 0..255 (SaturateS16 then
@@ -592,58 +619,81 @@ ZEL_LANE_AVX512 void gatherPairs(const float (*table)[2], I16 index, F16& c, F16
   w.v = _mm512_shuffle_ps(a, b, _MM_SHUFFLE(3, 1, 3, 1));
 }
 
-// Lane indices of the three-sample shuffles: 48 samples in three vectors,
-// sample 3k + c the channel c of pixel k.
+// Sixteen float pixels of three samples are three whole vectors. Sample
+// 3k + c (channel c of pixel k) lies at place (3k + c) % 16 of vector
+// (3k + c) / 16, and for one channel those places are distinct across the
+// three vectors (p = c, c + 2, c + 1 modulo 3 in vectors 0, 1, 2): each
+// channel is two masked blends and one permute, and back.
 struct Float3Order {
-  // Channel c from (v0, v1) into pixels whose sample lies there, then the
-  // rest from v2.
-  int32_t first[3][16], second[3][16];
-  // Output vector o from (c0, c1) where its sample is of channel 0 or 1,
-  // then channel 2 from c2.
-  int32_t mergeFirst[3][16], mergeSecond[3][16];
+  int32_t order[3][16];   // pixel k of channel c sits at place order[c][k]
+  int32_t spread[3][16];  // and place p holds pixel spread[c][p]
   static constexpr Float3Order make() {
     Float3Order m{};
     for (int c = 0; c < 3; ++c)
       for (int k = 0; k < 16; ++k) {
-        const int at = 3 * k + c;
-        m.first[c][k] = at < 32 ? at : 0;
-        m.second[c][k] = at < 32 ? k : 16 + at - 32;
-      }
-    for (int o = 0; o < 3; ++o)
-      for (int i = 0; i < 16; ++i) {
-        const int at = 16 * o + i, k = at / 3, c = at % 3;
-        m.mergeFirst[o][i] = c == 0 ? k : (c == 1 ? 16 + k : 0);
-        m.mergeSecond[o][i] = c == 2 ? 16 + k : i;
+        m.order[c][k] = (3 * k + c) % 16;
+        m.spread[c][(3 * k + c) % 16] = k;
       }
     return m;
   }
 };
 inline constexpr Float3Order kFloat3Order = Float3Order::make();
 
-ZEL_LANE_AVX512 __m512i indexVector(const int32_t* at) { return _mm512_loadu_si512(at); }
-
-// Sixteen float pixels of three samples: three whole vectors, each channel
-// collected by two two-source permutes.
-ZEL_LANE_AVX512 void loadFloat3(const float* p, F16& c0, F16& c1, F16& c2) {
-  const __m512 v0 = _mm512_loadu_ps(p), v1 = _mm512_loadu_ps(p + 16), v2 = _mm512_loadu_ps(p + 32);
-  F16* out[3] = {&c0, &c1, &c2};
-  for (int c = 0; c < 3; ++c) {
-    const __m512 t = _mm512_permutex2var_ps(v0, indexVector(kFloat3Order.first[c]), v1);
-    out[c]->v = _mm512_permutex2var_ps(t, indexVector(kFloat3Order.second[c]), v2);
-  }
+// Places p of vector v (0..2) that hold channel c: (16 v + p) % 3 == c.
+constexpr __mmask16 channelPlaces(int v, int c) {
+  int bits = 0;
+  for (int p = 0; p < 16; ++p)
+    if ((16 * v + p) % 3 == c) bits |= 1 << p;
+  return __mmask16(bits);
 }
 
+ZEL_LANE_AVX512 __m512i indexVector(const int32_t* at) { return _mm512_loadu_si512(at); }
+// Lanes of v by index (VPERMPS / VPERMD), written with a full mask as the
+// min and max above.
+ZEL_LANE_AVX512 __m512 permuteLanes(__m512i index, __m512 v) { return _mm512_maskz_permutexvar_ps(0xFFFF, index, v); }
+ZEL_LANE_AVX512 __m512i permuteLanes(__m512i index, __m512i v) {
+  return _mm512_maskz_permutexvar_epi32(0xFFFF, index, v);
+}
+
+template <int C>
+ZEL_LANE_AVX512 __m512 channelOf(__m512 v0, __m512 v1, __m512 v2) {
+  const __m512 a = _mm512_mask_blend_ps(channelPlaces(2, C), _mm512_mask_blend_ps(channelPlaces(1, C), v0, v1), v2);
+  return permuteLanes(indexVector(kFloat3Order.order[C]), a);
+}
+ZEL_LANE_AVX512 void deinterleaveFloat3(__m512 v0, __m512 v1, __m512 v2, F16& c0, F16& c1, F16& c2) {
+  c0.v = channelOf<0>(v0, v1, v2);
+  c1.v = channelOf<1>(v0, v1, v2);
+  c2.v = channelOf<2>(v0, v1, v2);
+}
+
+template <int V>
+ZEL_LANE_AVX512 __m512 vectorOf(__m512 s0, __m512 s1, __m512 s2) {
+  return _mm512_mask_blend_ps(channelPlaces(V, 2), _mm512_mask_blend_ps(channelPlaces(V, 1), s0, s1), s2);
+}
 ZEL_LANE_AVX512 void interleaveFloat3(F16 c0, F16 c1, F16 c2, __m512* out) {
-  for (int o = 0; o < 3; ++o) {
-    const __m512 t = _mm512_permutex2var_ps(c0.v, indexVector(kFloat3Order.mergeFirst[o]), c1.v);
-    out[o] = _mm512_permutex2var_ps(t, indexVector(kFloat3Order.mergeSecond[o]), c2.v);
-  }
+  // Each channel spread to its places (place (3k + c) % 16 takes pixel k).
+  const __m512 s0 = permuteLanes(indexVector(kFloat3Order.spread[0]), c0.v);
+  const __m512 s1 = permuteLanes(indexVector(kFloat3Order.spread[1]), c1.v);
+  const __m512 s2 = permuteLanes(indexVector(kFloat3Order.spread[2]), c2.v);
+  out[0] = vectorOf<0>(s0, s1, s2);
+  out[1] = vectorOf<1>(s0, s1, s2);
+  out[2] = vectorOf<2>(s0, s1, s2);
+}
+
+ZEL_LANE_AVX512 void loadFloat3(const float* p, F16& c0, F16& c1, F16& c2) {
+  deinterleaveFloat3(_mm512_loadu_ps(p), _mm512_loadu_ps(p + 16), _mm512_loadu_ps(p + 32), c0, c1, c2);
+}
+// The masks of the first `samples` floats of three vectors.
+ZEL_LANE_AVX512 __mmask16 firstSampleBits(int samples, int k) {
+  return __mmask16(((uint64_t(1) << samples) - 1) >> (16 * k));
 }
 
 ZEL_LANE_AVX512 void storeFloat3(float* p, F16 c0, F16 c1, F16 c2) {
   __m512 v[3];
   interleaveFloat3(c0, c1, c2, v);
-  for (int k = 0; k < 3; ++k) _mm512_storeu_ps(p + 16 * k, v[k]);
+  _mm512_storeu_ps(p, v[0]);
+  _mm512_storeu_ps(p + 16, v[1]);
+  _mm512_storeu_ps(p + 32, v[2]);
 }
 
 // Sixteen byte pixels of three samples (48 bytes, read exactly): each
@@ -651,7 +701,7 @@ ZEL_LANE_AVX512 void storeFloat3(float* p, F16 c0, F16 c1, F16 c2) {
 // channel as in the 8-lane form.
 ZEL_LANE_AVX512 __m512i bytes3ToLanes(const uint8_t* p) {
   const __m512i raw = _mm512_maskz_loadu_epi32(0x0FFF, p);
-  return _mm512_permutexvar_epi32(_mm512_setr_epi32(0, 1, 2, 0, 3, 4, 5, 0, 6, 7, 8, 0, 9, 10, 11, 0), raw);
+  return permuteLanes(_mm512_setr_epi32(0, 1, 2, 0, 3, 4, 5, 0, 6, 7, 8, 0, 9, 10, 11, 0), raw);
 }
 ZEL_LANE_AVX512 void loadBytes3(const uint8_t* p, I16& c0, I16& c1, I16& c2) {
   const __m512i v = bytes3ToLanes(p);
@@ -663,7 +713,7 @@ ZEL_LANE_AVX512 void loadBytes3(const uint8_t* p, I16& c0, I16& c1, I16& c2) {
 // exactly.
 ZEL_LANE_AVX512 void storeLanesAsBytes3(uint8_t* p, __m512i v) {
   const __m512i packed =
-      _mm512_permutexvar_epi32(_mm512_setr_epi32(0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, 0, 0, 0, 0), v);
+      permuteLanes(_mm512_setr_epi32(0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, 0, 0, 0, 0), v);
   _mm512_mask_storeu_epi32(p, 0x0FFF, packed);
 }
 // The low byte of each lane to its place.
@@ -745,10 +795,21 @@ ZEL_LANE_AVX512 void putPixels(const spaces::RowStores& how, float* p, F16 c0, F
   } else if (how.kind == spaces::RowStores::Stream) {
     for (int k = 0; k < 3; ++k) _mm512_stream_ps(p + 16 * k, v[k]);
   } else {
-    const uint64_t samples = uint64_t(3 * how.keep);  // below 48
-    const uint64_t bits = (uint64_t(1) << samples) - 1;
-    for (int k = 0; k < 3; ++k) _mm512_mask_storeu_ps(p + 16 * k, __mmask16(bits >> (16 * k)), v[k]);
+    for (int k = 0; k < 3; ++k) _mm512_mask_storeu_ps(p + 16 * k, firstSampleBits(3 * how.keep, k), v[k]);
   }
+}
+
+template <int Stride, bool Bias16, typename T>
+ZEL_LANE_AVX512 void getPixels(const spaces::RowStores& how, const T* p, F16& c0, F16& c1, F16& c2) {
+  if constexpr (Stride == 3 && std::is_same_v<T, float>) {
+    if (how.kind == spaces::RowStores::Part) {
+      const int n = 3 * how.keep;
+      deinterleaveFloat3(_mm512_maskz_loadu_ps(firstSampleBits(n, 0), p), _mm512_maskz_loadu_ps(firstSampleBits(n, 1), p + 16),
+                         _mm512_maskz_loadu_ps(firstSampleBits(n, 2), p + 32), c0, c1, c2);
+      return;
+    }
+  }
+  loadPixels<Stride, Bias16>(p, c0, c1, c2);
 }
 
 }  // namespace zel::lanes

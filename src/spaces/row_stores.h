@@ -1,8 +1,9 @@
-// How a vector body puts its float pixels: with ordinary stores, streamed
-// past the caches (every address aligned to the vector), or only the first
-// `keep` pixels of one block (the head of a row before its first aligned
-// pixel, computed by the body formula like every other body pixel). The
-// three give the same bits.
+// How a vector body reads and writes its three-float pixels: ordinary
+// loads and stores, stores streamed past the caches (every address aligned
+// to the vector), or one block of which only the first `keep` pixels are
+// read and written (the head of a streamed row before its first aligned
+// pixel, and the rest of its body after the last whole block; both are
+// body pixels and take the body formula). All give the same bits.
 #pragma once
 
 #include <cstdint>
@@ -10,7 +11,7 @@
 namespace zel::spaces {
 
 struct RowStores {
-  enum Kind { Plain, Stream, Head };
+  enum Kind { Plain, Stream, Part };
   Kind kind = Plain;
   int keep = 0;
 };

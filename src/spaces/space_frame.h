@@ -95,33 +95,39 @@ inline Status convertImage(const S* src, int srcStep, D* dst, int dstStep, Image
 // A row in two zones: pixels [0, width AND NOT (block - 1)) through the
 // vector blocks, the widest lanes first and then narrower ones; the rest
 // one by one through the tail formula. `blocks(lanes, s, d, n, how)`
-// converts n pixels rounded down to its lane count, stores them as `how`
-// says and returns how many it did.
+// converts n pixels rounded down to its lane count, reads and stores them
+// as `how` says and returns how many it did.
 //
-// A streaming row of three-float pixels first converts one block at the
-// row's start and keeps only the pixels before the first aligned one (the
-// head), then streams whole blocks from there; what remains of the body
-// takes ordinary stores. Every body pixel keeps the body formula.
+// A streaming row of three-float pixels is cut at its first aligned pixel:
+// the pixels before it go as a part of one block, whole blocks stream from
+// there, and the body pixels after the last whole block go as a part of
+// one more. Every body pixel keeps the body formula. (Members that stream
+// have a body at every lane width.)
 template <int SrcStride, int DstStride, typename S, typename D, typename Blocks, typename Tail>
 inline void splitRow(const S* s, D* d, int width, int block, const RowContext& context, Blocks&& blocks,
                      Tail&& tail) {
   const int body = bodyEnd(width, block);
   int x = 0;
+  bool streamed = false;
   if constexpr (DstStride == 3 && sizeof(D) == 4) {
     if (context.stream) {
       const int group = laneCount(context.widest);
       const int head = pixelsToAlignment(d, 12, 4 * group);
       if (head >= 0 && head + group <= body) {
-        if (head > 0) blocks(context.widest, s, d, group, RowStores{RowStores::Head, head});
+        if (head > 0) blocks(context.widest, s, d, group, RowStores{RowStores::Part, head});
         x = head;
         x += blocks(context.widest, s + x * SrcStride, d + x * DstStride, body - x, RowStores{RowStores::Stream, 0});
+        if (x < body) blocks(context.widest, s + x * SrcStride, d + x * DstStride, group, RowStores{RowStores::Part, body - x});
+        x = body;
+        streamed = true;
       }
     }
   }
-  for (Lanes lanes = context.widest;; lanes = narrower(lanes)) {
-    if (body - x >= 4) x += blocks(lanes, s + x * SrcStride, d + x * DstStride, body - x, RowStores{});
-    if (lanes == Lanes::Sse4) break;
-  }
+  if (!streamed)
+    for (Lanes lanes = context.widest;; lanes = narrower(lanes)) {
+      if (body - x >= 4) x += blocks(lanes, s + x * SrcStride, d + x * DstStride, body - x, RowStores{});
+      if (lanes == Lanes::Sse4) break;
+    }
   for (; x < width; ++x) tail(s + x * SrcStride, d + x * DstStride);
 }
 

@@ -246,7 +246,7 @@ void expectBlocksRun(const Member<S, D>& m, Lanes lanes, int n, int dstOffset, R
   for (int i = 0; i < int(want.size()); ++i) want[i] = dst.get(i, 0);
   const int done = m.blocks(lanes, src.data(), dst.data(), n, how);
   ASSERT_EQ(done, expectDone) << m.name << " " << where;
-  const int written = how.kind == RowStores::Head ? how.keep : done;
+  const int written = how.kind == RowStores::Part ? how.keep : done;
   for (int x = 0; x < written; ++x) {
     S in[8];
     for (int c = 0; c < m.srcStride; ++c) in[c] = src.get(x * m.srcStride + c, 0);
@@ -282,8 +282,8 @@ void expectBlocksFollowBody(const Member<S, D>& m, uint32_t seed = 7) {
                       tier + " streamed n " + std::to_string(n));
     }
     for (int keep = 1; keep < count; ++keep)
-      expectBlocksRun(m, lanes, count, 4 * keep + 4, RowStores{RowStores::Head, keep}, count, seed + uint32_t(keep),
-                      tier + " head of " + std::to_string(keep));
+      expectBlocksRun(m, lanes, count, 4 * keep + 4, RowStores{RowStores::Part, keep}, count, seed + uint32_t(keep),
+                      tier + " part of " + std::to_string(keep));
     if (::testing::Test::HasFailure()) return;
   }
 }
