@@ -20,11 +20,27 @@
 #include "frame/simd.h"
 #include "spaces/row_stores.h"
 
+// The 512-bit intrinsics start some results from an undefined vector,
+// which the compiler then reports as maybe uninitialised; nothing here
+// reads such a value.
+#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
+
 #define ZEL_LANE inline __attribute__((always_inline))
 #define ZEL_LANE_AVX2 ZEL_AVX2 inline __attribute__((always_inline))
 #define ZEL_LANE_AVX512 ZEL_AVX512 inline __attribute__((always_inline))
 
 namespace zel::lanes {
+
+// Reading ahead: a block's source lines some way further on are asked for
+// now, so that memory keeps pace with the arithmetic (the processor's own
+// prefetch does not, on large frames). A prefetch is a hint: it neither
+// faults nor changes a byte, so it may point past the row.
+inline constexpr int kReadAhead = 2048;
+template <int Bytes>
+ZEL_LANE void readAhead(const void* p) {
+  const char* at = static_cast<const char*>(p) + kReadAhead;
+  for (int b = 0; b < Bytes; b += 64) _mm_prefetch(at + b, _MM_HINT_T0);
+}
 
 // ---------------------------------------------------------------- 4 lanes
 
@@ -549,10 +565,9 @@ ZEL_LANE_AVX512 F16 operator-(F16 a, F16 b) { return {_mm512_sub_ps(a.v, b.v)}; 
 ZEL_LANE_AVX512 F16 operator*(F16 a, F16 b) { return {_mm512_mul_ps(a.v, b.v)}; }
 ZEL_LANE_AVX512 F16 operator/(F16 a, F16 b) { return {_mm512_div_ps(a.v, b.v)}; }
 // VMINPS / VMAXPS keep the legacy rule: the second operand when the
-// comparison fails. (Written with a full mask: the plain forms start from
-// an undefined vector, which the compiler warns about.)
-ZEL_LANE_AVX512 F16 vmin(F16 a, F16 b) { return {_mm512_maskz_min_ps(0xFFFF, a.v, b.v)}; }
-ZEL_LANE_AVX512 F16 vmax(F16 a, F16 b) { return {_mm512_maskz_max_ps(0xFFFF, a.v, b.v)}; }
+// comparison fails.
+ZEL_LANE_AVX512 F16 vmin(F16 a, F16 b) { return {_mm512_min_ps(a.v, b.v)}; }
+ZEL_LANE_AVX512 F16 vmax(F16 a, F16 b) { return {_mm512_max_ps(a.v, b.v)}; }
 ZEL_LANE_AVX512 F16 approxRcp(F16 a) {
   const __m256 lo = _mm256_rcp_ps(_mm512_castps512_ps256(a.v));
   const __m256 hi = _mm256_rcp_ps(_mm512_extractf32x8_ps(a.v, 1));
@@ -648,12 +663,9 @@ constexpr __mmask16 channelPlaces(int v, int c) {
 }
 
 ZEL_LANE_AVX512 __m512i indexVector(const int32_t* at) { return _mm512_loadu_si512(at); }
-// Lanes of v by index (VPERMPS / VPERMD), written with a full mask as the
-// min and max above.
-ZEL_LANE_AVX512 __m512 permuteLanes(__m512i index, __m512 v) { return _mm512_maskz_permutexvar_ps(0xFFFF, index, v); }
-ZEL_LANE_AVX512 __m512i permuteLanes(__m512i index, __m512i v) {
-  return _mm512_maskz_permutexvar_epi32(0xFFFF, index, v);
-}
+// Lanes of v by index (VPERMPS / VPERMD).
+ZEL_LANE_AVX512 __m512 permuteLanes(__m512i index, __m512 v) { return _mm512_permutexvar_ps(index, v); }
+ZEL_LANE_AVX512 __m512i permuteLanes(__m512i index, __m512i v) { return _mm512_permutexvar_epi32(index, v); }
 
 template <int C>
 ZEL_LANE_AVX512 __m512 channelOf(__m512 v0, __m512 v1, __m512 v2) {

@@ -48,6 +48,7 @@ struct Sse {
   static F eq(F a, F b) { return _mm_cmpeq_ps(a, b); }
   static F le(F a, F b) { return _mm_cmple_ps(a, b); }
   static F lt(F a, F b) { return _mm_cmplt_ps(a, b); }
+  static F notLess(F a, F b) { return _mm_cmpnlt_ps(a, b); }
   static F gt(F a, F b) { return _mm_cmpgt_ps(a, b); }
   static F select(F mask, F yes, F no) { return _mm_blendv_ps(no, yes, mask); }
   static F andNot(F mask, F v) { return _mm_andnot_ps(mask, v); }
@@ -92,6 +93,7 @@ struct Avx {
   static F eq(F a, F b) { return _mm256_cmp_ps(a, b, _CMP_EQ_OQ); }
   static F le(F a, F b) { return _mm256_cmp_ps(a, b, _CMP_LE_OS); }
   static F lt(F a, F b) { return _mm256_cmp_ps(a, b, _CMP_LT_OS); }
+  static F notLess(F a, F b) { return _mm256_cmp_ps(a, b, _CMP_NLT_US); }
   static F gt(F a, F b) { return _mm256_cmp_ps(a, b, _CMP_GT_OS); }
   static F select(F mask, F yes, F no) { return _mm256_blendv_ps(no, yes, mask); }
   static F andNot(F mask, F v) { return _mm256_andnot_ps(mask, v); }
@@ -154,6 +156,7 @@ struct Avx512 {
   static M eq(F a, F b) { return _mm512_cmp_ps_mask(a, b, _CMP_EQ_OQ); }
   static M le(F a, F b) { return _mm512_cmp_ps_mask(a, b, _CMP_LE_OS); }
   static M lt(F a, F b) { return _mm512_cmp_ps_mask(a, b, _CMP_LT_OS); }
+  static M notLess(F a, F b) { return _mm512_cmp_ps_mask(a, b, _CMP_NLT_US); }
   static M gt(F a, F b) { return _mm512_cmp_ps_mask(a, b, _CMP_GT_OS); }
   static F select(M mask, F yes, F no) { return _mm512_mask_blend_ps(mask, no, yes); }
   static F andNot(M mask, F v) { return _mm512_maskz_mov_ps(__mmask16(~mask), v); }

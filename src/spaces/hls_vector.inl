@@ -63,6 +63,7 @@ inline int forwardGroups(const typename M::In& in, const typename M::Out& out, i
     for (; x + kStep <= end; x += kStep) {
       F colour[3];
       I hls[3];
+      in.template readAhead<kStep>(x);
       V::loadBytes3(in.pixel(x), colour);
       forwardLanes<V, typename M::BodyRecipe>(colour[M::kRedAt], colour[1], colour[2 - M::kRedAt], hls);
       V::storeBytes3(out.pixel(x), hls);
@@ -72,6 +73,7 @@ inline int forwardGroups(const typename M::In& in, const typename M::Out& out, i
   const __m128i bias = _mm_set1_epi32(0x8000);
   for (; x + kStep <= end; x += kStep) {
     __m128i raw[V::kGroups][4];
+    in.template readAhead<kStep>(x);
     for (int k = 0; k < V::kGroups; ++k) {
       in.template load<M::kChannels>(x + 4 * k, raw[k]);
       if constexpr (M::kBiased)
@@ -131,6 +133,7 @@ inline int forwardFloatGroups(const In& in, const Out& out, int x, int end, RowS
     // Whole pixels of three floats: three vectors in, three out.
     for (; x + kStep <= end; x += kStep) {
       typename V::F colour[3], hls[3];
+      in.template readAhead<kStep>(x);
       V::getFloat3(how, in.pixel(x), colour);
       forwardFloatLanes<V>(colour[0], colour[1], colour[2], hls);
       V::putFloat3(how, out.pixel(x), hls);
@@ -139,6 +142,7 @@ inline int forwardFloatGroups(const In& in, const Out& out, int x, int end, RowS
   }
   for (; x + kStep <= end; x += kStep) {
     __m128i raw[V::kGroups][4];
+    in.template readAhead<kStep>(x);
     for (int k = 0; k < V::kGroups; ++k) in.template load<3>(x + 4 * k, raw[k]);
     typename V::F colour[3], hls[3];
     for (int c = 0; c < 3; ++c) {
@@ -172,11 +176,13 @@ inline typename V::F levelLanes(typename V::F h, typename V::F low, typename V::
   // The two sloped bands are one formula of their distance from the band's
   // low end: h below 60, 240 - h from 180 to 240. That distance is chosen
   // first and the slope evaluated once.
-  const M below60 = V::lt(h, V::set(60.0f));
-  const F rise = riseLanes<V, R>(low, dm, V::subUnless(below60, h, V::set(240.0f), h));
+  // Tested as "not below 60" (NaN included): the distance and the last
+  // choice both read that one mask.
+  const M past60 = V::notLess(h, V::set(60.0f));
+  const F rise = riseLanes<V, R>(low, dm, V::subWhere(past60, h, V::set(240.0f), h));
   F v = V::select(V::lt(h, V::set(240.0f)), rise, low);
   v = V::select(V::lt(h, V::set(180.0f)), high, v);
-  return V::select(below60, rise, v);
+  return V::select(past60, v, rise);
 }
 
 // Levels of R, G, B from hue in degrees, l and s.
@@ -226,6 +232,7 @@ inline int inverseGroups(const typename M::In& in, const typename M::Out& out, i
 #pragma GCC unroll 2
     for (; x + kStep <= end; x += kStep) {
       F hls[3], level[3];
+      in.template readAhead<kStep>(x);
       V::getFloat3(how, in.pixel(x), hls);
       const F h = V::mul(hls[0], V::set(360.0f)), l = hls[1], s = hls[2];
       levelLanesOf<V, R>(h, l, s, level);
@@ -240,6 +247,7 @@ inline int inverseGroups(const typename M::In& in, const typename M::Out& out, i
   const __m128i bias = _mm_set1_epi32(0x8000);
   for (; x + kStep <= end; x += kStep) {
     __m128i raw[V::kGroups][4];
+    in.template readAhead<kStep>(x);
     for (int k = 0; k < V::kGroups; ++k) {
       in.template load<M::kChannels>(x + 4 * k, raw[k]);
       if constexpr (M::kBiased)

@@ -20,9 +20,11 @@ int forwardTableBlocks(Lanes lanes, const uint8_t* src, uint8_t* dst, int n, Row
                               : sse::forwardTableBlocks<lanes::F4, Bgr>(src, dst, n);
 }
 template <int Stride, bool Bgr>
-int forward32fBlocks(Lanes lanes, const float* src, float* dst, int n, RowStores) {
-  return lanes != Lanes::Sse4 ? avx2::forward32fBlocks<lanes::F8, Stride, Bgr>(src, dst, n)
-                              : sse::forward32fBlocks<lanes::F4, Stride, Bgr>(src, dst, n);
+int forward32fBlocks(Lanes lanes, const float* src, float* dst, int n, RowStores how) {
+  if constexpr (Stride == 3)
+    if (lanes == Lanes::Avx512) return avx512::forward32fBlocks<lanes::F16, 3, Bgr>(src, dst, n, how);
+  return lanes != Lanes::Sse4 ? avx2::forward32fBlocks<lanes::F8, Stride, Bgr>(src, dst, n, how)
+                              : sse::forward32fBlocks<lanes::F4, Stride, Bgr>(src, dst, n, how);
 }
 template <int Stride, typename T>
 int forward16Blocks(Lanes lanes, const T* src, T* dst, int n, RowStores) {
@@ -40,9 +42,10 @@ int inverse16Blocks(Lanes lanes, const T* src, T* dst, int n, RowStores) {
                               : sse::inverse16Blocks<lanes::F4, Stride, T>(src, dst, n);
 }
 template <bool Bgr>
-int inverse32fBlocks(Lanes lanes, const float* src, float* dst, int n, RowStores) {
-  return lanes != Lanes::Sse4 ? avx2::inverse32fBlocks<lanes::F8, Bgr>(src, dst, n)
-                              : sse::inverse32fBlocks<lanes::F4, Bgr>(src, dst, n);
+int inverse32fBlocks(Lanes lanes, const float* src, float* dst, int n, RowStores how) {
+  if (lanes == Lanes::Avx512) return avx512::inverse32fBlocks<lanes::F16, Bgr>(src, dst, n, how);
+  return lanes != Lanes::Sse4 ? avx2::inverse32fBlocks<lanes::F8, Bgr>(src, dst, n, how)
+                              : sse::inverse32fBlocks<lanes::F4, Bgr>(src, dst, n, how);
 }
 
 template int forwardTableBlocks<false>(Lanes, const uint8_t*, uint8_t*, int, RowStores);
@@ -71,47 +74,62 @@ constexpr int kBlock = 4;
 
 template <bool Bgr>
 Status forwardTable(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
-  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Bytes, [](const uint8_t* s, uint8_t* d, int w, const RowContext& c) {
-    splitRow<3, 3>(s, d, w, kBlock, c, forwardTableBlocks<Bgr>, forwardTablePixel<Bgr, Zone::Tail>);
-  });
+  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Bytes,
+                      [](const uint8_t* s, uint8_t* d, int w, const RowContext& c) {
+                        splitRow<3, 3>(s, d, w, kBlock, c, forwardTableBlocks<Bgr>, forwardTablePixel<Bgr, Zone::Tail>);
+                      });
 }
 
+// Float frames of three-float pixels larger than the cache stream their
+// output.
 template <int Stride, bool Bgr>
 Status forwardFloat(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
-  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Bytes, [](const float* s, float* d, int w, const RowContext& c) {
-    splitRow<Stride, Stride>(s, d, w, kBlock, c, forward32fBlocks<Stride, Bgr>, forward32fPixel<Bgr, Zone::Tail>);
-  });
+  constexpr Streaming kStream = Stride == 3 ? Streaming::BeyondCache : Streaming::Never;
+  return convertImage<kStream>(
+      src, srcStep, dst, dstStep, size, StepUnit::Bytes,
+      [](const float* s, float* d, int w, const RowContext& c) {
+        splitRow<Stride, Stride>(s, d, w, kBlock, c, forward32fBlocks<Stride, Bgr>, forward32fPixel<Bgr, Zone::Tail>);
+      },
+      4 * Stride, 4 * Stride);
 }
 
 // The tail of 16u AC4 truncates where the others round.
 template <int Stride, typename T>
 Status forwardWide(const T* src, int srcStep, T* dst, int dstStep, ImageSize size) {
   constexpr bool truncating = Stride == 4 && std::is_same_v<T, uint16_t>;
-  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Samples, [](const T* s, T* d, int w, const RowContext& c) {
-    splitRow<Stride, Stride>(s, d, w, kBlock, c, forward16Blocks<Stride, T>, forward16Pixel<T, Zone::Tail, truncating>);
-  });
+  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Samples,
+                      [](const T* s, T* d, int w, const RowContext& c) {
+                        splitRow<Stride, Stride>(s, d, w, kBlock, c, forward16Blocks<Stride, T>,
+                                                 forward16Pixel<T, Zone::Tail, truncating>);
+                      });
 }
 
 template <int Stride, bool Bgr>
 Status inverse8u(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
-  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Bytes, [](const uint8_t* s, uint8_t* d, int w, const RowContext& c) {
-    splitRow<Stride, Stride>(s, d, w, kBlock, c, inverse8uBlocks<Stride, Bgr>,
-                             inverse8uPixel<Bgr, Stride == 4, Zone::Tail>);
-  });
+  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Bytes,
+                      [](const uint8_t* s, uint8_t* d, int w, const RowContext& c) {
+                        splitRow<Stride, Stride>(s, d, w, kBlock, c, inverse8uBlocks<Stride, Bgr>,
+                                                 inverse8uPixel<Bgr, Stride == 4, Zone::Tail>);
+                      });
 }
 
 template <int Stride, typename T>
 Status inverseWide(const T* src, int srcStep, T* dst, int dstStep, ImageSize size) {
-  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Samples, [](const T* s, T* d, int w, const RowContext& c) {
-    splitRow<Stride, Stride>(s, d, w, kBlock, c, inverse16Blocks<Stride, T>, inverse16Pixel<T, Zone::Tail>);
-  });
+  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Samples,
+                      [](const T* s, T* d, int w, const RowContext& c) {
+                        splitRow<Stride, Stride>(s, d, w, kBlock, c, inverse16Blocks<Stride, T>,
+                                                 inverse16Pixel<T, Zone::Tail>);
+                      });
 }
 
 template <bool Bgr>
 Status inverseFloat(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
-  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Bytes, [](const float* s, float* d, int w, const RowContext& c) {
-    splitRow<3, 3>(s, d, w, kBlock, c, inverse32fBlocks<Bgr>, inverse32fPixel<Bgr, Zone::Tail>);
-  });
+  return convertImage<Streaming::BeyondCache>(
+      src, srcStep, dst, dstStep, size, StepUnit::Bytes,
+      [](const float* s, float* d, int w, const RowContext& c) {
+        splitRow<3, 3>(s, d, w, kBlock, c, inverse32fBlocks<Bgr>, inverse32fPixel<Bgr, Zone::Tail>);
+      },
+      12, 12);
 }
 
 }  // namespace
