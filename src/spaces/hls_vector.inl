@@ -69,32 +69,33 @@ inline int forwardGroups(const typename M::In& in, const typename M::Out& out, i
       V::storeBytes3(out.pixel(x), hls);
     }
     return x;
+  } else {
+    const __m128i bias = _mm_set1_epi32(0x8000);
+    for (; x + kStep <= end; x += kStep) {
+      __m128i raw[V::kGroups][4];
+      in.template readAhead<kStep>(x);
+      for (int k = 0; k < V::kGroups; ++k) {
+        in.template load<M::kChannels>(x + 4 * k, raw[k]);
+        if constexpr (M::kBiased)
+          for (int c = 0; c < 3; ++c) raw[k][c] = _mm_xor_si128(raw[k][c], bias);
+      }
+      F colour[3];
+      for (int c = 0; c < 3; ++c) {
+        __m128i parts[V::kGroups];
+        for (int k = 0; k < V::kGroups; ++k) parts[k] = raw[k][c];
+        colour[c] = V::toFloat(V::join(parts));
+      }
+      I hls[3];
+      forwardLanes<V, typename M::BodyRecipe>(colour[M::kRedAt], colour[1], colour[2 - M::kRedAt], hls);
+      for (int k = 0; k < V::kGroups; ++k) {
+        __m128i lanes[4] = {V::part(hls[0], k), V::part(hls[1], k), V::part(hls[2], k), raw[k][3]};
+        if constexpr (M::kBiased)
+          for (int c = 0; c < 3; ++c) lanes[c] = _mm_xor_si128(lanes[c], bias);
+        out.template store<M::kCopyAlpha ? 4 : 3>(x + 4 * k, lanes);
+      }
+    }
+    return x;
   }
-  const __m128i bias = _mm_set1_epi32(0x8000);
-  for (; x + kStep <= end; x += kStep) {
-    __m128i raw[V::kGroups][4];
-    in.template readAhead<kStep>(x);
-    for (int k = 0; k < V::kGroups; ++k) {
-      in.template load<M::kChannels>(x + 4 * k, raw[k]);
-      if constexpr (M::kBiased)
-        for (int c = 0; c < 3; ++c) raw[k][c] = _mm_xor_si128(raw[k][c], bias);
-    }
-    F colour[3];
-    for (int c = 0; c < 3; ++c) {
-      __m128i parts[V::kGroups];
-      for (int k = 0; k < V::kGroups; ++k) parts[k] = raw[k][c];
-      colour[c] = V::toFloat(V::join(parts));
-    }
-    I hls[3];
-    forwardLanes<V, typename M::BodyRecipe>(colour[M::kRedAt], colour[1], colour[2 - M::kRedAt], hls);
-    for (int k = 0; k < V::kGroups; ++k) {
-      __m128i lanes[4] = {V::part(hls[0], k), V::part(hls[1], k), V::part(hls[2], k), raw[k][3]};
-      if constexpr (M::kBiased)
-        for (int c = 0; c < 3; ++c) lanes[c] = _mm_xor_si128(lanes[c], bias);
-      out.template store<M::kCopyAlpha ? 4 : 3>(x + 4 * k, lanes);
-    }
-  }
-  return x;
 }
 
 // Float samples: the one formula of every pixel, with true divisions.
@@ -139,25 +140,26 @@ inline int forwardFloatGroups(const In& in, const Out& out, int x, int end, RowS
       V::putFloat3(how, out.pixel(x), hls);
     }
     return x;
-  }
-  for (; x + kStep <= end; x += kStep) {
-    __m128i raw[V::kGroups][4];
-    in.template readAhead<kStep>(x);
-    for (int k = 0; k < V::kGroups; ++k) in.template load<3>(x + 4 * k, raw[k]);
-    typename V::F colour[3], hls[3];
-    for (int c = 0; c < 3; ++c) {
-      __m128i parts[V::kGroups];
-      for (int k = 0; k < V::kGroups; ++k) parts[k] = raw[k][c];
-      colour[c] = V::asFloat(V::join(parts));
+  } else {
+    for (; x + kStep <= end; x += kStep) {
+      __m128i raw[V::kGroups][4];
+      in.template readAhead<kStep>(x);
+      for (int k = 0; k < V::kGroups; ++k) in.template load<3>(x + 4 * k, raw[k]);
+      typename V::F colour[3], hls[3];
+      for (int c = 0; c < 3; ++c) {
+        __m128i parts[V::kGroups];
+        for (int k = 0; k < V::kGroups; ++k) parts[k] = raw[k][c];
+        colour[c] = V::asFloat(V::join(parts));
+      }
+      forwardFloatLanes<V>(colour[0], colour[1], colour[2], hls);
+      for (int k = 0; k < V::kGroups; ++k) {
+        const __m128i lanes[3] = {V::part(V::asInt(hls[0]), k), V::part(V::asInt(hls[1]), k),
+                                  V::part(V::asInt(hls[2]), k)};
+        out.template store<3>(x + 4 * k, lanes);
+      }
     }
-    forwardFloatLanes<V>(colour[0], colour[1], colour[2], hls);
-    for (int k = 0; k < V::kGroups; ++k) {
-      const __m128i lanes[3] = {V::part(V::asInt(hls[0]), k), V::part(V::asInt(hls[1]), k),
-                                V::part(V::asInt(hls[2]), k)};
-      out.template store<3>(x + 4 * k, lanes);
-    }
+    return x;
   }
-  return x;
 }
 
 // ---- inverse ----
@@ -243,48 +245,49 @@ inline int inverseGroups(const typename M::In& in, const typename M::Out& out, i
       V::putFloat3(how, out.pixel(x), ordered);
     }
     return x;
+  } else {
+    const __m128i bias = _mm_set1_epi32(0x8000);
+    for (; x + kStep <= end; x += kStep) {
+      __m128i raw[V::kGroups][4];
+      in.template readAhead<kStep>(x);
+      for (int k = 0; k < V::kGroups; ++k) {
+        in.template load<M::kChannels>(x + 4 * k, raw[k]);
+        if constexpr (M::kBiased)
+          for (int c = 0; c < 3; ++c) raw[k][c] = _mm_xor_si128(raw[k][c], bias);
+      }
+      F hls[3];
+      for (int c = 0; c < 3; ++c) {
+        __m128i parts[V::kGroups];
+        for (int k = 0; k < V::kGroups; ++k) parts[k] = raw[k][c];
+        hls[c] = M::kFloat ? V::asFloat(V::join(parts)) : V::toFloat(V::join(parts));
+      }
+      F h, l, s;
+      if constexpr (R::kScale == Scale::Multiply8) {
+        h = V::mul(hls[0], V::set(kDeg8)), l = V::mul(hls[1], V::set(kInv8)), s = V::mul(hls[2], V::set(kInv8));
+      } else if constexpr (R::kScale == Scale::Multiply16) {
+        h = V::mul(hls[0], V::set(kDeg16)), l = V::mul(hls[1], V::set(kInv16)), s = V::mul(hls[2], V::set(kInv16));
+      } else if constexpr (R::kScale == Scale::Divide8) {
+        h = V::div(V::mul(hls[0], V::set(360.0f)), V::set(255.0f));
+        l = V::div(hls[1], V::set(255.0f)), s = V::div(hls[2], V::set(255.0f));
+      } else {
+        h = V::mul(hls[0], V::set(360.0f)), l = hls[1], s = hls[2];
+      }
+      F level[3];
+      levelLanesOf<V, R>(h, l, s, level);
+      const typename V::M grey = V::eq(s, V::set(0.0f));
+      I rgb[3];
+      for (int c = 0; c < 3; ++c) {
+        if constexpr (R::kGrey == Grey::Lightness) level[c] = V::select(grey, l, level[c]);
+        if constexpr (R::kGrey == Grey::CopyL) level[c] = V::select(grey, hls[1], level[c]);
+        rgb[c] = outputLanes<V, R>(level[c]);
+      }
+      for (int k = 0; k < V::kGroups; ++k) {
+        __m128i lanes[4] = {V::part(rgb[M::kRedAt], k), V::part(rgb[1], k), V::part(rgb[2 - M::kRedAt], k), raw[k][3]};
+        if constexpr (M::kBiased)
+          for (int c = 0; c < 3; ++c) lanes[c] = _mm_xor_si128(lanes[c], bias);
+        out.template store<M::kCopyAlpha ? 4 : 3>(x + 4 * k, lanes);
+      }
+    }
+    return x;
   }
-  const __m128i bias = _mm_set1_epi32(0x8000);
-  for (; x + kStep <= end; x += kStep) {
-    __m128i raw[V::kGroups][4];
-    in.template readAhead<kStep>(x);
-    for (int k = 0; k < V::kGroups; ++k) {
-      in.template load<M::kChannels>(x + 4 * k, raw[k]);
-      if constexpr (M::kBiased)
-        for (int c = 0; c < 3; ++c) raw[k][c] = _mm_xor_si128(raw[k][c], bias);
-    }
-    F hls[3];
-    for (int c = 0; c < 3; ++c) {
-      __m128i parts[V::kGroups];
-      for (int k = 0; k < V::kGroups; ++k) parts[k] = raw[k][c];
-      hls[c] = M::kFloat ? V::asFloat(V::join(parts)) : V::toFloat(V::join(parts));
-    }
-    F h, l, s;
-    if constexpr (R::kScale == Scale::Multiply8) {
-      h = V::mul(hls[0], V::set(kDeg8)), l = V::mul(hls[1], V::set(kInv8)), s = V::mul(hls[2], V::set(kInv8));
-    } else if constexpr (R::kScale == Scale::Multiply16) {
-      h = V::mul(hls[0], V::set(kDeg16)), l = V::mul(hls[1], V::set(kInv16)), s = V::mul(hls[2], V::set(kInv16));
-    } else if constexpr (R::kScale == Scale::Divide8) {
-      h = V::div(V::mul(hls[0], V::set(360.0f)), V::set(255.0f));
-      l = V::div(hls[1], V::set(255.0f)), s = V::div(hls[2], V::set(255.0f));
-    } else {
-      h = V::mul(hls[0], V::set(360.0f)), l = hls[1], s = hls[2];
-    }
-    F level[3];
-    levelLanesOf<V, R>(h, l, s, level);
-    const typename V::M grey = V::eq(s, V::set(0.0f));
-    I rgb[3];
-    for (int c = 0; c < 3; ++c) {
-      if constexpr (R::kGrey == Grey::Lightness) level[c] = V::select(grey, l, level[c]);
-      if constexpr (R::kGrey == Grey::CopyL) level[c] = V::select(grey, hls[1], level[c]);
-      rgb[c] = outputLanes<V, R>(level[c]);
-    }
-    for (int k = 0; k < V::kGroups; ++k) {
-      __m128i lanes[4] = {V::part(rgb[M::kRedAt], k), V::part(rgb[1], k), V::part(rgb[2 - M::kRedAt], k), raw[k][3]};
-      if constexpr (M::kBiased)
-        for (int c = 0; c < 3; ++c) lanes[c] = _mm_xor_si128(lanes[c], bias);
-      out.template store<M::kCopyAlpha ? 4 : 3>(x + 4 * k, lanes);
-    }
-  }
-  return x;
 }

@@ -73,6 +73,17 @@ TEST(RgbToHls, FloatPixelsByTheFloatFormula) {
                            {false, ch, false, ch, 0, false}, 1, false, expectedFloat);
 }
 
+TEST(RgbToHls, ByteGroupsOfEveryTier) {
+  // 8-pixel blocks taken 8 or 16 at a time, or 4 and 4: the same recipe.
+  atEveryTier([&] {
+    checkEveryWidth<uint8_t>("8u C3", packed(zeliRGBToHLS_8u_C3R), {false, 3, false, 3, 0, false}, 8, false,
+                             [](const ChannelImage<uint8_t>& src, int x, int y, bool body, uint8_t* out) {
+                               expectedForward<RgbToHls8C3, uint8_t>(src, x, y, 0, body, out);
+                             },
+                             {129, 150, 203});
+  });
+}
+
 TEST(RgbToHls, FloatGroupsOfEveryTierAndStreamedRows) {
   // Groups of 4, 8 and 16 pixels, widths past a few 16-pixel groups, and
   // rows streamed past the cache from their first aligned pixel.
