@@ -35,7 +35,7 @@ namespace zel::lanes {
 // now, so that memory keeps pace with the arithmetic (the processor's own
 // prefetch does not, on large frames). A prefetch is a hint: it neither
 // faults nor changes a byte, so it may point past the row.
-inline constexpr int kReadAhead = 2048;
+inline constexpr int kReadAhead = 8192;
 template <int Bytes>
 ZEL_LANE void readAhead(const void* p) {
   const char* at = static_cast<const char*>(p) + kReadAhead;

@@ -265,7 +265,7 @@ struct BytePlanesBack {
 // Reading ahead: the source lines of a block some way further on are asked
 // for now, so that memory keeps pace on large frames. A prefetch is a hint
 // that neither faults nor changes a byte, so it may point past the row.
-constexpr int kReadAhead = 2048;
+constexpr int kReadAhead = 8192;
 template <int Bytes>
 ZEL_INLINE void readAhead(const void* p) {
   const char* at = static_cast<const char*>(p) + kReadAhead;
