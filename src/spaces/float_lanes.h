@@ -715,11 +715,15 @@ ZEL_LANE_AVX512 __m512i bytes3ToLanes(const uint8_t* p) {
   const __m512i raw = _mm512_maskz_loadu_epi32(0x0FFF, p);
   return permuteLanes(_mm512_setr_epi32(0, 1, 2, 0, 3, 4, 5, 0, 6, 7, 8, 0, 9, 10, 11, 0), raw);
 }
+// The same byte shuffle in every 128-bit lane.
+ZEL_LANE_AVX512 __m512i laneShuffle(__m512i v, __m128i mask) {
+  return _mm512_shuffle_epi8(v, _mm512_broadcast_i32x4(mask));
+}
 ZEL_LANE_AVX512 void loadBytes3(const uint8_t* p, I16& c0, I16& c1, I16& c2) {
   const __m512i v = bytes3ToLanes(p);
-  c0.v = _mm512_shuffle_epi8(v, _mm512_broadcast_i32x4(_mm_setr_epi8(0, -1, -1, -1, 3, -1, -1, -1, 6, -1, -1, -1, 9, -1, -1, -1)));
-  c1.v = _mm512_shuffle_epi8(v, _mm512_broadcast_i32x4(_mm_setr_epi8(1, -1, -1, -1, 4, -1, -1, -1, 7, -1, -1, -1, 10, -1, -1, -1)));
-  c2.v = _mm512_shuffle_epi8(v, _mm512_broadcast_i32x4(_mm_setr_epi8(2, -1, -1, -1, 5, -1, -1, -1, 8, -1, -1, -1, 11, -1, -1, -1)));
+  c0.v = laneShuffle(v, _mm_setr_epi8(0, -1, -1, -1, 3, -1, -1, -1, 6, -1, -1, -1, 9, -1, -1, -1));
+  c1.v = laneShuffle(v, _mm_setr_epi8(1, -1, -1, -1, 4, -1, -1, -1, 7, -1, -1, -1, 10, -1, -1, -1));
+  c2.v = laneShuffle(v, _mm_setr_epi8(2, -1, -1, -1, 5, -1, -1, -1, 8, -1, -1, -1, 11, -1, -1, -1));
 }
 // Twelve bytes at the start of each 128-bit lane back to 48 bytes, written
 // exactly.
@@ -730,11 +734,12 @@ ZEL_LANE_AVX512 void storeLanesAsBytes3(uint8_t* p, __m512i v) {
 }
 // The low byte of each lane to its place.
 ZEL_LANE_AVX512 void storeBytes3(uint8_t* p, I16 c0, I16 c1, I16 c2) {
-  const __m512i v = _mm512_or_si512(
-      _mm512_or_si512(
-          _mm512_shuffle_epi8(c0.v, _mm512_broadcast_i32x4(_mm_setr_epi8(0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1, -1, -1))),
-          _mm512_shuffle_epi8(c1.v, _mm512_broadcast_i32x4(_mm_setr_epi8(-1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1, -1)))),
-      _mm512_shuffle_epi8(c2.v, _mm512_broadcast_i32x4(_mm_setr_epi8(-1, -1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1))));
+  const __m512i v =
+      _mm512_or_si512(_mm512_or_si512(laneShuffle(c0.v, _mm_setr_epi8(0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1,
+                                                                      -1, -1, -1)),
+                                      laneShuffle(c1.v, _mm_setr_epi8(-1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1,
+                                                                      -1, -1, -1))),
+                      laneShuffle(c2.v, _mm_setr_epi8(-1, -1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1)));
   storeLanesAsBytes3(p, v);
 }
 
@@ -748,8 +753,8 @@ ZEL_LANE_AVX512 void loadBytes4(const uint8_t* p, I16& c0, I16& c1, I16& c2) {
 }
 ZEL_LANE_AVX512 void storeBytes4(uint8_t* p, I16 c0, I16 c1, I16 c2) {
   const __m512i low = _mm512_set1_epi32(0xFF);
-  const __m512i v = _mm512_or_si512(_mm512_or_si512(_mm512_and_si512(c0.v, low), _mm512_slli_epi32(_mm512_and_si512(c1.v, low), 8)),
-                                    _mm512_slli_epi32(c2.v, 16));
+  const __m512i v01 = _mm512_or_si512(_mm512_and_si512(c0.v, low), _mm512_slli_epi32(_mm512_and_si512(c1.v, low), 8));
+  const __m512i v = _mm512_or_si512(v01, _mm512_slli_epi32(c2.v, 16));
   _mm512_mask_storeu_epi8(p, 0x7777777777777777ull, v);
 }
 
@@ -785,7 +790,7 @@ ZEL_LANE_AVX512 void storeClampedBytes(uint8_t* p, I16 c0, I16 c1, I16 c2) {
     // Per 128-bit lane: c0 of four pixels, c1, c2, c2 again, as saturated
     // bytes, then put in pixel order.
     const __m512i bytes = _mm512_packus_epi16(_mm512_packs_epi32(c0.v, c1.v), _mm512_packs_epi32(c2.v, c2.v));
-    storeLanesAsBytes3(p, _mm512_shuffle_epi8(bytes, _mm512_broadcast_i32x4(_mm_setr_epi8(0, 4, 8, 1, 5, 9, 2, 6, 10, 3, 7, 11, -1, -1, -1, -1))));
+    storeLanesAsBytes3(p, laneShuffle(bytes, _mm_setr_epi8(0, 4, 8, 1, 5, 9, 2, 6, 10, 3, 7, 11, -1, -1, -1, -1)));
   } else {
     storeBytes4(p, clampToByte(c0), clampToByte(c1), clampToByte(c2));
   }
@@ -816,7 +821,8 @@ ZEL_LANE_AVX512 void getPixels(const spaces::RowStores& how, const T* p, F16& c0
   if constexpr (Stride == 3 && std::is_same_v<T, float>) {
     if (how.kind == spaces::RowStores::Part) {
       const int n = 3 * how.keep;
-      deinterleaveFloat3(_mm512_maskz_loadu_ps(firstSampleBits(n, 0), p), _mm512_maskz_loadu_ps(firstSampleBits(n, 1), p + 16),
+      deinterleaveFloat3(_mm512_maskz_loadu_ps(firstSampleBits(n, 0), p),
+                         _mm512_maskz_loadu_ps(firstSampleBits(n, 1), p + 16),
                          _mm512_maskz_loadu_ps(firstSampleBits(n, 2), p + 32), c0, c1, c2);
       return;
     }

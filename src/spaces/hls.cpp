@@ -411,7 +411,8 @@ Status rgbToHlsFloat(const float* src, int srcStep, float* dst, int dstStep, Ima
   if (badSize(size)) return StatusSizeError;
   using M = Member<RgbToHls8C3, RgbToHls8C3, 1, Packed<float, Ch>, Packed<float, Ch>, 0, false>;
   const Packed<float, Ch> in{bytes(src), wholeSamples<float>(srcStep)}, out{bytes(dst), wholeSamples<float>(dstStep)};
-  walk<M>(in, out, size, [](const auto& i, const auto& o, int w, const RowContext& c) { forwardFloatRow<Ch>(i, o, w, c); });
+  walk<M>(in, out, size,
+          [](const auto& i, const auto& o, int w, const RowContext& c) { forwardFloatRow<Ch>(i, o, w, c); });
   return StatusOk;
 }
 

@@ -117,7 +117,8 @@ inline void splitRow(const S* s, D* d, int width, int block, const RowContext& c
         if (head > 0) blocks(context.widest, s, d, group, RowStores{RowStores::Part, head});
         x = head;
         x += blocks(context.widest, s + x * SrcStride, d + x * DstStride, body - x, RowStores{RowStores::Stream, 0});
-        if (x < body) blocks(context.widest, s + x * SrcStride, d + x * DstStride, group, RowStores{RowStores::Part, body - x});
+        if (x < body)
+          blocks(context.widest, s + x * SrcStride, d + x * DstStride, group, RowStores{RowStores::Part, body - x});
         x = body;
         streamed = true;
       }

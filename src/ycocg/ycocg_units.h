@@ -268,7 +268,8 @@ struct Avx512 {
       const V b = words == 32 ? _mm512_loadu_si512(p + 64)
                               : _mm512_castsi256_si512(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(p + 64)));
       for (int i = 0; i < 2; ++i)
-        chunks[i] = _mm512_maskz_permutex2var_epi32(chunkDwords<G>(i), a, _mm512_loadu_si512(kGroupOrder<G>.chunk[i]), b);
+        chunks[i] =
+            _mm512_maskz_permutex2var_epi32(chunkDwords<G>(i), a, _mm512_loadu_si512(kGroupOrder<G>.chunk[i]), b);
     } else {
       for (int i = 0; i < G::kChunks; ++i) chunks[i] = chunk<G>(p, i);
     }

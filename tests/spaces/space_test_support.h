@@ -166,7 +166,8 @@ void expectFrameFollowsFormulas(const Member<S, D>& m, int width, int height, in
   EXPECT_TRUE(dst.guardsIntact()) << m.name << " " << where << ": a byte outside the rows changed";
   for (int y = 0; y < height; ++y)
     for (int i = 0; i < width * m.srcStride; ++i)
-      ASSERT_TRUE(sameBits(src.get(i, y), srcCopy[size_t(y) * width * m.srcStride + i])) << m.name << ": source written";
+      ASSERT_TRUE(sameBits(src.get(i, y), srcCopy[size_t(y) * width * m.srcStride + i]))
+          << m.name << ": source written";
 }
 
 // Widths 1..70 at several alignments and paddings.
