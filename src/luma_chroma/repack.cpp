@@ -117,6 +117,12 @@ void packPairs(const Member& m, const Side& src, const Side& dst, int width, int
     mergePairs(src.p[0], src.p[1], src.p[2], o, dst.p[0], width * height, nonTemporal);
     return;
   }
+  if (m.src.kind == Kind::Planes && m.src.scheme != Scheme::S411) {
+    const PairRows rows{src.p[0],    src.p[1],    src.p[2], src.step[0], src.step[1], src.step[2],
+                        m.src.scheme == Scheme::S420 ? 2 : 1, dst.p[0], dst.step[0]};
+    mergePairRows(rows, o, width, height, nonTemporal);
+    return;
+  }
   for (int y = 0; y < height; ++y) {
     const uint8_t* luma = at(src, 0, y, 0);
     uint8_t* out = at(dst, 0, y, 0);
