@@ -449,11 +449,13 @@ inline PairRow pairRow(const PairRows& r, int row) {
   const int c = row / r.lumaRowsPerChromaRow;
   return {rowAt(r.y, r.yStep, row), rowAt(r.cb, r.cbStep, c), rowAt(r.cr, r.crStep, c), rowAt(r.out, r.outStep, row)};
 }
-ZEL_AVX2 void mergePairRowsAvx(const PairRows& r, PairOrder o, int width, int height, bool nonTemporal) {
+// The store kind is a constant of each loop.
+template <bool NonTemporal>
+ZEL_AVX2 void mergePairRowsAvx(const PairRows& r, PairOrder o, int width, int height) {
   for (int row = 0; row < height; ++row) {
     const PairRow p = pairRow(r, row);
-    const int x = mergePairBlocks(p.y, p.cb, p.cr, o, p.out, width, nonTemporal);
-    if (x < width) mergePairsFrom(x, p.y, p.cb, p.cr, o, p.out, width, nonTemporal);
+    const int x = mergePairBlocks(p.y, p.cb, p.cr, o, p.out, width, NonTemporal);
+    if (x < width) mergePairsFrom(x, p.y, p.cb, p.cr, o, p.out, width, NonTemporal);
   }
 }
 
@@ -467,7 +469,10 @@ void mergePairs(const uint8_t* y, const uint8_t* cb, const uint8_t* cr, PairOrde
 
 void mergePairRows(const PairRows& r, PairOrder o, int width, int height, bool nonTemporal) {
   if (hasAvx2()) {
-    mergePairRowsAvx(r, o, width, height, nonTemporal);
+    if (nonTemporal)
+      mergePairRowsAvx<true>(r, o, width, height);
+    else
+      mergePairRowsAvx<false>(r, o, width, height);
     return;
   }
   for (int row = 0; row < height; ++row) {
