@@ -35,8 +35,9 @@ bool narrowingClamps(const Matrix& m) {
   constexpr double reach = std::is_signed_v<T> ? -double(std::numeric_limits<T>::min())
                                                : double(std::numeric_limits<T>::max());
   for (int i = 0; i < 3; ++i) {
-    const double bound = std::fabs(double(m.t[i][3])) +
-                         reach * (std::fabs(double(m.t[i][0])) + std::fabs(double(m.t[i][1])) + std::fabs(double(m.t[i][2])));
+    double weights = 0;
+    for (int j = 0; j < 3; ++j) weights += std::fabs(double(m.t[i][j]));
+    const double bound = std::fabs(double(m.t[i][3])) + reach * weights;
     if (!(bound < 1073741824.0)) return false;  // NaN and infinities too
   }
   return true;
