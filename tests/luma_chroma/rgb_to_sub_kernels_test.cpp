@@ -12,6 +12,7 @@
 #include "luma_chroma/rgb_to_sub_filter.h"
 #include "luma_chroma/rgb_to_sub_rows.h"
 #include "luma_chroma/rgb_to_sub_yuv_forms.h"
+#include "luma_chroma/tier_params.h"
 
 namespace {
 
@@ -131,14 +132,7 @@ void pairBodyAgrees(VectorTier tier, const Body& body, In in, Out out) {
   });
 }
 
-// One pass for each vector tier; a tier that this processor lacks (or that
-// the cap of the tier excludes) is skipped.
-class SubsampledKernels : public ::testing::TestWithParam<VectorTier> {
- protected:
-  void SetUp() override {
-    if (unitTier() < GetParam()) GTEST_SKIP() << "the processor lacks this vector tier";
-  }
-};
+using SubsampledKernels = zel::test::TierTest;
 
 TEST_P(SubsampledKernels, FourTwoZeroBlocksMatchTheScalarForms) {
   pairBodyAgrees<true>(GetParam(), LanesBody<set601, 4>{}, In::C3, Out::Planes);
@@ -172,13 +166,7 @@ TEST_P(SubsampledKernels, YuvBlocksMatchTheScalarForms) {
   rowBodyAgrees<2, false>(GetParam(), RoundedDifferenceBody<2>{}, In::C3, Out::Planes);
 }
 
-INSTANTIATE_TEST_SUITE_P(Tiers, SubsampledKernels,
-                         ::testing::Values(VectorTier::Sse41, VectorTier::Avx2, VectorTier::Avx512),
-                         [](const ::testing::TestParamInfo<VectorTier>& info) {
-                           return info.param == VectorTier::Sse41 ? "Sse41"
-                                  : info.param == VectorTier::Avx2 ? "Avx2"
-                                                                    : "Avx512";
-                         });
+INSTANTIATE_TEST_SUITE_P(Tiers, SubsampledKernels, zel::test::allTiers(), zel::test::tierTestName);
 
 TEST(SubsampledSseKernels, WideYuvBlocksMatchTheWideForm) {
   agree(VectorTier::Sse41, 3, 3, 2, [&](const uint8_t* s, uint8_t* b, uint8_t* p, int w, VectorTier) {

@@ -121,6 +121,7 @@ std::vector<Member> members() {
       {"BGRToYCbCr420 709CSC C3P2R", packed(3), two420, encodeToTwoPlanes(zeliBGRToYCbCr420_709CSC_8u_C3P2R)},
       {"RGBToYUV420 C3P3R", packed(3), p420, encodeToPlanes(zeliRGBToYUV420_8u_C3P3R)},
       {"BGRToYUV420 AC4P3R", packed(4), p420, encodeToPlanes(zeliBGRToYUV420_8u_AC4P3R)},
+      {"RGBToYUV422 C3P3R", packed(3), p422, encodeToPlanes(zeliRGBToYUV422_8u_C3P3R)},
       {"BGRToYCbCr422 AC4P3R", packed(4), p422, encodeToPlanes(zeliBGRToYCbCr422_8u_AC4P3R)},
       {"BGRToYCbCr422 C3C2R", packed(3), pairs, packedToPacked(zeliBGRToYCbCr422_8u_C3C2R)},
       {"RGBToYCbCr422 C3C2R", packed(3), pairs, packedToPacked(zeliRGBToYCbCr422_8u_C3C2R)},

@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "luma_chroma/sub_to_rgb_drivers.h"
+#include "luma_chroma/tier_params.h"
 
 namespace {
 
@@ -102,14 +103,7 @@ void planeRowAgrees(const char* name, VectorTier tier, const Form& form) {
   });
 }
 
-// One pass for each vector tier; a tier that this processor lacks (or that
-// the cap of the tier excludes) is skipped.
-class SubsampledBlocks : public ::testing::TestWithParam<VectorTier> {
- protected:
-  void SetUp() override {
-    if (unitTier() < GetParam()) GTEST_SKIP() << "the processor lacks this vector tier";
-  }
-};
+using SubsampledBlocks = zel::test::TierTest;
 
 TEST_P(SubsampledBlocks, PairStreamsMatchTheScalarForms) {
   streamAgrees<PairOrder::YCbCr>("lanes 601b", GetParam(), LanesForm{lanes601b});
@@ -131,12 +125,6 @@ TEST_P(SubsampledBlocks, PlaneRowsMatchTheScalarForms) {
   planeRowAgrees<4>("411 lanes 601a", GetParam(), LanesForm{lanes601a});
 }
 
-INSTANTIATE_TEST_SUITE_P(Tiers, SubsampledBlocks,
-                         ::testing::Values(VectorTier::Sse41, VectorTier::Avx2, VectorTier::Avx512),
-                         [](const ::testing::TestParamInfo<VectorTier>& info) {
-                           return info.param == VectorTier::Sse41 ? "Sse41"
-                                  : info.param == VectorTier::Avx2 ? "Avx2"
-                                                                    : "Avx512";
-                         });
+INSTANTIATE_TEST_SUITE_P(Tiers, SubsampledBlocks, zel::test::allTiers(), zel::test::tierTestName);
 
 }  // namespace
