@@ -9,15 +9,9 @@
 #include <cstdint>
 
 #include "frame/simd.h"
+#include "luma_chroma/vector_units.h"
 
-// The 512-bit values stay inside the flattened kernels of their tier.
-#pragma GCC diagnostic ignored "-Wpsabi"
-
-// GCC 12 sees the undefined upper lanes of some 512-bit intrinsics as
-// uninitialised.
-#pragma GCC diagnostic push
-#pragma GCC diagnostic ignored "-Wuninitialized"
-#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
+ZEL_TIER512_BEGIN
 
 namespace zel::lc {
 
@@ -155,7 +149,7 @@ ZEL_AVX512_VBMI inline void split4(const uint8_t* q, __m512i out[3]) {
   const __m512i third = indexOf(kPermutes.split4Third);
   const __mmask64 upper = 0xFFFFFFFF00000000ull;
   out[0] = _mm512_mask_blend_epi8(upper, early, late);
-  out[1] = _mm512_shuffle_i64x2(early, late, 0x4E);
+  out[1] = middleLanes(early, late);
   out[2] = _mm512_mask_blend_epi8(upper, _mm512_permutex2var_epi8(a, third, b), _mm512_permutex2var_epi8(c, third, d));
 }
 
@@ -172,4 +166,4 @@ ZEL_AVX512_VBMI inline void merge4(uint8_t* q, __m512i p0, __m512i p1, __m512i p
 
 }  // namespace zel::lc
 
-#pragma GCC diagnostic pop
+ZEL_TIER512_END

@@ -5,9 +5,9 @@
 //
 // A body runs in vector blocks of 64 pixels (512-bit tier), then 32 (AVX2)
 // and 16, and its last pixels below N take the same form one block at a
-// time in scalar code. The
-// tail converts one chroma block at a time. Vector blocks read and write
-// exactly the bytes of their pixels and chroma samples.
+// time in scalar code. The tail converts one chroma block at a time.
+// Vector blocks read and write exactly the bytes of their pixels and chroma
+// samples.
 #pragma once
 
 #include <cstdint>

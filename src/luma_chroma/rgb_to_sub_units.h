@@ -97,11 +97,7 @@ constexpr HaddIndex makeHaddIndex() {
 }
 inline constexpr HaddIndex kHaddIndex = makeHaddIndex();
 
-// GCC 12 sees the undefined upper lanes of some 512-bit intrinsics as
-// uninitialised.
-#pragma GCC diagnostic push
-#pragma GCC diagnostic ignored "-Wuninitialized"
-#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
+ZEL_TIER512_BEGIN
 template <>
 struct More<Avx512> {
   using V = __m512i;
@@ -124,23 +120,23 @@ struct More<Avx512> {
   // gathered into one store, all high halves into another.
   ZEL_AVX512_VBMI static void storeHalves(uint8_t* lo, uint8_t* hi, int unitStride, V v) {
     if (unitStride == 8) {
-      const V q = _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7), v);
+      const V q = qwordsAt(v, _mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7));
       _mm256_storeu_si256(reinterpret_cast<__m256i*>(lo), _mm512_castsi512_si256(q));
-      _mm256_storeu_si256(reinterpret_cast<__m256i*>(hi), _mm512_extracti64x4_epi64(q, 1));
+      _mm256_storeu_si256(reinterpret_cast<__m256i*>(hi), half256<1>(q));
       return;
     }
-    for (int k = 0; k < 4; ++k)
-      More<Sse>::storeHalves(lo + k * unitStride, hi + k * unitStride, 0, _mm512_extracti32x4_epi32(v, k));
+    const __m128i units[4] = {_mm512_castsi512_si128(v), lane128<1>(v), lane128<2>(v), lane128<3>(v)};
+    for (int k = 0; k < 4; ++k) More<Sse>::storeHalves(lo + k * unitStride, hi + k * unitStride, 0, units[k]);
   }
   ZEL_AVX512_VBMI static void storeQuarters(uint8_t* lo, uint8_t* hi, int unitStride, V v) {
     if (unitStride == 4) {
-      const V q = _mm512_permutexvar_epi32(_mm512_setr_epi32(0, 4, 8, 12, 2, 6, 10, 14, 0, 0, 0, 0, 0, 0, 0, 0), v);
+      const V q = dwordsAt(v, _mm512_setr_epi32(0, 4, 8, 12, 2, 6, 10, 14, 0, 0, 0, 0, 0, 0, 0, 0));
       store128(lo, _mm512_castsi512_si128(q));
-      store128(hi, _mm512_extracti32x4_epi32(q, 1));
+      store128(hi, lane128<1>(q));
       return;
     }
-    for (int k = 0; k < 4; ++k)
-      More<Sse>::storeQuarters(lo + k * unitStride, hi + k * unitStride, 0, _mm512_extracti32x4_epi32(v, k));
+    const __m128i units[4] = {_mm512_castsi512_si128(v), lane128<1>(v), lane128<2>(v), lane128<3>(v)};
+    for (int k = 0; k < 4; ++k) More<Sse>::storeQuarters(lo + k * unitStride, hi + k * unitStride, 0, units[k]);
   }
   ZEL_AVX512_VBMI static V and_(V a, V b) { return _mm512_and_si512(a, b); }
   ZEL_AVX512_VBMI static V unpackLo32(V a, V b) { return _mm512_unpacklo_epi32(a, b); }
@@ -151,7 +147,7 @@ struct More<Avx512> {
   ZEL_AVX512_VBMI static V alignr(V hi, V lo) { return _mm512_alignr_epi8(hi, lo, N); }
 };
 
-#pragma GCC diagnostic pop
+ZEL_TIER512_END
 
 // Exact 32-bit a * ca + b * cb + c * cc + addend, arithmetic shift by
 // Shift, for 16-bit lanes a, b, c whose values lie in 0..32767 and signed

@@ -35,32 +35,28 @@ struct PartLoads<Sse> {
   static __m128i four(const uint8_t* p, int) { return load32(p); }
 };
 
-#pragma GCC diagnostic push
-#pragma GCC diagnostic ignored "-Wuninitialized"  // see vector_units.h
-#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
+ZEL_TIER512_BEGIN
 template <>
 struct PartLoads<Avx512> {
   // Units that follow each other: one load, each unit's part moved to the
   // low bytes of its lane.
   ZEL_AVX512_VBMI static __m512i eight(const uint8_t* p, int unitStride) {
     if (unitStride == 8)
-      return _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 0, 1, 1, 2, 2, 3, 3),
-                                      _mm512_castsi256_si512(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(p))));
-    __m512i v = _mm512_castsi128_si512(load64(p));
-    for (int k = 1; k < 4; ++k) v = _mm512_inserti32x4(v, load64(p + k * unitStride), k);
-    return v;
+      return qwordsAt(_mm512_castsi256_si512(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(p))),
+                      _mm512_setr_epi64(0, 0, 1, 1, 2, 2, 3, 3));
+    const __m512i v = _mm512_inserti32x4(_mm512_castsi128_si512(load64(p)), load64(p + unitStride), 1);
+    return _mm512_inserti32x4(_mm512_inserti32x4(v, load64(p + 2 * unitStride), 2), load64(p + 3 * unitStride), 3);
   }
   ZEL_AVX512_VBMI static __m512i four(const uint8_t* p, int unitStride) {
     if (unitStride == 4)
-      return _mm512_permutexvar_epi32(_mm512_setr_epi32(0, 0, 0, 0, 1, 1, 1, 1, 2, 2, 2, 2, 3, 3, 3, 3),
-                                      _mm512_castsi128_si512(load128(p)));
-    __m512i v = _mm512_castsi128_si512(load32(p));
-    for (int k = 1; k < 4; ++k) v = _mm512_inserti32x4(v, load32(p + k * unitStride), k);
-    return v;
+      return dwordsAt(_mm512_castsi128_si512(load128(p)),
+                      _mm512_setr_epi32(0, 0, 0, 0, 1, 1, 1, 1, 2, 2, 2, 2, 3, 3, 3, 3));
+    const __m512i v = _mm512_inserti32x4(_mm512_castsi128_si512(load32(p)), load32(p + unitStride), 1);
+    return _mm512_inserti32x4(_mm512_inserti32x4(v, load32(p + 2 * unitStride), 2), load32(p + 3 * unitStride), 3);
   }
 };
 
-#pragma GCC diagnostic pop
+ZEL_TIER512_END
 
 template <>
 struct PartLoads<Avx> {
@@ -258,9 +254,7 @@ struct StreamLoad<Avx, true> : StreamLoad<Avx, false> {
   ZEL_AVX2 static __m256i second(const uint8_t* q) { return _mm256_permute4x64_epi64(load256(q + 32), 0xD8); }
 };
 
-#pragma GCC diagnostic push
-#pragma GCC diagnostic ignored "-Wuninitialized"  // see vector_units.h
-#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
+ZEL_TIER512_BEGIN
 // 512-bit blocks of 64 pixels from two 64-byte loads. For the unit layout
 // lane L holds pixels 16L..16L+7 of the first vector and 16L+8..16L+15 of
 // the second (qwords 4L, 4L + 1 and 4L + 2, 4L + 3 of the 128 bytes). Flat:
@@ -284,13 +278,13 @@ struct StreamLoad<Avx512, false> {
 template <>
 struct StreamLoad<Avx512, true> : StreamLoad<Avx512, false> {
   ZEL_AVX512_VBMI static __m512i spread(const uint8_t* q) {
-    return _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 4, 1, 5, 2, 6, 3, 7), _mm512_loadu_si512(q));
+    return qwordsAt(_mm512_loadu_si512(q), _mm512_setr_epi64(0, 4, 1, 5, 2, 6, 3, 7));
   }
   ZEL_AVX512_VBMI static __m512i first(const uint8_t* q) { return spread(q); }
   ZEL_AVX512_VBMI static __m512i second(const uint8_t* q) { return spread(q + 64); }
 };
 
-#pragma GCC diagnostic pop
+ZEL_TIER512_END
 
 // Four-byte pixels of a flat block: registers of 8 pixels in memory order.
 template <bool Reverse>
@@ -306,9 +300,7 @@ ZEL_AVX2 inline void storeFlat(const PackedOutAlpha<Reverse>& out, int x, const 
   store256(q + 96, _mm256_unpackhi_epi16(hi01, hi23));
 }
 
-#pragma GCC diagnostic push
-#pragma GCC diagnostic ignored "-Wuninitialized"  // see vector_units.h
-#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
+ZEL_TIER512_BEGIN
 template <bool Reverse>
 ZEL_AVX512_VBMI inline void storeFlat(const PackedOutAlpha<Reverse>& out, int x, const Trio<Avx512>& v) {
   const __m512i first = Reverse ? v.c2 : v.c0, third = Reverse ? v.c0 : v.c2;
@@ -322,7 +314,7 @@ ZEL_AVX512_VBMI inline void storeFlat(const PackedOutAlpha<Reverse>& out, int x,
   _mm512_storeu_si512(q + 192, _mm512_unpackhi_epi16(hi01, hi23));
 }
 
-#pragma GCC diagnostic pop
+ZEL_TIER512_END
 
 template <class Out>
 struct FlatOut : std::false_type {};

@@ -136,11 +136,34 @@ struct Avx {
   ZEL_AVX2 static V packS32(V lo, V hi) { return _mm256_packs_epi32(lo, hi); }
 };
 
-// GCC 12 sees the undefined upper lanes of some 512-bit intrinsics as
-// uninitialised.
-#pragma GCC diagnostic push
-#pragma GCC diagnostic ignored "-Wuninitialized"
-#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
+// GCC 12 takes the undefined upper lanes that many 512-bit intrinsics start
+// from for uninitialised values; the code of the 512-bit tier sits between
+// these two marks, which silence that false warning.
+#define ZEL_TIER512_BEGIN \
+  _Pragma("GCC diagnostic push") _Pragma("GCC diagnostic ignored \"-Wuninitialized\"") \
+      _Pragma("GCC diagnostic ignored \"-Wmaybe-uninitialized\"")
+#define ZEL_TIER512_END _Pragma("GCC diagnostic pop")
+
+ZEL_TIER512_BEGIN
+
+// Moves of the 512-bit tier across lanes.
+// Qword (dword) k of the result is qword (dword) index[k] of v.
+ZEL_AVX512_VBMI inline __m512i qwordsAt(__m512i v, __m512i index) { return _mm512_permutexvar_epi64(index, v); }
+ZEL_AVX512_VBMI inline __m512i dwordsAt(__m512i v, __m512i index) { return _mm512_permutexvar_epi32(index, v); }
+// Lane K of v, and half K.
+template <int K>
+ZEL_AVX512_VBMI inline __m128i lane128(__m512i v) {
+  return _mm512_extracti32x4_epi32(v, K);
+}
+template <int K>
+ZEL_AVX512_VBMI inline __m256i half256(__m512i v) {
+  return _mm512_extracti64x4_epi64(v, K);
+}
+// Lanes 2, 3 of a and 0, 1 of b.
+ZEL_AVX512_VBMI inline __m512i middleLanes(__m512i a, __m512i b) { return _mm512_shuffle_i64x2(a, b, 0x4E); }
+// A 16-byte pattern in every lane.
+ZEL_AVX512_VBMI inline __m512i everyLane(__m128i v) { return _mm512_broadcast_i32x4(v); }
+
 struct Avx512 {
   using V = __m512i;
   static constexpr int kUnits = 4;
@@ -157,13 +180,16 @@ struct Avx512 {
   }
   ZEL_AVX512_VBMI static void storeUnits(void* p, int unitStride, V v) {
     auto* b = static_cast<uint8_t*>(p);
-    if (unitStride == 16) return _mm512_storeu_si512(p, v);
-    store128(b, _mm512_castsi512_si128(v));
-    store128(b + unitStride, _mm512_extracti32x4_epi32(v, 1));
-    store128(b + 2 * unitStride, _mm512_extracti32x4_epi32(v, 2));
-    store128(b + 3 * unitStride, _mm512_extracti32x4_epi32(v, 3));
+    if (unitStride == 16) {
+      _mm512_storeu_si512(p, v);
+    } else {
+      store128(b, _mm512_castsi512_si128(v));
+      store128(b + unitStride, lane128<1>(v));
+      store128(b + 2 * unitStride, lane128<2>(v));
+      store128(b + 3 * unitStride, lane128<3>(v));
+    }
   }
-  ZEL_AVX512_VBMI static V shuffleOf(const Shuffle16& s) { return _mm512_broadcast_i32x4(load128(s.b)); }
+  ZEL_AVX512_VBMI static V shuffleOf(const Shuffle16& s) { return everyLane(load128(s.b)); }
 
   ZEL_AVX512_VBMI static V zero() { return _mm512_setzero_si512(); }
   ZEL_AVX512_VBMI static V set16(int v) { return _mm512_set1_epi16(static_cast<int16_t>(v)); }
@@ -201,7 +227,7 @@ struct Avx512 {
   ZEL_AVX512_VBMI static V packS32(V lo, V hi) { return _mm512_packs_epi32(lo, hi); }
 };
 
-#pragma GCC diagnostic pop
+ZEL_TIER512_END
 
 // The widest unit the kernels may take on this processor (under the cap of
 // the vector tier): the 512-bit unit needs the byte permutes too.
