@@ -404,9 +404,13 @@ struct QuadSource<RgbSource<PackedIn<Stride>, Bgr>> : std::true_type {
 
 // One row, `Ratio` pixels (2 or 4) to a chroma sample.
 template <class U, int Ratio, class Body, class Src, class Out>
-ZEL_INLINE int rowBlocks(const Src& in, const Out& out, int x, int end, const Body& body) {
+ZEL_INLINE int rowBlocks(const Src& inRow, const Out& outRow, int x, int end, const Body& body) {
   using V = typename U::V;
   using M = More<U>;
+  // Local copies: the byte stores cannot alias them, so the row pointers
+  // stay in registers.
+  const Src in = inRow;
+  const Out out = outRow;
   for (; x + U::kPixels <= end; x += U::kPixels) {
     const Trio<U> s = in.template block<U>(x);
     const Wide16<U> r = widen<U>(s.c0), g = widen<U>(s.c1), b = widen<U>(s.c2);
@@ -435,12 +439,16 @@ ZEL_INLINE int rowBlocks(const Src& in, const Out& out, int x, int end, const Bo
 
 // A row pair of 4:2:0: chroma from the sums of 2 by 2 pixels.
 template <class U, class Body, class Src, class Out>
-ZEL_INLINE int pairBlocks(const Src& top, const Src& bottom, const Out& out, int x, int end, const Body& body) {
+ZEL_INLINE int pairBlocks(const Src& topRow, const Src& bottomRow, const Out& outRow, int x, int end,
+                          const Body& body) {
   using V = typename U::V;
   using M = More<U>;
   // The 512-bit tier splits pixels into planes by byte permutes instead.
   if constexpr (QuadSource<Src>::value && TakesQuads<Body>::value && !std::is_same_v<U, Avx512>)
-    return quadPairBlocks<U, QuadSource<Src>::kBgr>(top.in, bottom.in, out, x, end, body);
+    return quadPairBlocks<U, QuadSource<Src>::kBgr>(topRow.in, bottomRow.in, outRow, x, end, body);
+  // Local copies, as in rowBlocks.
+  const Src top = topRow, bottom = bottomRow;
+  const Out out = outRow;
   for (; x + U::kPixels <= end; x += U::kPixels) {
     const Trio<U> s0 = top.template block<U>(x), s1 = bottom.template block<U>(x);
     V y[2], st = U::zero();
