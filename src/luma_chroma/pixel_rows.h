@@ -12,6 +12,7 @@
 #include <cstring>
 #include <type_traits>
 
+#include "luma_chroma/pixel_permutes.h"
 #include "luma_chroma/vector_units.h"
 
 namespace zel::lc {
@@ -87,8 +88,15 @@ struct PackedIn {
   ZEL_INLINE Trio<U> block(int x) const {
     const uint8_t* q = p + Stride * x;
     typename U::V chunk[Stride];
-    for (int k = 0; k < Stride; ++k) chunk[k] = U::loadUnits(q + 16 * k, 16 * Stride);
-    if constexpr (Stride == 3) {
+    if constexpr (std::is_same_v<U, Avx512>) {
+      // The byte permutes split 64 pixels in memory order.
+      if constexpr (Stride == 3)
+        split3(q, chunk);
+      else
+        split4(q, chunk);
+      return {chunk[0], chunk[1], chunk[2]};
+    } else if constexpr (Stride == 3) {
+      for (int k = 0; k < 3; ++k) chunk[k] = U::loadUnits(q + 16 * k, 48);
       const RotatePatterns& r = kRotate3;
       typename U::V out[3];
       for (int c = 0; c < 3; ++c) {
@@ -98,6 +106,7 @@ struct PackedIn {
       }
       return {out[0], out[1], out[2]};
     } else {
+      for (int k = 0; k < Stride; ++k) chunk[k] = U::loadUnits(q + 16 * k, 16 * Stride);
       const GatherPatterns<Stride>& g = kGather<Stride>;
       typename U::V out[3];
       for (int c = 0; c < 3; ++c) {
@@ -140,14 +149,18 @@ struct PackedOut3 {
   template <class U>
   ZEL_INLINE void block(int x, const Trio<U>& v) const {
     const typename U::V ch[3] = {Reverse ? v.c2 : v.c0, v.c1, Reverse ? v.c0 : v.c2};
-    const RotatePatterns& r = kRotate3;
-    typename U::V turned[3];
-    for (int c = 0; c < 3; ++c) turned[c] = U::shuffle8(ch[c], U::shuffleOf(r.rotate[c]));
     uint8_t* q = p + 3 * x;
-    for (int k = 0; k < 3; ++k) {
-      const typename U::V o = U::blend8(U::blend8(turned[0], turned[1], U::shuffleOf(r.part[k][1])), turned[2],
-                                        U::shuffleOf(r.part[k][2]));
-      U::storeUnits(q + 16 * k, 48, o);
+    if constexpr (std::is_same_v<U, Avx512>) {
+      merge3(q, ch[0], ch[1], ch[2]);
+    } else {
+      const RotatePatterns& r = kRotate3;
+      typename U::V turned[3];
+      for (int c = 0; c < 3; ++c) turned[c] = U::shuffle8(ch[c], U::shuffleOf(r.rotate[c]));
+      for (int k = 0; k < 3; ++k) {
+        const typename U::V o = U::blend8(U::blend8(turned[0], turned[1], U::shuffleOf(r.part[k][1])), turned[2],
+                                          U::shuffleOf(r.part[k][2]));
+        U::storeUnits(q + 16 * k, 48, o);
+      }
     }
   }
 };
@@ -168,13 +181,17 @@ struct PackedOutAlpha {
   ZEL_INLINE void block(int x, const Trio<U>& v) const {
     const typename U::V first = Reverse ? v.c2 : v.c0, third = Reverse ? v.c0 : v.c2;
     const typename U::V a = U::set8(alpha);
-    const typename U::V lo01 = U::unpackLo8(first, v.c1), hi01 = U::unpackHi8(first, v.c1);
-    const typename U::V lo23 = U::unpackLo8(third, a), hi23 = U::unpackHi8(third, a);
     uint8_t* q = p + 4 * x;
-    U::storeUnits(q, 64, U::unpackLo16(lo01, lo23));
-    U::storeUnits(q + 16, 64, U::unpackHi16(lo01, lo23));
-    U::storeUnits(q + 32, 64, U::unpackLo16(hi01, hi23));
-    U::storeUnits(q + 48, 64, U::unpackHi16(hi01, hi23));
+    if constexpr (std::is_same_v<U, Avx512>) {
+      merge4(q, first, v.c1, third, a);
+    } else {
+      const typename U::V lo01 = U::unpackLo8(first, v.c1), hi01 = U::unpackHi8(first, v.c1);
+      const typename U::V lo23 = U::unpackLo8(third, a), hi23 = U::unpackHi8(third, a);
+      U::storeUnits(q, 64, U::unpackLo16(lo01, lo23));
+      U::storeUnits(q + 16, 64, U::unpackHi16(lo01, lo23));
+      U::storeUnits(q + 32, 64, U::unpackLo16(hi01, hi23));
+      U::storeUnits(q + 48, 64, U::unpackHi16(hi01, hi23));
+    }
   }
 };
 
