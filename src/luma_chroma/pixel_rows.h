@@ -70,6 +70,92 @@ template <int Stride>
 inline constexpr GatherPatterns<Stride> kGather = makeGather<Stride>();
 inline constexpr RotatePatterns kRotate3 = makeRotate();
 
+// ---- 64-pixel blocks (Avx512) ----
+
+// An Avx512 register holds the bytes of 64 pixels in lane-split order, the
+// order in which the byte pack of two vectors of 16-bit lanes leaves them:
+// byte m of 128-bit lane k is pixel 8k + m for m < 8 and pixel 32 + 8k + m - 8
+// for m >= 8. Widening within the lanes thus gives pixels 0..31 and 32..63 in
+// order, and packing returns to it. The rows move their bytes between memory
+// order and this one with byte permutes (VBMI).
+constexpr int splitPixel(int j) { return (j & 8 ? 32 : 0) + 8 * (j >> 4) + (j & 7); }
+constexpr int splitPosition(int p) { return 16 * ((p & 31) >> 3) + (p & 32 ? 8 : 0) + (p & 7); }
+
+struct alignas(64) Permute64 {
+  uint8_t b[64];
+};
+
+// Interleaved sources of Stride bytes a pixel (192 or 256 bytes a block):
+// index[c] is, for each position, the block byte that holds channel c of
+// its pixel; upper[c] marks the positions whose byte lies past the first 128.
+template <int Stride>
+struct SplitGather {
+  Permute64 index[3];
+  uint64_t upper[3];
+};
+template <int Stride>
+constexpr SplitGather<Stride> makeSplitGather() {
+  SplitGather<Stride> g{};
+  for (int c = 0; c < 3; ++c)
+    for (int j = 0; j < 64; ++j) {
+      const int at = Stride * splitPixel(j) + c;
+      g.index[c].b[j] = static_cast<uint8_t>(at);
+      if (at >= 128) g.upper[c] |= uint64_t(1) << j;
+    }
+  return g;
+}
+
+// Interleaved destinations of Stride bytes a pixel, 64 bytes at a time: for
+// part r, byte j takes the pixel at position index[r][j] of the channel that
+// its place names (plus 64 for the second channel, read from the second of
+// two tables); third[r] and fourth[r] mark the bytes of those channels.
+template <int Stride>
+struct SplitScatter {
+  Permute64 index[Stride];
+  uint64_t third[Stride], fourth[Stride];
+};
+template <int Stride>
+constexpr SplitScatter<Stride> makeSplitScatter() {
+  SplitScatter<Stride> s{};
+  for (int r = 0; r < Stride; ++r)
+    for (int j = 0; j < 64; ++j) {
+      const int at = 64 * r + j, channel = at % Stride;
+      s.index[r].b[j] = static_cast<uint8_t>(splitPosition(at / Stride) + (channel == 1 ? 64 : 0));
+      if (channel == 2) s.third[r] |= uint64_t(1) << j;
+      if (channel == 3) s.fourth[r] |= uint64_t(1) << j;
+    }
+  return s;
+}
+
+// Plane bytes to lane-split order and back.
+constexpr Permute64 makeOrder(bool toSplit) {
+  Permute64 o{};
+  for (int j = 0; j < 64; ++j) o.b[j] = static_cast<uint8_t>(toSplit ? splitPixel(j) : splitPosition(j));
+  return o;
+}
+
+template <int Stride>
+inline constexpr SplitGather<Stride> kSplitGather = makeSplitGather<Stride>();
+template <int Stride>
+inline constexpr SplitScatter<Stride> kSplitScatter = makeSplitScatter<Stride>();
+inline constexpr Permute64 kToSplit = makeOrder(true), kToMemory = makeOrder(false);
+
+ZEL_AVX512 inline __m512i permuteOf(const Permute64& p) { return _mm512_load_si512(p.b); }
+
+// Bytes of v at the positions that `index` names (the all-ones zero mask
+// keeps the compiler from seeing an undefined merge source).
+ZEL_AVX512_VBMI inline __m512i permuteBytes(__m512i index, __m512i v) {
+  return _mm512_maskz_permutexvar_epi8(~__mmask64(0), index, v);
+}
+
+// Four-byte pixels of one 64-byte part of an interleaved destination: the
+// first three channels placed, the fourth byte left to the caller.
+ZEL_AVX512_VBMI inline __m512i scatterPart(const SplitScatter<4>& s, int r, __m512i first, __m512i second,
+                                           __m512i third) {
+  const __m512i index = permuteOf(s.index[r]);
+  return _mm512_mask_permutexvar_epi8(_mm512_permutex2var_epi8(first, index, second), s.third[r], index, third);
+}
+
 // ---- sources ----
 
 // Interleaved pixels of Stride bytes (C3: 3, AC4: 4; a fourth byte is
@@ -107,6 +193,22 @@ struct PackedIn {
       return {out[0], out[1], out[2]};
     }
   }
+  ZEL_AVX512_VBMI ZEL_INLINE Trio<Avx512> block512(int x) const {
+    const uint8_t* q = p + Stride * x;
+    const SplitGather<Stride>& g = kSplitGather<Stride>;
+    __m512i chunk[Stride];
+    for (int k = 0; k < Stride; ++k) chunk[k] = _mm512_loadu_si512(q + 64 * k);
+    __m512i out[3];
+    for (int c = 0; c < 3; ++c) {
+      const __m512i index = permuteOf(g.index[c]);
+      const __m512i lower = _mm512_permutex2var_epi8(chunk[0], index, chunk[1]);
+      if constexpr (Stride == 3)
+        out[c] = _mm512_mask_permutexvar_epi8(lower, g.upper[c], index, chunk[2]);
+      else
+        out[c] = _mm512_mask_blend_epi8(g.upper[c], lower, _mm512_permutex2var_epi8(chunk[2], index, chunk[3]));
+    }
+    return {out[0], out[1], out[2]};
+  }
 };
 
 // Three planes at full resolution.
@@ -122,6 +224,12 @@ struct PlanesIn {
   template <class U>
   ZEL_INLINE Trio<U> block(int x) const {
     return {U::loadUnits(p0 + x, 16), U::loadUnits(p1 + x, 16), U::loadUnits(p2 + x, 16)};
+  }
+  ZEL_AVX512_VBMI ZEL_INLINE Trio<Avx512> block512(int x) const {
+    const __m512i order = permuteOf(kToSplit);
+    return {permuteBytes(order, _mm512_loadu_si512(p0 + x)),
+            permuteBytes(order, _mm512_loadu_si512(p1 + x)),
+            permuteBytes(order, _mm512_loadu_si512(p2 + x))};
   }
 };
 
@@ -150,6 +258,16 @@ struct PackedOut3 {
       U::storeUnits(q + 16 * k, 48, o);
     }
   }
+  ZEL_AVX512_VBMI ZEL_INLINE void block512(int x, const Trio<Avx512>& v) const {
+    const __m512i first = Reverse ? v.c2 : v.c0, third = Reverse ? v.c0 : v.c2;
+    const SplitScatter<3>& s = kSplitScatter<3>;
+    uint8_t* q = p + 3 * x;
+    for (int r = 0; r < 3; ++r) {
+      const __m512i index = permuteOf(s.index[r]);
+      const __m512i two = _mm512_permutex2var_epi8(first, index, v.c1);
+      _mm512_storeu_si512(q + 64 * r, _mm512_mask_permutexvar_epi8(two, s.third[r], index, third));
+    }
+  }
 };
 
 // Four-byte pixels whose fourth byte is the caller's alpha (C4).
@@ -175,6 +293,15 @@ struct PackedOutAlpha {
     U::storeUnits(q + 16, 64, U::unpackHi16(lo01, lo23));
     U::storeUnits(q + 32, 64, U::unpackLo16(hi01, hi23));
     U::storeUnits(q + 48, 64, U::unpackHi16(hi01, hi23));
+  }
+  ZEL_AVX512_VBMI ZEL_INLINE void block512(int x, const Trio<Avx512>& v) const {
+    const SplitScatter<4>& s = kSplitScatter<4>;
+    const __m512i a = _mm512_set1_epi8(static_cast<char>(alpha));
+    uint8_t* q = p + 4 * x;
+    for (int r = 0; r < 4; ++r) {
+      const __m512i rgb = scatterPart(s, r, Reverse ? v.c2 : v.c0, v.c1, Reverse ? v.c0 : v.c2);
+      _mm512_storeu_si512(q + 64 * r, _mm512_mask_blend_epi8(s.fourth[r], rgb, a));
+    }
   }
 };
 
@@ -202,6 +329,13 @@ struct PackedOutKeep {
     uint8_t* q = p + 4 * x;
     for (int i = 0; i < U::kPixels; ++i) std::memcpy(q + 4 * i, px + 4 * i, 3);
   }
+  // A masked store writes the three bytes of each pixel and no other.
+  ZEL_AVX512_VBMI ZEL_INLINE void block512(int x, const Trio<Avx512>& v) const {
+    const SplitScatter<4>& s = kSplitScatter<4>;
+    uint8_t* q = p + 4 * x;
+    for (int r = 0; r < 4; ++r)
+      _mm512_mask_storeu_epi8(q + 64 * r, ~s.fourth[r], scatterPart(s, r, v.c0, v.c1, v.c2));
+  }
 };
 
 struct PlanesOut {
@@ -219,6 +353,12 @@ struct PlanesOut {
     U::storeUnits(p1 + x, 16, v.c1);
     U::storeUnits(p2 + x, 16, v.c2);
   }
+  ZEL_AVX512_VBMI ZEL_INLINE void block512(int x, const Trio<Avx512>& v) const {
+    const __m512i order = permuteOf(kToMemory);
+    _mm512_storeu_si512(p0 + x, permuteBytes(order, v.c0));
+    _mm512_storeu_si512(p1 + x, permuteBytes(order, v.c1));
+    _mm512_storeu_si512(p2 + x, permuteBytes(order, v.c2));
+  }
 };
 
 // ---- the row converter ----
@@ -235,25 +375,37 @@ struct TakesBytes : std::false_type {};
 template <class Form>
 struct TakesBytes<Form, std::void_t<decltype(Form::kBytes)>> : std::bool_constant<Form::kBytes> {};
 
+// One block of bytes in, bytes out, by the form's own byte path or by its
+// 16-bit lanes on the two widened halves.
+template <class U, class Form>
+ZEL_INLINE Trio<U> formBlock(const Form& form, const Trio<U>& s) {
+  if constexpr (TakesBytes<Form>::value) {
+    return form.template bytes<U>(s);
+  } else {
+    const Wide16<U> a = widen<U>(s.c0), b = widen<U>(s.c1), c = widen<U>(s.c2);
+    const Trio<U> lo = form.template lanes<U>(Trio<U>{a.lo, b.lo, c.lo});
+    const Trio<U> hi = form.template lanes<U>(Trio<U>{a.hi, b.hi, c.hi});
+    return {U::packU8(lo.c0, hi.c0), U::packU8(lo.c1, hi.c1), U::packU8(lo.c2, hi.c2)};
+  }
+}
+
 template <class U, class In, class Out, class Form>
 ZEL_INLINE int formBlocks(const In& in, const Out& out, int x, int end, const Form& form) {
-  if constexpr (TakesBytes<Form>::value) {
-    for (; x + U::kPixels <= end; x += U::kPixels) out.template block<U>(x, form.template bytes<U>(in.template block<U>(x)));
-  } else {
-    for (; x + U::kPixels <= end; x += U::kPixels) {
-      const Trio<U> s = in.template block<U>(x);
-      const Wide16<U> a = widen<U>(s.c0), b = widen<U>(s.c1), c = widen<U>(s.c2);
-      const Trio<U> lo = form.template lanes<U>(Trio<U>{a.lo, b.lo, c.lo});
-      const Trio<U> hi = form.template lanes<U>(Trio<U>{a.hi, b.hi, c.hi});
-      out.template block<U>(x, Trio<U>{U::packU8(lo.c0, hi.c0), U::packU8(lo.c1, hi.c1), U::packU8(lo.c2, hi.c2)});
-    }
-  }
+  for (; x + U::kPixels <= end; x += U::kPixels) out.template block<U>(x, formBlock<U>(form, in.template block<U>(x)));
   return x;
 }
 
 template <class In, class Out, class Form>
-ZEL_AVX2 __attribute__((flatten)) int formBlocksAvx(const In& in, const Out& out, int end, const Form& form) {
-  return formBlocks<Avx>(in, out, 0, end, form);
+ZEL_AVX2 __attribute__((flatten)) int formBlocksAvx(const In& in, const Out& out, int x, int end, const Form& form) {
+  return formBlocks<Avx>(in, out, x, end, form);
+}
+
+// 64-pixel blocks from the start of the row.
+template <class In, class Out, class Form>
+ZEL_AVX512_VBMI __attribute__((flatten)) int formBlocks512(const In& in, const Out& out, int end, const Form& form) {
+  int x = 0;
+  for (; x + 64 <= end; x += 64) out.block512(x, formBlock<Avx512>(form, in.block512(x)));
+  return x;
 }
 
 template <class In, class Out, class Form>
@@ -267,14 +419,16 @@ inline void formPixels(const In& in, const Out& out, int x, int end, const Form&
 }
 
 // Pixels [0, bodyEnd) take the body form, [bodyEnd, width) the tail form.
-// Whole vector blocks of the body run in AVX2 (when `avx2`) and SSE4.1;
-// the body's last pixels take the same form one at a time.
+// Whole vector blocks of the body run at the widest unit that `tier` allows
+// (64 pixels, then 32, then 16); the body's last pixels take the same form
+// one at a time.
 template <class In, class Out, class Body, class Tail>
 inline void convertRow(const In& in, const Out& out, int width, int bodyEnd, const Body& body, const Tail& tail,
-                       bool avx2) {
+                       VectorTier tier) {
   int x = 0;
   if constexpr (Body::kVector) {
-    if (avx2) x = formBlocksAvx(in, out, bodyEnd, body);
+    if (tier >= VectorTier::Avx512) x = formBlocks512(in, out, bodyEnd, body);
+    if (tier >= VectorTier::Avx2) x = formBlocksAvx(in, out, x, bodyEnd, body);
     x = formBlocks<Sse>(in, out, x, bodyEnd, body);
   }
   formPixels(in, out, x, bodyEnd, body);

@@ -1,12 +1,15 @@
-// The vector operations of the luma-chroma kernels, written once for two
+// The vector operations of the luma-chroma kernels, written once for three
 // widths. A kernel is a template over one of these:
-//   Sse  one 128-bit register, one unit of 16 pixels;
-//   Avx  one 256-bit register, two units (lane 0 pixels 0..15, lane 1
-//        pixels 16..31), chosen at run time.
+//   Sse     one 128-bit register, one unit of 16 pixels;
+//   Avx     one 256-bit register, two units (lane 0 pixels 0..15, lane 1
+//           pixels 16..31), chosen at run time;
+//   Avx512  one 512-bit register of 64 pixels, chosen at run time when the
+//           processor has the byte permutes; its rows move bytes with those
+//           permutes (see pixel_rows.h for the order of its bytes).
 // Every operation works within a 128-bit lane, so the same kernel code
-// computes the same bits at both widths. Avx kernels are instantiated only
-// inside a ZEL_AVX2 function marked `flatten`, which pulls every operation
-// into the AVX2 code.
+// computes the same bits at every width. Avx and Avx512 kernels are
+// instantiated only inside a function of their target marked `flatten`,
+// which pulls every operation into that code.
 #pragma once
 
 #include <immintrin.h>
@@ -20,6 +23,15 @@
 #pragma GCC diagnostic ignored "-Wpsabi"
 
 namespace zel::lc {
+
+using zel::VectorTier;
+
+// The widest unit the row kernels of these families take on this processor
+// (under the tier cap): the 512-bit one needs the byte permutes too.
+inline VectorTier rowTier() {
+  if (hasAvx512Vbmi()) return VectorTier::Avx512;
+  return hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41;
+}
 
 // The scalar meaning of a 16-bit lane sum without saturation: it wraps.
 // With the luma-chroma constants no sum comes near the limit.
@@ -131,6 +143,50 @@ struct Avx {
   template <int N>
   ZEL_AVX2 static V sra32(V a) { return _mm256_srai_epi32(a, N); }
   ZEL_AVX2 static V packS32(V lo, V hi) { return _mm256_packs_epi32(lo, hi); }
+};
+
+struct Avx512 {
+  using V = __m512i;
+  static constexpr int kPixels = 64;
+
+  ZEL_AVX512 static V shuffleOf(const Shuffle16& s) { return _mm512_broadcast_i32x4(load128(s.b)); }
+
+  ZEL_AVX512 static V zero() { return _mm512_setzero_si512(); }
+  ZEL_AVX512 static V set16(int v) { return _mm512_set1_epi16(static_cast<int16_t>(v)); }
+  ZEL_AVX512 static V set8(int v) { return _mm512_set1_epi8(static_cast<int8_t>(v)); }
+  ZEL_AVX512 static V add16(V a, V b) { return _mm512_add_epi16(a, b); }
+  ZEL_AVX512 static V sub16(V a, V b) { return _mm512_sub_epi16(a, b); }
+  ZEL_AVX512 static V addSatS16(V a, V b) { return _mm512_adds_epi16(a, b); }
+  ZEL_AVX512 static V addSatU16(V a, V b) { return _mm512_adds_epu16(a, b); }
+  ZEL_AVX512 static V mulHighS16(V a, V b) { return _mm512_mulhi_epi16(a, b); }
+  ZEL_AVX512 static V mulHighU16(V a, V b) { return _mm512_mulhi_epu16(a, b); }
+  ZEL_AVX512 static V mulHighRound(V a, V b) { return _mm512_mulhrs_epi16(a, b); }
+  template <int N>
+  ZEL_AVX512 static V sra16(V a) { return _mm512_srai_epi16(a, N); }
+  template <int N>
+  ZEL_AVX512 static V srl16(V a) { return _mm512_srli_epi16(a, N); }
+  template <int N>
+  ZEL_AVX512 static V sll16(V a) { return _mm512_slli_epi16(a, N); }
+  ZEL_AVX512 static V or_(V a, V b) { return _mm512_or_si512(a, b); }
+  ZEL_AVX512 static V xor_(V a, V b) { return _mm512_xor_si512(a, b); }
+  ZEL_AVX512 static V blend8(V a, V b, V m) { return _mm512_mask_blend_epi8(_mm512_movepi8_mask(m), a, b); }
+  ZEL_AVX512 static V shuffle8(V a, V m) { return _mm512_shuffle_epi8(a, m); }
+  ZEL_AVX512 static V unpackLo8(V a, V b) { return _mm512_unpacklo_epi8(a, b); }
+  ZEL_AVX512 static V unpackHi8(V a, V b) { return _mm512_unpackhi_epi8(a, b); }
+  ZEL_AVX512 static V unpackLo16(V a, V b) { return _mm512_unpacklo_epi16(a, b); }
+  ZEL_AVX512 static V unpackHi16(V a, V b) { return _mm512_unpackhi_epi16(a, b); }
+  ZEL_AVX512 static V packU8(V lo, V hi) { return _mm512_packus_epi16(lo, hi); }
+  ZEL_AVX512 static V packS8(V lo, V hi) { return _mm512_packs_epi16(lo, hi); }
+  ZEL_AVX512 static V set32(int32_t v) { return _mm512_set1_epi32(v); }
+  ZEL_AVX512 static V mulLo16(V a, V b) { return _mm512_mullo_epi16(a, b); }
+  ZEL_AVX512 static V madd16(V a, V b) { return _mm512_madd_epi16(a, b); }
+  ZEL_AVX512 static V add32(V a, V b) { return _mm512_add_epi32(a, b); }
+  ZEL_AVX512 static V sub32(V a, V b) { return _mm512_sub_epi32(a, b); }
+  // The all-ones zero mask is the plain shift, without the undefined merge
+  // source that the unmasked form hands the compiler.
+  template <int N>
+  ZEL_AVX512 static V sra32(V a) { return _mm512_maskz_srai_epi32(__mmask16(~0u), a, N); }
+  ZEL_AVX512 static V packS32(V lo, V hi) { return _mm512_packs_epi32(lo, hi); }
 };
 
 // Three channels of a block: bytes (16 pixels a unit) or 16-bit lanes.
