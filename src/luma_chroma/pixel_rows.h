@@ -72,12 +72,11 @@ inline constexpr RotatePatterns kRotate3 = makeRotate();
 
 // ---- 64-pixel blocks (Avx512) ----
 
-// An Avx512 register holds the bytes of 64 pixels in lane-split order, the
-// order in which the byte pack of two vectors of 16-bit lanes leaves them:
-// byte m of 128-bit lane k is pixel 8k + m for m < 8 and pixel 32 + 8k + m - 8
-// for m >= 8. Widening within the lanes thus gives pixels 0..31 and 32..63 in
-// order, and packing returns to it. The rows move their bytes between memory
-// order and this one with byte permutes (VBMI).
+// The bytes of 64 converted pixels come in lane-split order, the order in
+// which the byte pack of two vectors of 16-bit lanes (pixels 0..31 and
+// 32..63) leaves them: byte m of 128-bit lane k is pixel 8k + m for m < 8 and
+// pixel 32 + 8k + m - 8 for m >= 8. The rows move bytes between memory order
+// and the lanes with byte permutes (VBMI).
 constexpr int splitPixel(int j) { return (j & 8 ? 32 : 0) + 8 * (j >> 4) + (j & 7); }
 constexpr int splitPosition(int p) { return 16 * ((p & 31) >> 3) + (p & 32 ? 8 : 0) + (p & 7); }
 
@@ -85,25 +84,31 @@ struct alignas(64) Permute64 {
   uint8_t b[64];
 };
 
-// Interleaved sources of Stride bytes a pixel (192 or 256 bytes a block):
-// index[c] is, for each position, the block byte that holds channel c of
-// its pixel; upper[c] marks the positions whose byte lies past the first 128.
+// Sources give the 64 pixels as two halves of 16-bit lanes, pixels 0..31
+// and 32..63 in order, each sample in the high byte of its lane (S << 8):
+// one zero-masked byte permute a half and channel. For interleaved pixels
+// of Stride bytes, half h reads two 64-byte parts of the block (the first
+// two, or the last two); index[h][c] names, in the high byte of lane w, the
+// byte of those 128 that holds channel c of pixel 32h + w. Planes take
+// index[h][0] from their 64 bytes.
 template <int Stride>
-struct SplitGather {
-  Permute64 index[3];
-  uint64_t upper[3];
+struct HighGather {
+  Permute64 index[2][3];
 };
 template <int Stride>
-constexpr SplitGather<Stride> makeSplitGather() {
-  SplitGather<Stride> g{};
-  for (int c = 0; c < 3; ++c)
-    for (int j = 0; j < 64; ++j) {
-      const int at = Stride * splitPixel(j) + c;
-      g.index[c].b[j] = static_cast<uint8_t>(at);
-      if (at >= 128) g.upper[c] |= uint64_t(1) << j;
-    }
+constexpr HighGather<Stride> makeHighGather() {
+  HighGather<Stride> g{};
+  for (int h = 0; h < 2; ++h)
+    for (int c = 0; c < 3; ++c)
+      for (int w = 0; w < 32; ++w)
+        g.index[h][c].b[2 * w + 1] = static_cast<uint8_t>(Stride * (32 * h + w) + c - (Stride > 1 ? 64 * (Stride - 2) * h : 0));
   return g;
 }
+inline constexpr uint64_t kHighBytes = 0xAAAAAAAAAAAAAAAAu;
+
+struct HighWords512 {
+  Trio<Avx512> lo, hi;
+};
 
 // Interleaved destinations of Stride bytes a pixel, 64 bytes at a time: for
 // part r, byte j takes the pixel at position index[r][j] of the channel that
@@ -127,18 +132,18 @@ constexpr SplitScatter<Stride> makeSplitScatter() {
   return s;
 }
 
-// Plane bytes to lane-split order and back.
-constexpr Permute64 makeOrder(bool toSplit) {
+// Plane bytes from lane-split order to memory order.
+constexpr Permute64 makeMemoryOrder() {
   Permute64 o{};
-  for (int j = 0; j < 64; ++j) o.b[j] = static_cast<uint8_t>(toSplit ? splitPixel(j) : splitPosition(j));
+  for (int j = 0; j < 64; ++j) o.b[j] = static_cast<uint8_t>(splitPosition(j));
   return o;
 }
 
 template <int Stride>
-inline constexpr SplitGather<Stride> kSplitGather = makeSplitGather<Stride>();
+inline constexpr HighGather<Stride> kHighGather = makeHighGather<Stride>();
 template <int Stride>
 inline constexpr SplitScatter<Stride> kSplitScatter = makeSplitScatter<Stride>();
-inline constexpr Permute64 kToSplit = makeOrder(true), kToMemory = makeOrder(false);
+inline constexpr Permute64 kToMemory = makeMemoryOrder();
 
 ZEL_AVX512 inline __m512i permuteOf(const Permute64& p) { return _mm512_load_si512(p.b); }
 
@@ -193,21 +198,17 @@ struct PackedIn {
       return {out[0], out[1], out[2]};
     }
   }
-  ZEL_AVX512_VBMI ZEL_INLINE Trio<Avx512> block512(int x) const {
+  ZEL_AVX512_VBMI ZEL_INLINE HighWords512 highWords512(int x) const {
     const uint8_t* q = p + Stride * x;
-    const SplitGather<Stride>& g = kSplitGather<Stride>;
+    const HighGather<Stride>& g = kHighGather<Stride>;
     __m512i chunk[Stride];
     for (int k = 0; k < Stride; ++k) chunk[k] = _mm512_loadu_si512(q + 64 * k);
-    __m512i out[3];
-    for (int c = 0; c < 3; ++c) {
-      const __m512i index = permuteOf(g.index[c]);
-      const __m512i lower = _mm512_permutex2var_epi8(chunk[0], index, chunk[1]);
-      if constexpr (Stride == 3)
-        out[c] = _mm512_mask_permutexvar_epi8(lower, g.upper[c], index, chunk[2]);
-      else
-        out[c] = _mm512_mask_blend_epi8(g.upper[c], lower, _mm512_permutex2var_epi8(chunk[2], index, chunk[3]));
-    }
-    return {out[0], out[1], out[2]};
+    __m512i out[2][3];
+    for (int h = 0; h < 2; ++h)
+      for (int c = 0; c < 3; ++c)
+        out[h][c] = _mm512_maskz_permutex2var_epi8(kHighBytes, chunk[h ? Stride - 2 : 0], permuteOf(g.index[h][c]),
+                                                   chunk[h ? Stride - 1 : 1]);
+    return {{out[0][0], out[0][1], out[0][2]}, {out[1][0], out[1][1], out[1][2]}};
   }
 };
 
@@ -225,11 +226,14 @@ struct PlanesIn {
   ZEL_INLINE Trio<U> block(int x) const {
     return {U::loadUnits(p0 + x, 16), U::loadUnits(p1 + x, 16), U::loadUnits(p2 + x, 16)};
   }
-  ZEL_AVX512_VBMI ZEL_INLINE Trio<Avx512> block512(int x) const {
-    const __m512i order = permuteOf(kToSplit);
-    return {permuteBytes(order, _mm512_loadu_si512(p0 + x)),
-            permuteBytes(order, _mm512_loadu_si512(p1 + x)),
-            permuteBytes(order, _mm512_loadu_si512(p2 + x))};
+  ZEL_AVX512_VBMI ZEL_INLINE HighWords512 highWords512(int x) const {
+    const HighGather<1>& g = kHighGather<1>;
+    const __m512i lo = permuteOf(g.index[0][0]), hi = permuteOf(g.index[1][0]);
+    const __m512i a = _mm512_loadu_si512(p0 + x), b = _mm512_loadu_si512(p1 + x), c = _mm512_loadu_si512(p2 + x);
+    return {{half(lo, a), half(lo, b), half(lo, c)}, {half(hi, a), half(hi, b), half(hi, c)}};
+  }
+  ZEL_AVX512_VBMI ZEL_INLINE static __m512i half(__m512i index, __m512i v) {
+    return _mm512_maskz_permutexvar_epi8(kHighBytes, index, v);
   }
 };
 
@@ -400,11 +404,45 @@ ZEL_AVX2 __attribute__((flatten)) int formBlocksAvx(const In& in, const Out& out
   return formBlocks<Avx>(in, out, x, end, form);
 }
 
+// A form may take samples in the high bytes of 16-bit lanes (S << 8), as
+// the 64-pixel blocks give them: `highLanes<U>` (kHighLanes) maps them to
+// lanes before SaturateU8, `highBytes<U>` (kHighBytes) maps both halves to
+// the bytes of the block. Other forms take the samples shifted down.
+template <class Form, class = void>
+struct TakesHighLanes : std::false_type {};
+template <class Form>
+struct TakesHighLanes<Form, std::void_t<decltype(Form::kHighLanes)>> : std::bool_constant<Form::kHighLanes> {};
+template <class Form, class = void>
+struct TakesHighBytes : std::false_type {};
+template <class Form>
+struct TakesHighBytes<Form, std::void_t<decltype(Form::kHighBytes)>> : std::bool_constant<Form::kHighBytes> {};
+
+template <class Form>
+ZEL_INLINE Trio<Avx512> formHighWords(const Form& form, const HighWords512& w) {
+  using U = Avx512;
+  if constexpr (TakesHighBytes<Form>::value) {
+    return form.template highBytes<U>(w.lo, w.hi);
+  } else {
+    Trio<U> lo, hi;
+    if constexpr (TakesHighLanes<Form>::value) {
+      lo = form.template highLanes<U>(w.lo);
+      hi = form.template highLanes<U>(w.hi);
+    } else {
+      auto down = [](const Trio<U>& t) ZEL_LAMBDA_INLINE {
+        return Trio<U>{U::template srl16<8>(t.c0), U::template srl16<8>(t.c1), U::template srl16<8>(t.c2)};
+      };
+      lo = form.template lanes<U>(down(w.lo));
+      hi = form.template lanes<U>(down(w.hi));
+    }
+    return {U::packU8(lo.c0, hi.c0), U::packU8(lo.c1, hi.c1), U::packU8(lo.c2, hi.c2)};
+  }
+}
+
 // 64-pixel blocks from the start of the row.
 template <class In, class Out, class Form>
 ZEL_AVX512_VBMI __attribute__((flatten)) int formBlocks512(const In& in, const Out& out, int end, const Form& form) {
   int x = 0;
-  for (; x + 64 <= end; x += 64) out.block512(x, formBlock<Avx512>(form, in.block512(x)));
+  for (; x + 64 <= end; x += 64) out.block512(x, formHighWords(form, in.highWords512(x)));
   return x;
 }
 

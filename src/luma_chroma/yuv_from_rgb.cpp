@@ -36,7 +36,14 @@ struct MatrixBytes {
   template <class U>
   ZEL_INLINE Trio<U> bytes(const Trio<U>& rgb) const {
     const Wide16<U> r = widenHigh<U>(rgb.c0), g = widenHigh<U>(rgb.c1), b = widenHigh<U>(rgb.c2);
-    const Trio<U> lo = half<U>(r.lo, g.lo, b.lo), hi = half<U>(r.hi, g.hi, b.hi);
+    return highBytes<U>({r.lo, g.lo, b.lo}, {r.hi, g.hi, b.hi});
+  }
+
+  // Two halves of samples already in the high bytes of the lanes.
+  static constexpr bool kHighBytes = true;
+  template <class U>
+  ZEL_INLINE Trio<U> highBytes(const Trio<U>& lo8, const Trio<U>& hi8) const {
+    const Trio<U> lo = half<U>(lo8.c0, lo8.c1, lo8.c2), hi = half<U>(hi8.c0, hi8.c1, hi8.c2);
     const typename U::V top = U::set8(0x80);
     return {U::packU8(lo.c0, hi.c0), U::xor_(U::packS8(lo.c1, hi.c1), top), U::xor_(U::packS8(lo.c2, hi.c2), top)};
   }

@@ -13,28 +13,43 @@ namespace {
 
 struct Lanes1 {
   static constexpr bool kVector = true;
+  static constexpr bool kHighLanes = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(rgbLanes1(s.c0, s.c1, s.c2)); }
   template <class U>
   ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     return rgbLanes1<U>(s);
   }
+  template <class U>
+  ZEL_INLINE Trio<U> highLanes(const Trio<U>& s8) const {
+    return rgbLanes1High<U>(s8);
+  }
 };
 
 struct Lanes2 {
   static constexpr bool kVector = true;
+  static constexpr bool kHighLanes = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(rgbLanes2(s.c0, s.c1, s.c2)); }
   template <class U>
   ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     return rgbLanes2<U>(s);
   }
+  template <class U>
+  ZEL_INLINE Trio<U> highLanes(const Trio<U>& s8) const {
+    return rgbLanes2High<U>(s8);
+  }
 };
 
 struct Lanes3 {
   static constexpr bool kVector = true;
+  static constexpr bool kHighLanes = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(rgbLanes3(s.c0, s.c1, s.c2)); }
   template <class U>
   ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     return rgbLanes3<U>(s);
+  }
+  template <class U>
+  ZEL_INLINE Trio<U> highLanes(const Trio<U>& s8) const {
+    return rgbLanes3High<U>(s8);
   }
 };
 
