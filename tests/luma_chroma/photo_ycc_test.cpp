@@ -9,6 +9,7 @@
 #include <functional>
 #include <limits>
 
+#include "core/zelcore.h"
 #include "frame/image_layout.h"
 #include "luma_chroma/photo_ycc_forms.h"
 #include "luma_chroma/photo_ycc_kernels.h"
@@ -312,6 +313,35 @@ TEST(PhotoYccMembers, EightBitEveryWidth) { checkMembers(eightBitMembers()); }
 TEST(PhotoYccMembers, UnsignedSixteenBitEveryWidth) { checkMembers(unsignedMembers()); }
 TEST(PhotoYccMembers, SignedSixteenBitEveryWidth) { checkMembers(signedMembers()); }
 TEST(PhotoYccMembers, FloatEveryWidth) { checkMembers(floatMembers()); }
+
+// A three-channel float frame of more than a mebibyte, against a cache of one
+// mebibyte, streams its output: rows at addresses that reach the vector
+// alignment after a few pixels and rows off the float grid, every sample by
+// its formula, the padding and guards untouched.
+TEST(PhotoYccMembers, FloatFramesBeyondTheCacheStreamTheSameBits) {
+  const int width = 301, height = 150;  // 1.08 MB read and written
+  zelTestOverrideCacheSize(0, 1 << 20);
+  EXPECT_TRUE(zel::streamsBeyondCache(int64_t(width) * height * 24));
+  const std::vector<Member<float>> members = floatMembers();
+  for (int k : {0, 2}) {  // the C3 members
+    const Member<float>& m = members[size_t(k)];
+    for (int offset : {0, 4, 3}) {
+      TestImage<float> src(width * 3, height, offset, 8), dst(width * 3, height, offset + 8, 20);
+      src.fillRandom(uint32_t(k * 10 + offset), -0.2, 1.2);
+      ASSERT_EQ(m.run(src.data(), src.step(), dst.data(), dst.step(), ImageSize{width, height}), StatusOk);
+      for (int y = 0; y < height; ++y)
+        for (int x = 0; x < width; ++x) {
+          const float px[3] = {src.get(3 * x, y), src.get(3 * x + 1, y), src.get(3 * x + 2, y)};
+          const std::array<float, 3> want = m.expected(px, x, width);
+          for (int c = 0; c < 3; ++c)
+            ASSERT_TRUE(sameBits(dst.get(3 * x + c, y), want[c]))
+                << m.name << " offset " << offset << " pixel " << x << "," << y << " channel " << c;
+        }
+      ASSERT_TRUE(dst.guardsIntact()) << m.name << " offset " << offset;
+    }
+  }
+  zelTestOverrideCacheSize(-1, 0);
+}
 
 TEST(PhotoYccMembers, UnevenStepsLoseTheirLowBits) {
   // A step one byte past the rows' true distance walks the same rows as the

@@ -141,6 +141,32 @@ void everyTripleMatches(const Form& form) {
   }
 }
 
+// A form that gives back its samples: the 64-pixel blocks through it must
+// return every byte to its own pixel and channel, whatever the layouts.
+struct SameSamples {
+  static constexpr bool kVector = true;
+  Samples3 pixel(const Samples3& s) const { return s; }
+  template <class U>
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
+    return s;
+  }
+};
+
+TEST(YCbCrKernels, Blocks512MoveEveryByteToItsPixel) {
+  if (!zel::hasAvx512Vbmi()) GTEST_SKIP() << "no 512-bit tier with byte permutes";
+  const std::vector<VectorTier> wide{VectorTier::Avx512};
+  const SameSamples same;
+  kernelMatchesScalar(same, 3, 3, packedIn<3>, packedOut<false>, wide);
+  kernelMatchesScalar(same, 3, 3, packedIn<3>, packedOut<true>, wide);
+  kernelMatchesScalar(same, 3, 3, packedIn<3>, planesOut, wide);
+  kernelMatchesScalar(same, 4, 3, packedIn<4>, planesOut, wide);
+  kernelMatchesScalar(same, 3, 3, planesIn, planesOut, wide);
+  kernelMatchesScalar(same, 3, 3, planesIn, packedOut<true>, wide);
+  kernelMatchesScalar(same, 3, 4, planesIn, alphaOut<false>, wide);
+  kernelMatchesScalar(same, 3, 4, planesIn, alphaOut<true>, wide);
+  kernelMatchesScalar(same, 4, 4, packedIn<4>, [](uint8_t* p, int) { return PackedOutKeep{p}; }, wide);
+}
+
 TEST(YCbCrKernels, ByteFormsGiveTheLaneFormForEverySample) {
   everyTripleMatches(LaneAddedBytes<lanes601a, 8>{});
   everyTripleMatches(LaneAddedBytes<lanes601a, 0>{});

@@ -235,6 +235,30 @@ TEST(YuvMembers, PixelsWhoseZoneShows) {
 
 namespace {
 
+// The lane bodies of the interleaved YUV-to-RGB members, on every tier: the
+// 64-pixel blocks take their samples in the high bytes of the lanes and
+// shift them down their own way; every sample triple gives the lane form's
+// bits. Rows of every Y at each U and V.
+TEST(YuvMembers, LaneBodiesGiveTheLaneFormForEverySample) {
+  std::vector<uint8_t> src(3 * 256), out3(3 * 256), out4(4 * 256), want3(3 * 256), want4(4 * 256);
+  for (int u = 0; u < 256; ++u)
+    for (int v = 0; v < 256; ++v) {
+      for (int y = 0; y < 256; ++y) {
+        src[3 * y] = uint8_t(y);
+        src[3 * y + 1] = uint8_t(u);
+        src[3 * y + 2] = uint8_t(v);
+        const Pixel8 a = rgbLanes1(y, u, v), b = rgbLanes3(y, u, v);
+        want3[3 * y] = a.c0, want3[3 * y + 1] = a.c1, want3[3 * y + 2] = a.c2;
+        want4[4 * y] = b.c0, want4[4 * y + 1] = b.c1, want4[4 * y + 2] = b.c2, want4[4 * y + 3] = 7;
+      }
+      for (VectorTier tier : zel::lc::test::rowTiers()) {
+        yuvToRgbC3Row(src.data(), out3.data(), 256, tier);
+        yuvToRgbC3C4Row(src.data(), out4.data(), 256, 7, tier);
+        ASSERT_TRUE(out3 == want3 && out4 == want4) << "U " << u << " V " << v << " " << zel::lc::test::tierName(tier);
+      }
+    }
+}
+
 // The matrix body regroups the lane form's shifts and its final clamp; every
 // sample triple takes the lane form's bits. Rows of every R at each G and B.
 TEST(YuvMembers, MatrixBodyGivesTheLaneFormForEverySample) {
