@@ -11,15 +11,15 @@
 namespace zel::lc {
 
 // 8 bits: a body of 16-bit lanes below width AND NOT 7 (three channels) or
-// width AND NOT 3 (four), then the 32-bit tail.
+// width AND NOT 3 (four), then the 32-bit tail; `tier` at most rowTier().
 template <int Channels>
 void rgbToYcc8uRow(const uint8_t* src, uint8_t* dst, int width, VectorTier tier);
 template <int Channels>
 void yccToRgb8uRow(const uint8_t* src, uint8_t* dst, int width, VectorTier tier);
 
 // 16 bits, unsigned or signed: a float body below width AND NOT 3, then the
-// tail of the sample type. The body takes the widest blocks that `tier`
-// allows (16, 8, then 4 pixels).
+// tail of the sample type. The body takes the widest blocks that `tier` (at
+// most floatTier()) allows: 16, 8, then 4 pixels.
 template <int Channels, bool Signed>
 void rgbToYcc16Row(const uint16_t* src, uint16_t* dst, int width, VectorTier tier);
 template <int Channels, bool Signed>

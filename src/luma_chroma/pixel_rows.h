@@ -77,7 +77,6 @@ inline constexpr RotatePatterns kRotate3 = makeRotate();
 // 32..63) leaves them: byte m of 128-bit lane k is pixel 8k + m for m < 8 and
 // pixel 32 + 8k + m - 8 for m >= 8. The rows move bytes between memory order
 // and the lanes with byte permutes (VBMI).
-constexpr int splitPixel(int j) { return (j & 8 ? 32 : 0) + 8 * (j >> 4) + (j & 7); }
 constexpr int splitPosition(int p) { return 16 * ((p & 31) >> 3) + (p & 32 ? 8 : 0) + (p & 7); }
 
 struct alignas(64) Permute64 {
@@ -100,8 +99,10 @@ constexpr HighGather<Stride> makeHighGather() {
   HighGather<Stride> g{};
   for (int h = 0; h < 2; ++h)
     for (int c = 0; c < 3; ++c)
-      for (int w = 0; w < 32; ++w)
-        g.index[h][c].b[2 * w + 1] = static_cast<uint8_t>(Stride * (32 * h + w) + c - (Stride > 1 ? 64 * (Stride - 2) * h : 0));
+      for (int w = 0; w < 32; ++w) {
+        const int first = Stride > 1 ? 64 * (Stride - 2) * h : 0;  // the half's first byte
+        g.index[h][c].b[2 * w + 1] = static_cast<uint8_t>(Stride * (32 * h + w) + c - first);
+      }
   return g;
 }
 inline constexpr uint64_t kHighBytes = 0xAAAAAAAAAAAAAAAAu;

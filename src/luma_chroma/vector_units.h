@@ -149,8 +149,6 @@ struct Avx512 {
   using V = __m512i;
   static constexpr int kPixels = 64;
 
-  ZEL_AVX512 static V shuffleOf(const Shuffle16& s) { return _mm512_broadcast_i32x4(load128(s.b)); }
-
   ZEL_AVX512 static V zero() { return _mm512_setzero_si512(); }
   ZEL_AVX512 static V set16(int v) { return _mm512_set1_epi16(static_cast<int16_t>(v)); }
   ZEL_AVX512 static V set8(int v) { return _mm512_set1_epi8(static_cast<int8_t>(v)); }
@@ -169,8 +167,6 @@ struct Avx512 {
   ZEL_AVX512 static V sll16(V a) { return _mm512_slli_epi16(a, N); }
   ZEL_AVX512 static V or_(V a, V b) { return _mm512_or_si512(a, b); }
   ZEL_AVX512 static V xor_(V a, V b) { return _mm512_xor_si512(a, b); }
-  ZEL_AVX512 static V blend8(V a, V b, V m) { return _mm512_mask_blend_epi8(_mm512_movepi8_mask(m), a, b); }
-  ZEL_AVX512 static V shuffle8(V a, V m) { return _mm512_shuffle_epi8(a, m); }
   ZEL_AVX512 static V unpackLo8(V a, V b) { return _mm512_unpacklo_epi8(a, b); }
   ZEL_AVX512 static V unpackHi8(V a, V b) { return _mm512_unpackhi_epi8(a, b); }
   ZEL_AVX512 static V unpackLo16(V a, V b) { return _mm512_unpacklo_epi16(a, b); }
