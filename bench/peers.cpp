@@ -2,6 +2,9 @@
 
 #include <algorithm>
 #include <cstring>
+#include <iterator>
+
+#include <immintrin.h>
 #include <map>
 #include <memory>
 
@@ -542,6 +545,34 @@ Peer memcpyPeer(size_t bytes) {
   auto src = std::make_shared<std::vector<uint8_t>>(frameBytes(bytes));
   auto dst = std::make_shared<std::vector<uint8_t>>(bytes);
   return {"memcpy of the output bytes", [src, dst] { std::memcpy(dst->data(), src->data(), dst->size()); }};
+}
+
+Peer streamingMemcpyPeer(size_t bytes) {
+  auto src = std::make_shared<std::vector<uint8_t>>(frameBytes(bytes + 64));
+  auto dst = std::make_shared<std::vector<uint8_t>>(bytes + 64);
+  return {"memcpy with streaming stores", [src, dst, bytes] {
+            // From the first 16-byte boundary of both buffers, like the exports' aligned rows.
+            auto align = [](uint8_t* p) { return p + ((16 - reinterpret_cast<uintptr_t>(p) % 16) % 16); };
+            const uint8_t* s = align(src->data());
+            uint8_t* d = align(dst->data());
+            size_t i = 0;
+            for (; i + 64 <= bytes; i += 64)
+              for (int k = 0; k < 64; k += 16)
+                _mm_stream_si128(reinterpret_cast<__m128i*>(d + i + k),
+                                 _mm_load_si128(reinterpret_cast<const __m128i*>(s + i + k)));
+            std::memcpy(d + i, s + i, bytes - i);
+            _mm_sfence();
+          }};
+}
+
+bool streamsItsOutput(const std::string& exportName) {
+  // The repacking members whose kernels stream aligned destinations of large frames.
+  static const char* const kStreaming[] = {
+      "zeliYCbCr411ToYCbCr422_8u_P2C2R", "zeliYCbCr411ToYCbCr422_8u_P3C2R", "zeliYCbCr411ToYCrCb422_8u_P3C2R",
+      "zeliYCbCr422ToCbYCr422_8u_C2R",   "zeliYCbCr422ToYCbCr411_8u_C2P2R", "zeliYCbCr422ToYCrCb422_8u_C2R",
+      "zeliYCbCr422ToYCrCb422_8u_P3C2R", "zeliYCrCb420ToCbYCr422_8u_P3C2R"};
+  return std::any_of(std::begin(kStreaming), std::end(kStreaming),
+                     [&](const char* n) { return exportName == n; });
 }
 
 std::vector<Peer> peersOf(const std::string& exportName) {

@@ -20,6 +20,11 @@ struct Peer {
 std::vector<Peer> peersOf(const std::string& exportName);
 // A copy of `bytes` bytes: the floor any conversion writing them pays.
 Peer memcpyPeer(size_t bytes);
+// The same copy with streaming stores, the floor of the exports whose large
+// frames stream their output past the cache.
+Peer streamingMemcpyPeer(size_t bytes);
+// Whether an export streams its output on a 1920x1080 frame.
+bool streamsItsOutput(const std::string& exportName);
 // Exports that have at least one peer.
 std::vector<std::string> exportsWithPeers();
 

@@ -6,6 +6,7 @@
 
 #include <immintrin.h>
 
+#include <atomic>
 #include <cstdint>
 
 #define ZEL_AVX2 __attribute__((target("avx2")))
@@ -29,7 +30,15 @@ namespace zel {
 // compare them).
 enum class VectorTier { Sse41 = 0, Avx2 = 1, Avx512 = 2 };
 void setVectorTierCap(VectorTier cap);
-VectorTier vectorTierCap();
+// The cap before its first reading is kUnreadTier; row kernels ask for it
+// per row, so the common case is one load.
+constexpr int kUnreadTier = -1;
+inline std::atomic<int> gVectorTierCap{kUnreadTier};
+VectorTier readVectorTierCap();
+inline VectorTier vectorTierCap() {
+  const int cap = gVectorTierCap.load(std::memory_order_relaxed);
+  return cap == kUnreadTier ? readVectorTierCap() : VectorTier(cap);
+}
 
 inline bool hasAvx2() { return vectorTierCap() >= VectorTier::Avx2 && __builtin_cpu_supports("avx2"); }
 inline bool hasAvx512() {

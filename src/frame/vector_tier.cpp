@@ -1,7 +1,6 @@
 // The cap on the vector tier. It starts from the environment variable
 // ZELCC_MAX_TIER (sse41, avx2 or avx512; unset means no cap), so that a
 // user or a benchmark can compare the tiers of one build on one machine.
-#include <atomic>
 #include <cstdlib>
 #include <cstring>
 
@@ -10,9 +9,6 @@
 namespace zel {
 
 namespace {
-
-constexpr int kUnread = -1;
-std::atomic<int> gCap{kUnread};
 
 int capFromEnvironment() {
   const char* v = std::getenv("ZELCC_MAX_TIER");
@@ -24,14 +20,11 @@ int capFromEnvironment() {
 
 }  // namespace
 
-void setVectorTierCap(VectorTier cap) { gCap.store(int(cap), std::memory_order_relaxed); }
+void setVectorTierCap(VectorTier cap) { gVectorTierCap.store(int(cap), std::memory_order_relaxed); }
 
-VectorTier vectorTierCap() {
-  int cap = gCap.load(std::memory_order_relaxed);
-  if (cap == kUnread) {
-    cap = capFromEnvironment();
-    gCap.store(cap, std::memory_order_relaxed);
-  }
+VectorTier readVectorTierCap() {
+  const int cap = capFromEnvironment();
+  gVectorTierCap.store(cap, std::memory_order_relaxed);
   return VectorTier(cap);
 }
 

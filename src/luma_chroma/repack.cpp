@@ -109,6 +109,20 @@ void unpackPairs(const Member& m, const Side& src, const Side& dst, int width, i
 // (shared by two rows in 4:2:0) and weaves it with luma in one pass.
 void packPairs(const Member& m, const Side& src, const Side& dst, int width, int height, bool nonTemporal) {
   const PairOrder o = m.dst.order;
+  // 4:2:2 planes whose rows follow each other without a gap, in every plane
+  // and in the pair stream, weave as one long row.
+  const bool planes422 = m.src.scheme == Scheme::S422 && m.src.kind == Kind::Planes;
+  if (planes422 && width % 2 == 0 && src.step[0] == width && src.step[1] == width / 2 && src.step[2] == width / 2 &&
+      dst.step[0] == 2 * width && int64_t(width) * height <= kLongestRow) {
+    mergePairs(src.p[0], src.p[1], src.p[2], o, dst.p[0], width * height, nonTemporal);
+    return;
+  }
+  if (m.src.kind == Kind::Planes && m.src.scheme != Scheme::S411) {
+    const PairRows rows{src.p[0],    src.p[1],    src.p[2], src.step[0], src.step[1], src.step[2],
+                        m.src.scheme == Scheme::S420 ? 2 : 1, dst.p[0], dst.step[0]};
+    mergePairRows(rows, o, width, height, nonTemporal);
+    return;
+  }
   for (int y = 0; y < height; ++y) {
     const uint8_t* luma = at(src, 0, y, 0);
     uint8_t* out = at(dst, 0, y, 0);

@@ -3,6 +3,7 @@
 #include <array>
 #include <cstring>
 
+#include "frame/image_layout.h"
 #include "frame/simd.h"
 
 namespace zel::repack {
@@ -76,8 +77,8 @@ ZEL_AVX2 int splitPairsAvx(const uint8_t* in, PairOrder o, uint8_t* y, uint8_t* 
   return x;
 }
 
-ZEL_AVX2 int mergePairsAvx(const uint8_t* y, const uint8_t* cb, const uint8_t* cr, PairOrder o, uint8_t* out,
-                           int pixels, bool nonTemporal) {
+ZEL_AVX2 ZEL_INLINE int mergePairBlocks(const uint8_t* y, const uint8_t* cb, const uint8_t* cr, PairOrder o,
+                                        uint8_t* out, int pixels, bool nonTemporal) {
   const __m256i s = _mm256_broadcastsi128_si256(maskOf(kScatter[int(o)]));
   int x = 0;
   for (; x + 32 <= pixels; x += 32) {
@@ -91,6 +92,10 @@ ZEL_AVX2 int mergePairsAvx(const uint8_t* y, const uint8_t* cb, const uint8_t* c
     put256(out + 2 * x + 32, _mm256_permute2x128_si256(a, b, 0x31), nonTemporal);
   }
   return x;
+}
+ZEL_AVX2 int mergePairsAvx(const uint8_t* y, const uint8_t* cb, const uint8_t* cr, PairOrder o, uint8_t* out,
+                           int pixels, bool nonTemporal) {
+  return mergePairBlocks(y, cb, cr, o, out, pixels, nonTemporal);
 }
 
 ZEL_AVX2 int zipAvx(const uint8_t* a, const uint8_t* b, uint8_t* out, int n, bool nonTemporal) {
@@ -420,10 +425,12 @@ void splitPairs(const uint8_t* in, PairOrder o, uint8_t* y, uint8_t* cb, uint8_t
   for (; x < pixels; x += 2) splitPair(in + 2 * x, o, y + x, cb + x / 2, cr + x / 2);
 }
 
-void mergePairs(const uint8_t* y, const uint8_t* cb, const uint8_t* cr, PairOrder o, uint8_t* out, int pixels,
-                bool nonTemporal) {
+namespace {
+
+// The rest of a woven row from pixel x (a multiple of 16).
+void mergePairsFrom(int x, const uint8_t* y, const uint8_t* cb, const uint8_t* cr, PairOrder o, uint8_t* out,
+                    int pixels, bool nonTemporal) {
   const __m128i s = maskOf(kScatter[int(o)]);
-  int x = hasAvx2() ? mergePairsAvx(y, cb, cr, o, out, pixels, nonTemporal) : 0;
   for (; x + 16 <= pixels; x += 16) {
     const __m128i luma = load128(y + x);
     const __m128i chroma = _mm_unpacklo_epi32(load64(cb + x / 2), load64(cr + x / 2));  // Cb0-3 Cr0-3 Cb4-7 Cr4-7
@@ -431,6 +438,48 @@ void mergePairs(const uint8_t* y, const uint8_t* cb, const uint8_t* cr, PairOrde
     put(out + 2 * x + 16, _mm_shuffle_epi8(_mm_unpackhi_epi64(luma, chroma), s), nonTemporal);
   }
   for (; x < pixels; x += 2) mergePair(y + x, cb[x / 2], cr[x / 2], o, out + 2 * x);
+}
+
+// Rows at a few nanoseconds each are worth a walk inside the vector code.
+struct PairRow {
+  const uint8_t *y, *cb, *cr;
+  uint8_t* out;
+};
+inline PairRow pairRow(const PairRows& r, int row) {
+  const int c = row / r.lumaRowsPerChromaRow;
+  return {rowAt(r.y, r.yStep, row), rowAt(r.cb, r.cbStep, c), rowAt(r.cr, r.crStep, c), rowAt(r.out, r.outStep, row)};
+}
+// The store kind is a constant of each loop.
+template <bool NonTemporal>
+ZEL_AVX2 void mergePairRowsAvx(const PairRows& r, PairOrder o, int width, int height) {
+  for (int row = 0; row < height; ++row) {
+    const PairRow p = pairRow(r, row);
+    const int x = mergePairBlocks(p.y, p.cb, p.cr, o, p.out, width, NonTemporal);
+    if (x < width) mergePairsFrom(x, p.y, p.cb, p.cr, o, p.out, width, NonTemporal);
+  }
+}
+
+}  // namespace
+
+void mergePairs(const uint8_t* y, const uint8_t* cb, const uint8_t* cr, PairOrder o, uint8_t* out, int pixels,
+                bool nonTemporal) {
+  const int x = hasAvx2() ? mergePairsAvx(y, cb, cr, o, out, pixels, nonTemporal) : 0;
+  mergePairsFrom(x, y, cb, cr, o, out, pixels, nonTemporal);
+}
+
+void mergePairRows(const PairRows& r, PairOrder o, int width, int height, bool nonTemporal) {
+  if (hasAvx2()) {
+    if (nonTemporal)
+      mergePairRowsAvx<true>(r, o, width, height);
+    else
+      mergePairRowsAvx<false>(r, o, width, height);
+    return;
+  }
+  for (int row = 0; row < height; ++row) {
+    const int c = row / r.lumaRowsPerChromaRow;
+    mergePairs(rowAt(r.y, r.yStep, row), rowAt(r.cb, r.cbStep, c), rowAt(r.cr, r.crStep, c), o,
+               rowAt(r.out, r.outStep, row), width, nonTemporal);
+  }
 }
 
 void lumaOfPairs(const uint8_t* in, PairOrder o, uint8_t* y, int pixels) {

@@ -44,6 +44,16 @@ inline void mergePair(const uint8_t* y, uint8_t cb, uint8_t cr, PairOrder o, uin
 void splitPairs(const uint8_t* in, PairOrder o, uint8_t* y, uint8_t* cb, uint8_t* cr, int pixels);
 void mergePairs(const uint8_t* y, const uint8_t* cb, const uint8_t* cr, PairOrder o, uint8_t* out, int pixels,
                 bool nonTemporal);
+// Rows of luma planes woven with chroma planes, `lumaRowsPerChromaRow` luma
+// rows (1 or 2) to each chroma row: mergePairs on each row.
+struct PairRows {
+  const uint8_t *y, *cb, *cr;
+  int yStep, cbStep, crStep;
+  int lumaRowsPerChromaRow;
+  uint8_t* out;
+  int outStep;
+};
+void mergePairRows(const PairRows& rows, PairOrder o, int width, int height, bool nonTemporal);
 // One byte order of pair streams into another, `pixels` even.
 void reorderPairs(const uint8_t* in, PairOrder from, uint8_t* out, PairOrder to, int pixels, bool nonTemporal);
 // Only the luma of a pair stream, `pixels` samples (a last odd pixel included).

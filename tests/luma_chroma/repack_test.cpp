@@ -498,6 +498,35 @@ TEST(Repack, GaplessFramesGoAsOneRow) {
   ASSERT_TRUE(y3.guardsIntact() && back.guardsIntact());
 }
 
+TEST(Repack, GaplessPlanesWeaveAsOneRow) {
+  // 4:2:2 planes without padding weave as one long row: the same pair
+  // stream as row by row on padded planes, in the plain and in the
+  // streaming member.
+  const int w = 1030, h = 600;
+  Row y(w, h, 0), cb(w / 2, h, 0), cr(w / 2, h, 0);
+  y.fillRandom(5);
+  cb.fillRandom(6);
+  cr.fillRandom(7);
+  Row py(w, h, 0, 16), pcb(w / 2, h, 0, 16), pcr(w / 2, h, 0, 16);
+  for (int r = 0; r < h; ++r)
+    for (int x = 0; x < w; ++x) {
+      py.set(x, r, y.get(x, r));
+      if (x < w / 2) pcb.set(x, r, cb.get(x, r)), pcr.set(x, r, cr.get(x, r));
+    }
+  const uint8_t* tight[3] = {y.data(), cb.data(), cr.data()};
+  const uint8_t* padded[3] = {py.data(), pcb.data(), pcr.data()};
+  const int tightSteps[3] = {w, w / 2, w / 2}, paddedSteps[3] = {py.step(), pcb.step(), pcr.step()};
+  using Weave = Status (*)(const uint8_t* const*, const int*, uint8_t*, int, ImageSize);
+  for (Weave weave : {Weave(zeliYCbCr422_8u_P3C2R), Weave(zeliYCbCr422ToYCrCb422_8u_P3C2R)}) {
+    Row one(2 * w, h, 0), rows(2 * w, h, 0, 16);
+    ASSERT_EQ(weave(tight, tightSteps, one.data(), 2 * w, ImageSize{w, h}), StatusOk);
+    ASSERT_EQ(weave(padded, paddedSteps, rows.data(), rows.step(), ImageSize{w, h}), StatusOk);
+    for (int r = 0; r < h; ++r)
+      for (int x = 0; x < 2 * w; ++x) ASSERT_EQ(one.get(x, r), rows.get(x, r)) << x << ", " << r;
+    ASSERT_TRUE(one.guardsIntact() && rows.guardsIntact());
+  }
+}
+
 TEST(Repack, StreamedCopiesMatchPlainOnes) {
   using namespace zel::repack;
   // Any start and length: the skewed head, the streamed blocks, the rest.
