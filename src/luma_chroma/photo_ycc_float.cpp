@@ -239,9 +239,81 @@ struct Write16 {
   }
 };
 
+// 512-bit blocks of 16 float pixels move their samples with 32-bit permutes
+// over two registers (index bit 4 picks the second).
+struct alignas(64) FloatPermute {
+  int32_t i[16];
+};
+
+// gather[c]: the float of the block that holds channel c of pixel i, for the
+// permute of the first two registers (the low five bits); upper[c] marks the
+// pixels whose float lies past the first 32, taken from the rest of the
+// block by the same index.
+template <int Stride>
+struct FloatGather16 {
+  FloatPermute gather[3];
+  uint16_t upper[3];
+};
+template <int Stride>
+constexpr FloatGather16<Stride> makeFloatGather16() {
+  FloatGather16<Stride> g{};
+  for (int c = 0; c < 3; ++c)
+    for (int i = 0; i < 16; ++i) {
+      g.gather[c].i[i] = Stride * i + c;
+      if (Stride * i + c >= 32) g.upper[c] = uint16_t(g.upper[c] | (1u << i));
+    }
+  return g;
+}
+
+// part[r]: for float j of the r-th 16 floats of the block, the pixel whose
+// channel lands there (plus 16 for the second channel, read from the second
+// register); third[r] marks the floats of the third channel, fourth[r] those
+// of a fourth, which keep their samples.
+template <int Stride>
+struct FloatScatter16 {
+  FloatPermute part[Stride];
+  uint16_t third[Stride], fourth[Stride];
+};
+template <int Stride>
+constexpr FloatScatter16<Stride> makeFloatScatter16() {
+  FloatScatter16<Stride> s{};
+  for (int r = 0; r < Stride; ++r)
+    for (int j = 0; j < 16; ++j) {
+      const int at = 16 * r + j, px = at / Stride, ch = at % Stride;
+      s.part[r].i[j] = px + (ch == 1 ? 16 : 0);
+      if (ch == 2) s.third[r] = uint16_t(s.third[r] | (1u << j));
+      if (ch == 3) s.fourth[r] = uint16_t(s.fourth[r] | (1u << j));
+    }
+  return s;
+}
+
+template <int Stride>
+inline constexpr FloatGather16<Stride> kFloatGather16 = makeFloatGather16<Stride>();
+template <int Stride>
+inline constexpr FloatScatter16<Stride> kFloatScatter16 = makeFloatScatter16<Stride>();
+
+ZEL_AVX512 inline __m512i floatPermute(const FloatPermute& m) { return _mm512_load_si512(m.i); }
+
 template <int Channels>
 struct Read32f {
   const float* p;
+  // Sixteen pixels in pixel order.
+  ZEL_AVX512 ZEL_INLINE FloatTrio<Ps16> get16(int x) const {
+    const float* s = p + Channels * x;
+    const FloatGather16<Channels>& g = kFloatGather16<Channels>;
+    __m512 part[Channels];
+    for (int k = 0; k < Channels; ++k) part[k] = _mm512_loadu_ps(s + 16 * k);
+    __m512 out[3];
+    for (int c = 0; c < 3; ++c) {
+      const __m512i index = floatPermute(g.gather[c]);
+      const __m512 lower = _mm512_permutex2var_ps(part[0], index, part[1]);
+      if constexpr (Channels == 3)
+        out[c] = _mm512_mask_permutexvar_ps(lower, g.upper[c], index, part[2]);
+      else
+        out[c] = _mm512_mask_blend_ps(g.upper[c], lower, _mm512_permutex2var_ps(part[2], index, part[3]));
+    }
+    return {out[0], out[1], out[2]};
+  }
   Floats3 get4(int x) const {
     const float* s = p + Channels * x;
     if constexpr (Channels == 3) {
@@ -289,8 +361,8 @@ struct Read32f {
 
 // Float pixels out. Three-channel blocks go through the store kind Stores
 // (plain, or streaming from an address aligned to the vector width, which
-// each block keeps: 48 bytes for four pixels, 96 for eight); four-channel
-// ones keep the fourth sample and store plainly.
+// each block keeps: 48 bytes for four pixels, 96 for eight, 192 for
+// sixteen); four-channel ones keep the fourth sample and store plainly.
 template <int Channels, class Stores = PlainStores>
 struct Write32f {
   float* p;
@@ -310,6 +382,24 @@ struct Write32f {
       _mm_storeu_ps(d + 4, _mm_blend_ps(p1, _mm_loadu_ps(d + 4), 0x8));
       _mm_storeu_ps(d + 8, _mm_blend_ps(p2, _mm_loadu_ps(d + 8), 0x8));
       _mm_storeu_ps(d + 12, _mm_blend_ps(p3, _mm_loadu_ps(d + 12), 0x8));
+    }
+  }
+  // Sixteen pixels in pixel order; three channels through Stores (aligned
+  // to 64 bytes when streaming), four with the fourth sample stored back as
+  // it was read (a whole-line store, as in the narrower blocks: a masked one
+  // waits for the line when the frame is beyond the cache).
+  ZEL_AVX512 ZEL_INLINE void put16(int x, const FloatTrio<Ps16>& v) const {
+    float* d = p + Channels * x;
+    const FloatScatter16<Channels>& s = kFloatScatter16<Channels>;
+    for (int r = 0; r < Channels; ++r) {
+      const __m512i index = floatPermute(s.part[r]);
+      const __m512 out = _mm512_mask_permutexvar_ps(_mm512_permutex2var_ps(v.c0, index, v.c1), s.third[r], index, v.c2);
+      if constexpr (Channels == 4)
+        _mm512_storeu_ps(d + 16 * r, _mm512_mask_blend_ps(s.fourth[r], out, _mm512_loadu_ps(d + 16 * r)));
+      else if constexpr (Stores::streaming)
+        _mm512_stream_ps(d + 16 * r, out);
+      else
+        _mm512_storeu_ps(d + 16 * r, out);
     }
   }
   ZEL_AVX2 ZEL_INLINE void put8(int x, const FloatTrio<Ps8>& v) const {
@@ -399,6 +489,17 @@ void yccRow16(const uint16_t* src, uint16_t* dst, int width, Body body, Tail tai
 }
 
 template <int Channels, class Stores, typename Form>
+ZEL_AVX512 __attribute__((flatten)) int yccBlocks32fWide(const float* src, float* dst, int x, int width, Form form) {
+  const Read32f<Channels> in{src};
+  const Write32f<Channels, Stores> out{dst};
+  for (; x + 16 <= width; x += 16) {
+    const FloatTrio<Ps16> v = in.get16(x);
+    out.put16(x, form(v.c0, v.c1, v.c2));
+  }
+  return x;
+}
+
+template <int Channels, class Stores, typename Form>
 ZEL_AVX2 __attribute__((flatten)) int yccBlocks32fAvx(const float* src, float* dst, int x, int width, Form form) {
   const Read32f<Channels> in{src};
   const Write32f<Channels, Stores> out{dst};
@@ -409,9 +510,11 @@ ZEL_AVX2 __attribute__((flatten)) int yccBlocks32fAvx(const float* src, float* d
   return x;
 }
 
-// One formula for every pixel. With streaming stores the pixels before the
-// first address aligned to the vector width go one at a time; a row whose
-// samples are off the float grid never gets there and stores plainly.
+// One formula for every pixel, in blocks of 16 (512-bit), 8 (AVX2) and 4.
+// With streaming stores the pixels before the first address aligned to the
+// widest vector go one at a time (each block keeps the alignment of the
+// narrower ones after it); a row whose samples are off the float grid never
+// gets there and stores plainly.
 template <int Channels, class Stores, typename Form>
 void yccRow32f(const float* src, float* dst, int width, Form form, VectorTier tier) {
   const Read32f<Channels> in{src};
@@ -422,12 +525,13 @@ void yccRow32f(const float* src, float* dst, int width, Form form, VectorTier ti
       yccRow32f<Channels, PlainStores>(src, dst, width, form, tier);
       return;
     }
-    const uintptr_t align = tier >= VectorTier::Avx2 ? 32 : 16;
+    const uintptr_t align = tier >= VectorTier::Avx512 ? 64 : tier >= VectorTier::Avx2 ? 32 : 16;
     for (; x < width && reinterpret_cast<uintptr_t>(dst + Channels * x) % align != 0; ++x) {
       const Float3 v = in.pixel(x);
       out.putPixel(x, form(v.c0, v.c1, v.c2));
     }
   }
+  if (tier >= VectorTier::Avx512) x = yccBlocks32fWide<Channels, Stores>(src, dst, x, width, form);
   if (tier >= VectorTier::Avx2) x = yccBlocks32fAvx<Channels, Stores>(src, dst, x, width, form);
   for (; x + 4 <= width; x += 4) {
     const Floats3 v = in.get4(x);

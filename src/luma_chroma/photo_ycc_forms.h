@@ -114,8 +114,10 @@ struct Ps16 {
   ZEL_AVX512 static V add(V a, V b) { return _mm512_add_ps(a, b); }
   ZEL_AVX512 static V sub(V a, V b) { return _mm512_sub_ps(a, b); }
   ZEL_AVX512 static V mul(V a, V b) { return _mm512_mul_ps(a, b); }
-  ZEL_AVX512 static V min(V a, V b) { return _mm512_min_ps(a, b); }
-  ZEL_AVX512 static V max(V a, V b) { return _mm512_max_ps(a, b); }
+  // The all-ones zero mask is the plain instruction (without the undefined
+  // merge source that the unmasked form hands the compiler).
+  ZEL_AVX512 static V min(V a, V b) { return _mm512_maskz_min_ps(__mmask16(~0u), a, b); }
+  ZEL_AVX512 static V max(V a, V b) { return _mm512_maskz_max_ps(__mmask16(~0u), a, b); }
 };
 
 template <class P>

@@ -25,7 +25,8 @@ void rgbToYcc16Row(const uint16_t* src, uint16_t* dst, int width, VectorTier tie
 template <int Channels, bool Signed>
 void yccToRgb16Row(const uint16_t* src, uint16_t* dst, int width, VectorTier tier);
 
-// 32-bit float: one formula for every pixel, in blocks of 8 (AVX2) and 4.
+// 32-bit float: one formula for every pixel, in blocks of 16, 8 and 4 (`tier`
+// at most floatTier()).
 // Stores is PlainStores, or StreamStores for three channels (the caller
 // fences after the last row).
 template <int Channels, class Stores>
@@ -33,7 +34,7 @@ void rgbToYcc32fRow(const float* src, float* dst, int width, VectorTier tier);
 template <int Channels, class Stores>
 void yccToRgb32fRow(const float* src, float* dst, int width, VectorTier tier);
 
-// The widest tier of the 16-bit and float rows (the 512-bit one needs no
+// The widest tier of the 16-bit and float rows (their 512-bit blocks need no
 // byte permutes).
 VectorTier floatTier();
 
