@@ -485,12 +485,19 @@ const std::map<std::string, PeerFactory>& table() {
                                kWidth / 2, kWidth, kHeight);
          });
        }},
+      // Both three-byte readers run the same arithmetic on the two byte
+      // orders: both are listed.
       {"zeliRGBToYCbCr420_8u_C3P3R",
        [] {
-         auto p = yuvPeer("libyuv RAWToI420", [](YuvFrame& f) {
+         auto p = yuvPeer("libyuv RGB24ToI420", [](YuvFrame& f) {
+           libyuv::RGB24ToI420(f.argb.data(), kWidth * 3, f.y2.data(), kWidth, f.u2.data(), kWidth / 2, f.v2.data(),
+                               kWidth / 2, kWidth, kHeight);
+         });
+         auto raw = yuvPeer("libyuv RAWToI420", [](YuvFrame& f) {
            libyuv::RAWToI420(f.argb.data(), kWidth * 3, f.y2.data(), kWidth, f.u2.data(), kWidth / 2, f.v2.data(),
                              kWidth / 2, kWidth, kHeight);
          });
+         p.insert(p.end(), raw.begin(), raw.end());
 #ifdef ZELCC_BENCH_OPENCV
          p.push_back(cvtColorPeer("OpenCV cvtColor RGB2YUV_I420", CV_8UC3, CV_8UC1, cv::COLOR_RGB2YUV_I420));
 #endif

@@ -604,7 +604,7 @@ float* words(float* p) { return p; }
 // A plain walk of one row kernel, on the vector width of the processor.
 template <auto Row, typename T>
 Status walk(const T* src, int srcStep, T* dst, int dstStep, ImageSize size) {
-  const VectorTier tier = floatTier();
+  const zel::VectorTier tier = floatTier();
   return walkElements(src, srcStep, dst, dstStep, size,
                       [tier](const T* s, T* d, int w) { Row(words(s), words(d), w, tier); });
 }

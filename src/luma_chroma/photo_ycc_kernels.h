@@ -11,7 +11,7 @@
 namespace zel::lc {
 
 // 8 bits: a body of 16-bit lanes below width AND NOT 7 (three channels) or
-// width AND NOT 3 (four), then the 32-bit tail; `tier` at most rowTier().
+// width AND NOT 3 (four), then the 32-bit tail; `tier` at most unitTier().
 template <int Channels>
 void rgbToYcc8uRow(const uint8_t* src, uint8_t* dst, int width, VectorTier tier);
 template <int Channels>

@@ -12,6 +12,7 @@
 #include <cstring>
 #include <type_traits>
 
+#include "luma_chroma/pixel_permutes.h"
 #include "luma_chroma/vector_units.h"
 
 namespace zel::lc {
@@ -72,53 +73,51 @@ inline constexpr RotatePatterns kRotate3 = makeRotate();
 
 // ---- 64-pixel blocks (Avx512) ----
 
-// The bytes of 64 converted pixels come in lane-split order, the order in
-// which the byte pack of two vectors of 16-bit lanes (pixels 0..31 and
-// 32..63) leaves them: byte m of 128-bit lane k is pixel 8k + m for m < 8 and
-// pixel 32 + 8k + m - 8 for m >= 8. The rows move bytes between memory order
-// and the lanes with byte permutes (VBMI).
+// The full-resolution rows hand a form 64 pixels as two halves of 16-bit
+// lanes, pixels 0..31 and 32..63 in order, each sample in the high byte of
+// its lane (S << 8): one zero-masked byte permute a half and channel. The
+// form's bytes come back in lane-split order, the order in which the byte
+// pack of the two halves leaves them: byte m of 128-bit lane k is pixel
+// 8k + m for m < 8 and pixel 32 + 8k + m - 8 for m >= 8.
 constexpr int splitPosition(int p) { return 16 * ((p & 31) >> 3) + (p & 32 ? 8 : 0) + (p & 7); }
 
-struct alignas(64) Permute64 {
-  uint8_t b[64];
-};
+// The odd bytes: the high bytes of the 16-bit lanes.
+inline constexpr uint64_t kHighByteLanes = 0xAAAAAAAAAAAAAAAAu;
 
-// Sources give the 64 pixels as two halves of 16-bit lanes, pixels 0..31
-// and 32..63 in order, each sample in the high byte of its lane (S << 8):
-// one zero-masked byte permute a half and channel. For interleaved pixels
-// of Stride bytes, half h reads two 64-byte parts of the block (the first
-// two, or the last two); index[h][c] names, in the high byte of lane w, the
-// byte of those 128 that holds channel c of pixel 32h + w. Planes take
-// index[h][0] from their 64 bytes.
+// Interleaved pixels of Stride bytes: half h reads two 64-byte parts of the
+// block (the first two, or the last two); half[h][c] names, in the high byte
+// of lane w, the byte of those 128 that holds channel c of pixel 32h + w.
+// Planes (Stride 1) take half[h][0] from their 64 bytes.
 template <int Stride>
 struct HighGather {
-  Permute64 index[2][3];
+  Permute64 half[2][3];
 };
 template <int Stride>
 constexpr HighGather<Stride> makeHighGather() {
   HighGather<Stride> g{};
   for (int h = 0; h < 2; ++h)
-    for (int c = 0; c < 3; ++c)
+    for (int c = 0; c < 3; ++c) {
+      g.half[h][c].mask = kHighByteLanes;
       for (int w = 0; w < 32; ++w) {
         const int first = Stride > 1 ? 64 * (Stride - 2) * h : 0;  // the half's first byte
-        g.index[h][c].b[2 * w + 1] = static_cast<uint8_t>(Stride * (32 * h + w) + c - first);
+        g.half[h][c].index[2 * w + 1] = static_cast<uint8_t>(Stride * (32 * h + w) + c - first);
       }
+    }
   return g;
 }
-inline constexpr uint64_t kHighBytes = 0xAAAAAAAAAAAAAAAAu;
 
 struct HighWords512 {
   Trio<Avx512> lo, hi;
 };
 
-// Interleaved destinations of Stride bytes a pixel, 64 bytes at a time: for
-// part r, byte j takes the pixel at position index[r][j] of the channel that
-// its place names (plus 64 for the second channel, read from the second of
-// two tables); third[r] and fourth[r] mark the bytes of those channels.
+// Interleaved destinations of Stride bytes a pixel from lane-split bytes,
+// 64 bytes at a time: byte j of part r takes the pixel at position
+// part[r].index[j] of the channel that its place names (plus 64 for the
+// second channel, read from the second of two tables); part[r].mask marks
+// the bytes of the third channel. A fourth channel's bytes are kFourthBytes.
 template <int Stride>
 struct SplitScatter {
-  Permute64 index[Stride];
-  uint64_t third[Stride], fourth[Stride];
+  Permute64 part[Stride];
 };
 template <int Stride>
 constexpr SplitScatter<Stride> makeSplitScatter() {
@@ -126,17 +125,18 @@ constexpr SplitScatter<Stride> makeSplitScatter() {
   for (int r = 0; r < Stride; ++r)
     for (int j = 0; j < 64; ++j) {
       const int at = 64 * r + j, channel = at % Stride;
-      s.index[r].b[j] = static_cast<uint8_t>(splitPosition(at / Stride) + (channel == 1 ? 64 : 0));
-      if (channel == 2) s.third[r] |= uint64_t(1) << j;
-      if (channel == 3) s.fourth[r] |= uint64_t(1) << j;
+      s.part[r].index[j] = static_cast<uint8_t>(splitPosition(at / Stride) + (channel == 1 ? 64 : 0));
+      if (channel == 2) s.part[r].mask |= uint64_t(1) << j;
     }
   return s;
 }
+inline constexpr uint64_t kFourthBytes = 0x8888888888888888u;
 
 // Plane bytes from lane-split order to memory order.
 constexpr Permute64 makeMemoryOrder() {
   Permute64 o{};
-  for (int j = 0; j < 64; ++j) o.b[j] = static_cast<uint8_t>(splitPosition(j));
+  for (int j = 0; j < 64; ++j) o.index[j] = static_cast<uint8_t>(splitPosition(j));
+  o.mask = ~uint64_t(0);
   return o;
 }
 
@@ -146,20 +146,12 @@ template <int Stride>
 inline constexpr SplitScatter<Stride> kSplitScatter = makeSplitScatter<Stride>();
 inline constexpr Permute64 kToMemory = makeMemoryOrder();
 
-ZEL_AVX512 inline __m512i permuteOf(const Permute64& p) { return _mm512_load_si512(p.b); }
-
-// Bytes of v at the positions that `index` names (the all-ones zero mask
-// keeps the compiler from seeing an undefined merge source).
-ZEL_AVX512_VBMI inline __m512i permuteBytes(__m512i index, __m512i v) {
-  return _mm512_maskz_permutexvar_epi8(~__mmask64(0), index, v);
-}
-
 // Four-byte pixels of one 64-byte part of an interleaved destination: the
 // first three channels placed, the fourth byte left to the caller.
 ZEL_AVX512_VBMI inline __m512i scatterPart(const SplitScatter<4>& s, int r, __m512i first, __m512i second,
                                            __m512i third) {
-  const __m512i index = permuteOf(s.index[r]);
-  return _mm512_mask_permutexvar_epi8(_mm512_permutex2var_epi8(first, index, second), s.third[r], index, third);
+  const __m512i index = indexOf(s.part[r]);
+  return _mm512_mask_permutexvar_epi8(_mm512_permutex2var_epi8(first, index, second), s.part[r].mask, index, third);
 }
 
 // ---- sources ----
@@ -179,8 +171,15 @@ struct PackedIn {
   ZEL_INLINE Trio<U> block(int x) const {
     const uint8_t* q = p + Stride * x;
     typename U::V chunk[Stride];
-    for (int k = 0; k < Stride; ++k) chunk[k] = U::loadUnits(q + 16 * k, 16 * Stride);
-    if constexpr (Stride == 3) {
+    if constexpr (std::is_same_v<U, Avx512>) {
+      // The byte permutes split 64 pixels in memory order.
+      if constexpr (Stride == 3)
+        split3(q, chunk);
+      else
+        split4(q, chunk);
+      return {chunk[0], chunk[1], chunk[2]};
+    } else if constexpr (Stride == 3) {
+      for (int k = 0; k < 3; ++k) chunk[k] = U::loadUnits(q + 16 * k, 48);
       const RotatePatterns& r = kRotate3;
       typename U::V out[3];
       for (int c = 0; c < 3; ++c) {
@@ -190,6 +189,7 @@ struct PackedIn {
       }
       return {out[0], out[1], out[2]};
     } else {
+      for (int k = 0; k < Stride; ++k) chunk[k] = U::loadUnits(q + 16 * k, 16 * Stride);
       const GatherPatterns<Stride>& g = kGather<Stride>;
       typename U::V out[3];
       for (int c = 0; c < 3; ++c) {
@@ -207,8 +207,8 @@ struct PackedIn {
     __m512i out[2][3];
     for (int h = 0; h < 2; ++h)
       for (int c = 0; c < 3; ++c)
-        out[h][c] = _mm512_maskz_permutex2var_epi8(kHighBytes, chunk[h ? Stride - 2 : 0], permuteOf(g.index[h][c]),
-                                                   chunk[h ? Stride - 1 : 1]);
+        out[h][c] = _mm512_maskz_permutex2var_epi8(g.half[h][c].mask, chunk[h ? Stride - 2 : 0],
+                                                   indexOf(g.half[h][c]), chunk[h ? Stride - 1 : 1]);
     return {{out[0][0], out[0][1], out[0][2]}, {out[1][0], out[1][1], out[1][2]}};
   }
 };
@@ -229,12 +229,12 @@ struct PlanesIn {
   }
   ZEL_AVX512_VBMI ZEL_INLINE HighWords512 highWords512(int x) const {
     const HighGather<1>& g = kHighGather<1>;
-    const __m512i lo = permuteOf(g.index[0][0]), hi = permuteOf(g.index[1][0]);
+    const __m512i lo = indexOf(g.half[0][0]), hi = indexOf(g.half[1][0]);
     const __m512i a = _mm512_loadu_si512(p0 + x), b = _mm512_loadu_si512(p1 + x), c = _mm512_loadu_si512(p2 + x);
     return {{half(lo, a), half(lo, b), half(lo, c)}, {half(hi, a), half(hi, b), half(hi, c)}};
   }
   ZEL_AVX512_VBMI ZEL_INLINE static __m512i half(__m512i index, __m512i v) {
-    return _mm512_maskz_permutexvar_epi8(kHighBytes, index, v);
+    return _mm512_maskz_permutexvar_epi8(kHighByteLanes, index, v);
   }
 };
 
@@ -253,14 +253,18 @@ struct PackedOut3 {
   template <class U>
   ZEL_INLINE void block(int x, const Trio<U>& v) const {
     const typename U::V ch[3] = {Reverse ? v.c2 : v.c0, v.c1, Reverse ? v.c0 : v.c2};
-    const RotatePatterns& r = kRotate3;
-    typename U::V turned[3];
-    for (int c = 0; c < 3; ++c) turned[c] = U::shuffle8(ch[c], U::shuffleOf(r.rotate[c]));
     uint8_t* q = p + 3 * x;
-    for (int k = 0; k < 3; ++k) {
-      const typename U::V o = U::blend8(U::blend8(turned[0], turned[1], U::shuffleOf(r.part[k][1])), turned[2],
-                                        U::shuffleOf(r.part[k][2]));
-      U::storeUnits(q + 16 * k, 48, o);
+    if constexpr (std::is_same_v<U, Avx512>) {
+      merge3(q, ch[0], ch[1], ch[2]);
+    } else {
+      const RotatePatterns& r = kRotate3;
+      typename U::V turned[3];
+      for (int c = 0; c < 3; ++c) turned[c] = U::shuffle8(ch[c], U::shuffleOf(r.rotate[c]));
+      for (int k = 0; k < 3; ++k) {
+        const typename U::V o = U::blend8(U::blend8(turned[0], turned[1], U::shuffleOf(r.part[k][1])), turned[2],
+                                          U::shuffleOf(r.part[k][2]));
+        U::storeUnits(q + 16 * k, 48, o);
+      }
     }
   }
   ZEL_AVX512_VBMI ZEL_INLINE void block512(int x, const Trio<Avx512>& v) const {
@@ -268,9 +272,9 @@ struct PackedOut3 {
     const SplitScatter<3>& s = kSplitScatter<3>;
     uint8_t* q = p + 3 * x;
     for (int r = 0; r < 3; ++r) {
-      const __m512i index = permuteOf(s.index[r]);
+      const __m512i index = indexOf(s.part[r]);
       const __m512i two = _mm512_permutex2var_epi8(first, index, v.c1);
-      _mm512_storeu_si512(q + 64 * r, _mm512_mask_permutexvar_epi8(two, s.third[r], index, third));
+      _mm512_storeu_si512(q + 64 * r, _mm512_mask_permutexvar_epi8(two, s.part[r].mask, index, third));
     }
   }
 };
@@ -291,13 +295,17 @@ struct PackedOutAlpha {
   ZEL_INLINE void block(int x, const Trio<U>& v) const {
     const typename U::V first = Reverse ? v.c2 : v.c0, third = Reverse ? v.c0 : v.c2;
     const typename U::V a = U::set8(alpha);
-    const typename U::V lo01 = U::unpackLo8(first, v.c1), hi01 = U::unpackHi8(first, v.c1);
-    const typename U::V lo23 = U::unpackLo8(third, a), hi23 = U::unpackHi8(third, a);
     uint8_t* q = p + 4 * x;
-    U::storeUnits(q, 64, U::unpackLo16(lo01, lo23));
-    U::storeUnits(q + 16, 64, U::unpackHi16(lo01, lo23));
-    U::storeUnits(q + 32, 64, U::unpackLo16(hi01, hi23));
-    U::storeUnits(q + 48, 64, U::unpackHi16(hi01, hi23));
+    if constexpr (std::is_same_v<U, Avx512>) {
+      merge4(q, first, v.c1, third, a);
+    } else {
+      const typename U::V lo01 = U::unpackLo8(first, v.c1), hi01 = U::unpackHi8(first, v.c1);
+      const typename U::V lo23 = U::unpackLo8(third, a), hi23 = U::unpackHi8(third, a);
+      U::storeUnits(q, 64, U::unpackLo16(lo01, lo23));
+      U::storeUnits(q + 16, 64, U::unpackHi16(lo01, lo23));
+      U::storeUnits(q + 32, 64, U::unpackLo16(hi01, hi23));
+      U::storeUnits(q + 48, 64, U::unpackHi16(hi01, hi23));
+    }
   }
   ZEL_AVX512_VBMI ZEL_INLINE void block512(int x, const Trio<Avx512>& v) const {
     const SplitScatter<4>& s = kSplitScatter<4>;
@@ -305,7 +313,7 @@ struct PackedOutAlpha {
     uint8_t* q = p + 4 * x;
     for (int r = 0; r < 4; ++r) {
       const __m512i rgb = scatterPart(s, r, Reverse ? v.c2 : v.c0, v.c1, Reverse ? v.c0 : v.c2);
-      _mm512_storeu_si512(q + 64 * r, _mm512_mask_blend_epi8(s.fourth[r], rgb, a));
+      _mm512_storeu_si512(q + 64 * r, _mm512_mask_blend_epi8(kFourthBytes, rgb, a));
     }
   }
 };
@@ -339,7 +347,7 @@ struct PackedOutKeep {
     const SplitScatter<4>& s = kSplitScatter<4>;
     uint8_t* q = p + 4 * x;
     for (int r = 0; r < 4; ++r)
-      _mm512_mask_storeu_epi8(q + 64 * r, ~s.fourth[r], scatterPart(s, r, v.c0, v.c1, v.c2));
+      _mm512_mask_storeu_epi8(q + 64 * r, ~kFourthBytes, scatterPart(s, r, v.c0, v.c1, v.c2));
   }
 };
 
@@ -359,10 +367,10 @@ struct PlanesOut {
     U::storeUnits(p2 + x, 16, v.c2);
   }
   ZEL_AVX512_VBMI ZEL_INLINE void block512(int x, const Trio<Avx512>& v) const {
-    const __m512i order = permuteOf(kToMemory);
-    _mm512_storeu_si512(p0 + x, permuteBytes(order, v.c0));
-    _mm512_storeu_si512(p1 + x, permuteBytes(order, v.c1));
-    _mm512_storeu_si512(p2 + x, permuteBytes(order, v.c2));
+    const __m512i order = indexOf(kToMemory);
+    _mm512_storeu_si512(p0 + x, _mm512_maskz_permutexvar_epi8(kToMemory.mask, order, v.c0));
+    _mm512_storeu_si512(p1 + x, _mm512_maskz_permutexvar_epi8(kToMemory.mask, order, v.c1));
+    _mm512_storeu_si512(p2 + x, _mm512_maskz_permutexvar_epi8(kToMemory.mask, order, v.c2));
   }
 };
 

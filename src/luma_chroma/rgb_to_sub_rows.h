@@ -3,10 +3,11 @@
 // and the row converters that run a body form over the first N pixels and
 // a tail form over the rest of the whole blocks.
 //
-// A body runs in vector blocks of 16 pixels (32 with AVX2), and its last
-// pixels below N take the same form one block at a time in scalar code. The
-// tail converts one chroma block at a time. Vector blocks read and write
-// exactly the bytes of their pixels and chroma samples.
+// A body runs in vector blocks of 64 pixels (512-bit tier), then 32 (AVX2)
+// and 16, and its last pixels below N take the same form one block at a
+// time in scalar code. The tail converts one chroma block at a time.
+// Vector blocks read and write exactly the bytes of their pixels and chroma
+// samples.
 #pragma once
 
 #include <cstdint>
@@ -403,9 +404,13 @@ struct QuadSource<RgbSource<PackedIn<Stride>, Bgr>> : std::true_type {
 
 // One row, `Ratio` pixels (2 or 4) to a chroma sample.
 template <class U, int Ratio, class Body, class Src, class Out>
-ZEL_INLINE int rowBlocks(const Src& in, const Out& out, int x, int end, const Body& body) {
+ZEL_INLINE int rowBlocks(const Src& inRow, const Out& outRow, int x, int end, const Body& body) {
   using V = typename U::V;
   using M = More<U>;
+  // Local copies: the byte stores cannot alias them, so the row pointers
+  // stay in registers.
+  const Src in = inRow;
+  const Out out = outRow;
   for (; x + U::kPixels <= end; x += U::kPixels) {
     const Trio<U> s = in.template block<U>(x);
     const Wide16<U> r = widen<U>(s.c0), g = widen<U>(s.c1), b = widen<U>(s.c2);
@@ -434,11 +439,16 @@ ZEL_INLINE int rowBlocks(const Src& in, const Out& out, int x, int end, const Bo
 
 // A row pair of 4:2:0: chroma from the sums of 2 by 2 pixels.
 template <class U, class Body, class Src, class Out>
-ZEL_INLINE int pairBlocks(const Src& top, const Src& bottom, const Out& out, int x, int end, const Body& body) {
+ZEL_INLINE int pairBlocks(const Src& topRow, const Src& bottomRow, const Out& outRow, int x, int end,
+                          const Body& body) {
   using V = typename U::V;
   using M = More<U>;
-  if constexpr (QuadSource<Src>::value && TakesQuads<Body>::value)
-    return quadPairBlocks<U, QuadSource<Src>::kBgr>(top.in, bottom.in, out, x, end, body);
+  // The 512-bit tier splits pixels into planes by byte permutes instead.
+  if constexpr (QuadSource<Src>::value && TakesQuads<Body>::value && !std::is_same_v<U, Avx512>)
+    return quadPairBlocks<U, QuadSource<Src>::kBgr>(topRow.in, bottomRow.in, outRow, x, end, body);
+  // Local copies, as in rowBlocks.
+  const Src top = topRow, bottom = bottomRow;
+  const Out out = outRow;
   for (; x + U::kPixels <= end; x += U::kPixels) {
     const Trio<U> s0 = top.template block<U>(x), s1 = bottom.template block<U>(x);
     V y[2], st = U::zero();
@@ -468,14 +478,42 @@ ZEL_INLINE int pairBlocks(const Src& top, const Src& bottom, const Out& out, int
 }
 
 template <int Ratio, class Body, class Src, class Out>
-ZEL_AVX2 __attribute__((flatten)) int rowBlocksAvx(const Src& in, const Out& out, int end, const Body& body) {
-  return rowBlocks<Avx, Ratio>(in, out, 0, end, body);
+ZEL_AVX2 __attribute__((flatten)) int rowBlocksAvx(const Src& in, const Out& out, int x, int end, const Body& body) {
+  return rowBlocks<Avx, Ratio>(in, out, x, end, body);
+}
+template <int Ratio, class Body, class Src, class Out>
+ZEL_AVX512_VBMI __attribute__((flatten)) int rowBlocksAvx512(const Src& in, const Out& out, int x, int end,
+                                                             const Body& body) {
+  return rowBlocks<Avx512, Ratio>(in, out, x, end, body);
 }
 
 template <class Body, class Src, class Out>
-ZEL_AVX2 __attribute__((flatten)) int pairBlocksAvx(const Src& top, const Src& bottom, const Out& out, int end,
+ZEL_AVX2 __attribute__((flatten)) int pairBlocksAvx(const Src& top, const Src& bottom, const Out& out, int x, int end,
                                                     const Body& body) {
-  return pairBlocks<Avx>(top, bottom, out, 0, end, body);
+  return pairBlocks<Avx>(top, bottom, out, x, end, body);
+}
+template <class Body, class Src, class Out>
+ZEL_AVX512_VBMI __attribute__((flatten)) int pairBlocksAvx512(const Src& top, const Src& bottom, const Out& out, int x,
+                                                              int end, const Body& body) {
+  return pairBlocks<Avx512>(top, bottom, out, x, end, body);
+}
+
+// The vector blocks of [0, end): the widest unit of the tier first, then
+// the narrower ones on what is left. Returns the end of the last block.
+template <int Ratio, class Body, class Src, class Out>
+inline int rowVectorBlocks(const Src& in, const Out& out, int end, const Body& body, VectorTier tier) {
+  int x = 0;
+  if (tier >= VectorTier::Avx512) x = rowBlocksAvx512<Ratio>(in, out, x, end, body);
+  if (tier >= VectorTier::Avx2) x = rowBlocksAvx<Ratio>(in, out, x, end, body);
+  return rowBlocks<Sse, Ratio>(in, out, x, end, body);
+}
+template <class Body, class Src, class Out>
+inline int pairVectorBlocks(const Src& top, const Src& bottom, const Out& out, int end, const Body& body,
+                            VectorTier tier) {
+  int x = 0;
+  if (tier >= VectorTier::Avx512) x = pairBlocksAvx512(top, bottom, out, x, end, body);
+  if (tier >= VectorTier::Avx2) x = pairBlocksAvx(top, bottom, out, x, end, body);
+  return pairBlocks<Sse>(top, bottom, out, x, end, body);
 }
 
 // ---- scalar blocks ----
@@ -508,11 +546,9 @@ inline void pairSpan(const Src& top, const Src& bottom, const Out& out, int x, i
 // the last pixel of an odd width takes the tail's odd form. Pixels after
 // the last whole block of 4:1:1 are not written.
 template <int Ratio, class Body, class Tail, class Src, class Out>
-inline void convertRow(const Src& in, const Out& out, int width, int n, const Body& body, const Tail& tail, bool avx2) {
-  int x = 0;
-  if (avx2) x = rowBlocksAvx<Ratio>(in, out, n, body);
-  x = rowBlocks<Sse, Ratio>(in, out, x, n, body);
-  rowSpan<Ratio>(in, out, x, n, body);
+inline void convertRow(const Src& in, const Out& out, int width, int n, const Body& body, const Tail& tail,
+                       VectorTier tier) {
+  rowSpan<Ratio>(in, out, rowVectorBlocks<Ratio>(in, out, n, body, tier), n, body);
   rowSpan<Ratio>(in, out, n, width & ~(Ratio - 1), tail);
   if constexpr (Ratio == 2)
     if (width & 1) out.odd(width - 1, tail.odd(in.pixel(width - 1)));
@@ -521,11 +557,8 @@ inline void convertRow(const Src& in, const Out& out, int width, int n, const Bo
 // A row pair of 4:2:0; a last odd column is not written.
 template <class Body, class Tail, class Src, class Out>
 inline void convertPair(const Src& top, const Src& bottom, const Out& out, int width, int n, const Body& body,
-                        const Tail& tail, bool avx2) {
-  int x = 0;
-  if (avx2) x = pairBlocksAvx(top, bottom, out, n, body);
-  x = pairBlocks<Sse>(top, bottom, out, x, n, body);
-  pairSpan(top, bottom, out, x, n, body);
+                        const Tail& tail, VectorTier tier) {
+  pairSpan(top, bottom, out, pairVectorBlocks(top, bottom, out, n, body, tier), n, body);
   pairSpan(top, bottom, out, n, width & ~1, tail);
 }
 

@@ -1,8 +1,8 @@
 // Vector operations of the subsampling encoders beyond vector_units.h: block
 // sums across neighbouring pixels, constant pairs of 32-bit dot products,
-// the 1..254 clamp and the partial stores of chroma rows. `More<Sse>` and `More<Avx>` work within
-// 128-bit lanes, so one kernel template computes the same bits at both
-// widths (see vector_units.h).
+// the 1..254 clamp and the partial stores of chroma rows. `More<Sse>`,
+// `More<Avx>` and `More<Avx512>` work within 128-bit lanes, so one kernel
+// template computes the same bits at every width (see vector_units.h).
 #pragma once
 
 #include <immintrin.h>
@@ -81,6 +81,73 @@ struct More<Avx> {
   template <int N>
   ZEL_AVX2 static V alignr(V hi, V lo) { return _mm256_alignr_epi8(hi, lo, N); }
 };
+
+// Word k of lane L of a horizontal pair sum: pair k of a's lane (k < 4) or
+// pair k - 4 of b's, the pair sums lying in the low words of dwords.
+struct HaddIndex {
+  uint16_t w[32];
+};
+constexpr HaddIndex makeHaddIndex() {
+  HaddIndex h{};
+  for (int i = 0; i < 32; ++i) {
+    const int lane = i / 8, k = i % 8;
+    h.w[i] = static_cast<uint16_t>(k < 4 ? 8 * lane + 2 * k : 32 + 8 * lane + 2 * (k - 4));
+  }
+  return h;
+}
+inline constexpr HaddIndex kHaddIndex = makeHaddIndex();
+
+ZEL_TIER512_BEGIN
+template <>
+struct More<Avx512> {
+  using V = __m512i;
+  ZEL_AVX512_VBMI static V pairSums(V bytes) { return _mm512_maddubs_epi16(bytes, _mm512_set1_epi8(1)); }
+  ZEL_AVX512_VBMI static V pairSums32(V bytes) { return _mm512_maddubs_epi16(bytes, _mm512_set1_epi8(32)); }
+  // No 512-bit form: the sum of a word pair as a dword, whose low word is
+  // the wrapping 16-bit sum, then the low words of a and b lane by lane.
+  ZEL_AVX512_VBMI static V hadd16(V a, V b) {
+    const V ones = _mm512_set1_epi16(1);
+    return _mm512_permutex2var_epi16(_mm512_madd_epi16(a, ones), _mm512_loadu_si512(kHaddIndex.w),
+                                     _mm512_madd_epi16(b, ones));
+  }
+  ZEL_AVX512_VBMI static V clampNarrow(V bytes) {
+    return _mm512_min_epu8(_mm512_max_epu8(bytes, _mm512_set1_epi8(1)), _mm512_set1_epi8(-2));
+  }
+  ZEL_AVX512_VBMI static V pair16(int lo, int hi) {
+    return _mm512_set1_epi32(int32_t(uint32_t(uint16_t(lo)) | (uint32_t(uint16_t(hi)) << 16)));
+  }
+  // Units of halves (or quarters) that follow each other: all low halves
+  // gathered into one store, all high halves into another.
+  ZEL_AVX512_VBMI static void storeHalves(uint8_t* lo, uint8_t* hi, int unitStride, V v) {
+    if (unitStride == 8) {
+      const V q = qwordsAt(v, _mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7));
+      _mm256_storeu_si256(reinterpret_cast<__m256i*>(lo), _mm512_castsi512_si256(q));
+      _mm256_storeu_si256(reinterpret_cast<__m256i*>(hi), half256<1>(q));
+      return;
+    }
+    const __m128i units[4] = {_mm512_castsi512_si128(v), lane128<1>(v), lane128<2>(v), lane128<3>(v)};
+    for (int k = 0; k < 4; ++k) More<Sse>::storeHalves(lo + k * unitStride, hi + k * unitStride, 0, units[k]);
+  }
+  ZEL_AVX512_VBMI static void storeQuarters(uint8_t* lo, uint8_t* hi, int unitStride, V v) {
+    if (unitStride == 4) {
+      const V q = dwordsAt(v, _mm512_setr_epi32(0, 4, 8, 12, 2, 6, 10, 14, 0, 0, 0, 0, 0, 0, 0, 0));
+      store128(lo, _mm512_castsi512_si128(q));
+      store128(hi, lane128<1>(q));
+      return;
+    }
+    const __m128i units[4] = {_mm512_castsi512_si128(v), lane128<1>(v), lane128<2>(v), lane128<3>(v)};
+    for (int k = 0; k < 4; ++k) More<Sse>::storeQuarters(lo + k * unitStride, hi + k * unitStride, 0, units[k]);
+  }
+  ZEL_AVX512_VBMI static V and_(V a, V b) { return _mm512_and_si512(a, b); }
+  ZEL_AVX512_VBMI static V unpackLo32(V a, V b) { return _mm512_unpacklo_epi32(a, b); }
+  ZEL_AVX512_VBMI static V unpackHi32(V a, V b) { return _mm512_unpackhi_epi32(a, b); }
+  ZEL_AVX512_VBMI static V unpackLo64(V a, V b) { return _mm512_unpacklo_epi64(a, b); }
+  ZEL_AVX512_VBMI static V unpackHi64(V a, V b) { return _mm512_unpackhi_epi64(a, b); }
+  template <int N>
+  ZEL_AVX512_VBMI static V alignr(V hi, V lo) { return _mm512_alignr_epi8(hi, lo, N); }
+};
+
+ZEL_TIER512_END
 
 // Exact 32-bit a * ca + b * cb + c * cc + addend, arithmetic shift by
 // Shift, for 16-bit lanes a, b, c whose values lie in 0..32767 and signed

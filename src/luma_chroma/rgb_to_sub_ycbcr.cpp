@@ -22,19 +22,19 @@ Status oddWarning(ImageSize size, bool rows) {
 template <class Body, class Tail, class Rows>
 void walk420(const Rows& rows, uint8_t* y, int yStep, uint8_t* c1, int c1Step, uint8_t* c2, int c2Step, ImageSize size,
              int n) {
-  const bool avx2 = hasAvx2();
+  const VectorTier tier = unitTier();
   rowPairWalk(size.height, [&](int r, int c) {
     const Planes420Out out{rowAt(y, yStep, r), rowAt(y, yStep, r + 1), rowAt(c1, c1Step, c), rowAt(c2, c2Step, c)};
-    convertPair(rows(r), rows(r + 1), out, size.width, n, Body{}, Tail{}, avx2);
+    convertPair(rows(r), rows(r + 1), out, size.width, n, Body{}, Tail{}, tier);
   });
 }
 
 template <class Body, class Tail, class Rows>
 void walk420TwoPlane(const Rows& rows, uint8_t* y, int yStep, uint8_t* cbcr, int cbcrStep, ImageSize size, int n) {
-  const bool avx2 = hasAvx2();
+  const VectorTier tier = unitTier();
   rowPairWalk(size.height, [&](int r, int c) {
     const TwoPlane420Out out{rowAt(y, yStep, r), rowAt(y, yStep, r + 1), rowAt(cbcr, cbcrStep, c)};
-    convertPair(rows(r), rows(r + 1), out, size.width, n, Body{}, Tail{}, avx2);
+    convertPair(rows(r), rows(r + 1), out, size.width, n, Body{}, Tail{}, tier);
   });
 }
 
@@ -76,8 +76,8 @@ Status rounded420TwoPlane(const uint8_t* src, int srcStep, uint8_t* dstY, int ds
 
 template <int Ratio, class Body, class Tail, class Rows, class OutRow>
 void walkRows(const Rows& rows, const OutRow& outRow, ImageSize size, int n) {
-  const bool avx2 = hasAvx2();
-  plainWalk(size.height, [&](int y) { convertRow<Ratio>(rows(y), outRow(y), size.width, n, Body{}, Tail{}, avx2); });
+  const VectorTier tier = unitTier();
+  plainWalk(size.height, [&](int y) { convertRow<Ratio>(rows(y), outRow(y), size.width, n, Body{}, Tail{}, tier); });
 }
 
 template <int Ratio, bool OddChroma = false>

@@ -23,11 +23,11 @@ Status oddWarning420(ImageSize size) { return ((size.width | size.height) & 1) ?
 
 template <class Body, class Tail, class Rows>
 void walk420(const Rows& rows, uint8_t* const dst[3], const int steps[3], ImageSize size, int n) {
-  const bool avx2 = hasAvx2();
+  const VectorTier tier = unitTier();
   rowPairWalk(size.height, [&](int r, int c) {
     const Planes420Out out{rowAt(dst[0], steps[0], r), rowAt(dst[0], steps[0], r + 1), rowAt(dst[1], steps[1], c),
                            rowAt(dst[2], steps[2], c)};
-    convertPair(rows(r), rows(r + 1), out, size.width, n, Body{}, Tail{}, avx2);
+    convertPair(rows(r), rows(r + 1), out, size.width, n, Body{}, Tail{}, tier);
   });
 }
 
@@ -57,21 +57,21 @@ using PlanesTail422 = WideDifference422Tail<0, 65535, Odd15<Rounding>>;
 
 // One row of the general kernel, or of the aligned kernel's own arithmetic.
 template <class Src>
-void row422(const Src& in, const PlanesOutSub<2, true>& out, int width, bool aligned, bool avx2) {
+void row422(const Src& in, const PlanesOutSub<2, true>& out, int width, bool aligned, VectorTier tier) {
   constexpr bool kInterleaved = !std::is_same_v<Src, PlanesSource>;
   if (aligned)
-    convertRow<2>(in, out, width, width & ~15, RoundedDifferenceBody<2>{}, SplitLumaPairTail{}, avx2);
+    convertRow<2>(in, out, width, width & ~15, RoundedDifferenceBody<2>{}, SplitLumaPairTail{}, tier);
   else
-    convertRow<2>(in, out, width, width & ~15, DifferenceBody<2>{}, PlanesTail422<kInterleaved>{}, avx2);
+    convertRow<2>(in, out, width, width & ~15, DifferenceBody<2>{}, PlanesTail422<kInterleaved>{}, tier);
 }
 
 template <class Rows>
 void walk422(const Rows& rows, uint8_t* const dst[3], const int steps[3], ImageSize size, bool aligned) {
-  const bool avx2 = hasAvx2();
+  const VectorTier tier = unitTier();
   plainWalk(size.height, [&](int y) {
     row422(rows(y),
            PlanesOutSub<2, true>{rowAt(dst[0], steps[0], y), rowAt(dst[1], steps[1], y), rowAt(dst[2], steps[2], y)},
-           size.width, aligned, avx2);
+           size.width, aligned, tier);
   });
 }
 
@@ -166,12 +166,12 @@ ZEL_PUBLIC Status zeliRGBToYUV420_8u_C3P3(const uint8_t* src, uint8_t* const dst
 ZEL_PUBLIC Status zeliRGBToYUV422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
   if (!src || !dst) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
-  const bool avx2 = zel::hasAvx2();
+  const zel::VectorTier tier = zel::lc::unitTier();
   using Tail = WideDifference422Tail<32768, 32768, OddDifferenceRounded>;
   zel::plainWalk(size.height, [&](int y) {
     convertRow<2>(PackedSource<3, false>{PackedIn<3>{zel::rowAt(src, srcStep, y)}},
                   PairsOut<PairOrder::YCbCr>{zel::rowAt(dst, dstStep, y)}, size.width, size.width & ~15,
-                  DifferenceBody<2>{}, Tail{}, avx2);
+                  DifferenceBody<2>{}, Tail{}, tier);
   });
   return StatusOk;
 }
@@ -196,7 +196,7 @@ ZEL_PUBLIC Status zeliRGBToYUV422_8u_C3P3(const uint8_t* src, uint8_t* const dst
       size,
       [&](int first, int pixels) {
         const PlanesOutSub<2, true> out{dstPlanes[0] + first, dstPlanes[1] + first / 2, dstPlanes[2] + first / 2};
-        row422(PackedSource<3, false>{PackedIn<3>{src + 3 * first}}, out, pixels, false, zel::hasAvx2());
+        row422(PackedSource<3, false>{PackedIn<3>{src + 3 * first}}, out, pixels, false, zel::lc::unitTier());
       },
       [&] {
         walk422(PackedRows<3, false>{src, 3 * w}, dstPlanes, steps, size, allAligned16(src, 3 * w, dstPlanes, steps));
@@ -229,7 +229,7 @@ ZEL_PUBLIC Status zeliRGBToYUV422_8u_P3(const uint8_t* const srcPlanes[3], uint8
       [&](int first, int pixels) {
         const PlanesSource in{PlanesIn{srcPlanes[0] + first, srcPlanes[1] + first, srcPlanes[2] + first}};
         const PlanesOutSub<2, true> out{dstPlanes[0] + first, dstPlanes[1] + first / 2, dstPlanes[2] + first / 2};
-        row422(in, out, pixels, false, zel::hasAvx2());
+        row422(in, out, pixels, false, zel::lc::unitTier());
       },
       [&] {
         walk422(PlaneRows{srcPlanes, w}, dstPlanes, steps, size, false);

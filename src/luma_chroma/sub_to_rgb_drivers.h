@@ -65,11 +65,11 @@ template <class MakeLuma, class MakeChroma, class MakeOut, class Body, class Tai
 inline Status expandPairs(ImageSize size, int bodyEnd, MakeLuma luma, MakeChroma chroma, MakeOut out, const Body& body,
                           const Tail& tail) {
   const int end = size.width & ~1;
-  const bool avx2 = hasAvx2();
+  const VectorTier tier = unitTier();
   using Set = RowSet<2, LumaRow, decltype(chroma(0)), decltype(out(0))>;
   for (int j = 0; j < size.height >> 1; ++j) {
     const Set rows{{LumaRow{luma(2 * j)}, LumaRow{luma(2 * j + 1)}}, chroma(j), {out(2 * j), out(2 * j + 1)}};
-    expandRow(rows, bodyEnd, end, body, tail, avx2);
+    expandRow(rows, bodyEnd, end, body, tail, tier);
   }
   return oddSizeStatus(size);
 }
@@ -77,8 +77,8 @@ inline Status expandPairs(ImageSize size, int bodyEnd, MakeLuma luma, MakeChroma
 // A plain walk of single rows; `row(y)` gives the views of row y.
 template <class MakeRow, class Body, class Tail>
 inline void expandRows(int height, int bodyEnd, int end, MakeRow row, const Body& body, const Tail& tail) {
-  const bool avx2 = hasAvx2();
-  for (int y = 0; y < height; ++y) expandRow(row(y), bodyEnd, end, body, tail, avx2);
+  const VectorTier tier = unitTier();
+  for (int y = 0; y < height; ++y) expandRow(row(y), bodyEnd, end, body, tail, tier);
 }
 
 // A pair stream row with its destination row.

@@ -35,6 +35,29 @@ struct PartLoads<Sse> {
   static __m128i four(const uint8_t* p, int) { return load32(p); }
 };
 
+ZEL_TIER512_BEGIN
+template <>
+struct PartLoads<Avx512> {
+  // Units that follow each other: one load, each unit's part moved to the
+  // low bytes of its lane.
+  ZEL_AVX512_VBMI static __m512i eight(const uint8_t* p, int unitStride) {
+    if (unitStride == 8)
+      return qwordsAt(_mm512_castsi256_si512(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(p))),
+                      _mm512_setr_epi64(0, 0, 1, 1, 2, 2, 3, 3));
+    const __m512i v = _mm512_inserti32x4(_mm512_castsi128_si512(load64(p)), load64(p + unitStride), 1);
+    return _mm512_inserti32x4(_mm512_inserti32x4(v, load64(p + 2 * unitStride), 2), load64(p + 3 * unitStride), 3);
+  }
+  ZEL_AVX512_VBMI static __m512i four(const uint8_t* p, int unitStride) {
+    if (unitStride == 4)
+      return dwordsAt(_mm512_castsi128_si512(load128(p)),
+                      _mm512_setr_epi32(0, 0, 0, 0, 1, 1, 1, 1, 2, 2, 2, 2, 3, 3, 3, 3));
+    const __m512i v = _mm512_inserti32x4(_mm512_castsi128_si512(load32(p)), load32(p + unitStride), 1);
+    return _mm512_inserti32x4(_mm512_inserti32x4(v, load32(p + 2 * unitStride), 2), load32(p + 3 * unitStride), 3);
+  }
+};
+
+ZEL_TIER512_END
+
 template <>
 struct PartLoads<Avx> {
   ZEL_AVX2 static __m256i eight(const uint8_t* p, int unitStride) {
@@ -231,6 +254,38 @@ struct StreamLoad<Avx, true> : StreamLoad<Avx, false> {
   ZEL_AVX2 static __m256i second(const uint8_t* q) { return _mm256_permute4x64_epi64(load256(q + 32), 0xD8); }
 };
 
+ZEL_TIER512_BEGIN
+// 512-bit blocks of 64 pixels from two 64-byte loads. For the unit layout
+// lane L holds pixels 16L..16L+7 of the first vector and 16L+8..16L+15 of
+// the second (qwords 4L, 4L + 1 and 4L + 2, 4L + 3 of the 128 bytes). Flat:
+// lane L holds pixels 4L..4L+3 and 16+4L..19+4L of each 64 bytes, and the
+// four-byte pixels of a lane come out as the pixels of one 64-byte store.
+template <>
+struct StreamLoad<Avx512, false> {
+  ZEL_AVX512_VBMI static __m512i pick(const uint8_t* q, __m512i qwords) {
+    return _mm512_permutex2var_epi64(_mm512_loadu_si512(q), qwords, _mm512_loadu_si512(q + 64));
+  }
+  ZEL_AVX512_VBMI static __m512i first(const uint8_t* q) {
+    return pick(q, _mm512_setr_epi64(0, 1, 4, 5, 8, 9, 12, 13));
+  }
+  ZEL_AVX512_VBMI static __m512i second(const uint8_t* q) {
+    return pick(q, _mm512_setr_epi64(2, 3, 6, 7, 10, 11, 14, 15));
+  }
+  ZEL_AVX512_VBMI static __m512i lowHalves(__m512i a, __m512i b) { return _mm512_unpacklo_epi64(a, b); }
+  ZEL_AVX512_VBMI static __m512i highHalves(__m512i a, __m512i b) { return _mm512_unpackhi_epi64(a, b); }
+};
+
+template <>
+struct StreamLoad<Avx512, true> : StreamLoad<Avx512, false> {
+  ZEL_AVX512_VBMI static __m512i spread(const uint8_t* q) {
+    return qwordsAt(_mm512_loadu_si512(q), _mm512_setr_epi64(0, 4, 1, 5, 2, 6, 3, 7));
+  }
+  ZEL_AVX512_VBMI static __m512i first(const uint8_t* q) { return spread(q); }
+  ZEL_AVX512_VBMI static __m512i second(const uint8_t* q) { return spread(q + 64); }
+};
+
+ZEL_TIER512_END
+
 // Four-byte pixels of a flat block: registers of 8 pixels in memory order.
 template <bool Reverse>
 ZEL_AVX2 inline void storeFlat(const PackedOutAlpha<Reverse>& out, int x, const Trio<Avx>& v) {
@@ -244,6 +299,22 @@ ZEL_AVX2 inline void storeFlat(const PackedOutAlpha<Reverse>& out, int x, const 
   store256(q + 64, _mm256_unpacklo_epi16(hi01, hi23));
   store256(q + 96, _mm256_unpackhi_epi16(hi01, hi23));
 }
+
+ZEL_TIER512_BEGIN
+template <bool Reverse>
+ZEL_AVX512_VBMI inline void storeFlat(const PackedOutAlpha<Reverse>& out, int x, const Trio<Avx512>& v) {
+  const __m512i first = Reverse ? v.c2 : v.c0, third = Reverse ? v.c0 : v.c2;
+  const __m512i a = _mm512_set1_epi8(static_cast<char>(out.alpha));
+  const __m512i lo01 = _mm512_unpacklo_epi8(first, v.c1), hi01 = _mm512_unpackhi_epi8(first, v.c1);
+  const __m512i lo23 = _mm512_unpacklo_epi8(third, a), hi23 = _mm512_unpackhi_epi8(third, a);
+  uint8_t* q = out.p + 4 * x;
+  _mm512_storeu_si512(q, _mm512_unpacklo_epi16(lo01, lo23));
+  _mm512_storeu_si512(q + 64, _mm512_unpackhi_epi16(lo01, lo23));
+  _mm512_storeu_si512(q + 128, _mm512_unpacklo_epi16(hi01, hi23));
+  _mm512_storeu_si512(q + 192, _mm512_unpackhi_epi16(hi01, hi23));
+}
+
+ZEL_TIER512_END
 
 template <class Out>
 struct FlatOut : std::false_type {};
@@ -316,7 +387,7 @@ ZEL_INLINE int expandBlocks(const RowSet<Rows, Luma, Chroma, Out>& rowSet, int x
   const RowSet<Rows, Luma, Chroma, Out> rows = rowSet;
   const Form form = formIn;
   if constexpr (StreamSet<RowSet<Rows, Luma, Chroma, Out>>::value) {
-    constexpr bool kFlat = std::is_same_v<U, Avx> && FlatOut<Out>::value;
+    constexpr bool kFlat = !std::is_same_v<U, Sse> && FlatOut<Out>::value;
     return streamBlocks<U, kFlat>(rows.chroma, rows.out[0], x, end, form);
   }
   if constexpr (std::is_same_v<U, Avx> && PlanesFlatSet<RowSet<Rows, Luma, Chroma, Out>>::value)
@@ -336,9 +407,14 @@ ZEL_INLINE int expandBlocks(const RowSet<Rows, Luma, Chroma, Out>& rowSet, int x
 }
 
 template <int Rows, class Luma, class Chroma, class Out, class Form>
-ZEL_AVX2 __attribute__((flatten)) int expandBlocksAvx(const RowSet<Rows, Luma, Chroma, Out>& rows, int end,
+ZEL_AVX2 __attribute__((flatten)) int expandBlocksAvx(const RowSet<Rows, Luma, Chroma, Out>& rows, int x, int end,
                                                       const Form& form) {
-  return expandBlocks<Avx>(rows, 0, end, form);
+  return expandBlocks<Avx>(rows, x, end, form);
+}
+template <int Rows, class Luma, class Chroma, class Out, class Form>
+ZEL_AVX512_VBMI __attribute__((flatten)) int expandBlocksAvx512(const RowSet<Rows, Luma, Chroma, Out>& rows, int x,
+                                                                int end, const Form& form) {
+  return expandBlocks<Avx512>(rows, x, end, form);
 }
 
 template <int Rows, class Luma, class Chroma, class Out, class Form>
@@ -354,13 +430,15 @@ inline void expandPixels(const RowSet<Rows, Luma, Chroma, Out>& rows, int x, int
 }
 
 // Pixels [0, bodyEnd) take the body form, [bodyEnd, end) the tail form.
-// The body's whole vector blocks run in AVX2 (with `avx2`) and SSE4.1, its
-// last pixels one at a time in the same form.
+// The body's whole vector blocks run at the widest unit of the tier first
+// (512-bit, then AVX2) and SSE4.1, its last pixels one at a time in the
+// same form.
 template <int Rows, class Luma, class Chroma, class Out, class Body, class Tail>
 inline void expandRow(const RowSet<Rows, Luma, Chroma, Out>& rows, int bodyEnd, int end, const Body& body,
-                      const Tail& tail, bool avx2) {
+                      const Tail& tail, VectorTier tier) {
   int x = 0;
-  if (avx2) x = expandBlocksAvx(rows, bodyEnd, body);
+  if (tier >= VectorTier::Avx512) x = expandBlocksAvx512(rows, x, bodyEnd, body);
+  if (tier >= VectorTier::Avx2) x = expandBlocksAvx(rows, x, bodyEnd, body);
   x = expandBlocks<Sse>(rows, x, bodyEnd, body);
   expandPixels(rows, x, bodyEnd, body);
   expandPixels(rows, bodyEnd, end, tail);

@@ -3,13 +3,13 @@
 //   Sse     one 128-bit register, one unit of 16 pixels;
 //   Avx     one 256-bit register, two units (lane 0 pixels 0..15, lane 1
 //           pixels 16..31), chosen at run time;
-//   Avx512  one 512-bit register of 64 pixels, chosen at run time when the
-//           processor has the byte permutes; its rows move bytes with those
-//           permutes (see pixel_rows.h for the order of its bytes).
+//   Avx512  one 512-bit register, four units (lane k pixels 16k..16k+15),
+//           chosen at run time when the processor also has the byte
+//           permutes, which split and merge three-byte pixels.
 // Every operation works within a 128-bit lane, so the same kernel code
 // computes the same bits at every width. Avx and Avx512 kernels are
-// instantiated only inside a function of their target marked `flatten`,
-// which pulls every operation into that code.
+// instantiated only inside a ZEL_AVX2 or ZEL_AVX512_VBMI function marked
+// `flatten`, which pulls every operation into the code of that tier.
 #pragma once
 
 #include <immintrin.h>
@@ -23,15 +23,6 @@
 #pragma GCC diagnostic ignored "-Wpsabi"
 
 namespace zel::lc {
-
-using zel::VectorTier;
-
-// The widest unit the row kernels of these families take on this processor
-// (under the tier cap): the 512-bit one needs the byte permutes too.
-inline VectorTier rowTier() {
-  if (hasAvx512Vbmi()) return VectorTier::Avx512;
-  return hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41;
-}
 
 // The scalar meaning of a 16-bit lane sum without saturation: it wraps.
 // With the luma-chroma constants no sum comes near the limit.
@@ -145,45 +136,105 @@ struct Avx {
   ZEL_AVX2 static V packS32(V lo, V hi) { return _mm256_packs_epi32(lo, hi); }
 };
 
+// GCC 12 takes the undefined upper lanes that many 512-bit intrinsics start
+// from for uninitialised values; the code of the 512-bit tier sits between
+// these two marks, which silence that false warning.
+#define ZEL_TIER512_BEGIN \
+  _Pragma("GCC diagnostic push") _Pragma("GCC diagnostic ignored \"-Wuninitialized\"") \
+      _Pragma("GCC diagnostic ignored \"-Wmaybe-uninitialized\"")
+#define ZEL_TIER512_END _Pragma("GCC diagnostic pop")
+
+ZEL_TIER512_BEGIN
+
+// Moves of the 512-bit tier across lanes.
+// Qword (dword) k of the result is qword (dword) index[k] of v.
+ZEL_AVX512_VBMI inline __m512i qwordsAt(__m512i v, __m512i index) { return _mm512_permutexvar_epi64(index, v); }
+ZEL_AVX512_VBMI inline __m512i dwordsAt(__m512i v, __m512i index) { return _mm512_permutexvar_epi32(index, v); }
+// Lane K of v, and half K.
+template <int K>
+ZEL_AVX512_VBMI inline __m128i lane128(__m512i v) {
+  return _mm512_extracti32x4_epi32(v, K);
+}
+template <int K>
+ZEL_AVX512_VBMI inline __m256i half256(__m512i v) {
+  return _mm512_extracti64x4_epi64(v, K);
+}
+// Lanes 2, 3 of a and 0, 1 of b.
+ZEL_AVX512_VBMI inline __m512i middleLanes(__m512i a, __m512i b) { return _mm512_shuffle_i64x2(a, b, 0x4E); }
+// A 16-byte pattern in every lane.
+ZEL_AVX512_VBMI inline __m512i everyLane(__m128i v) { return _mm512_broadcast_i32x4(v); }
+
 struct Avx512 {
   using V = __m512i;
+  static constexpr int kUnits = 4;
   static constexpr int kPixels = 64;
 
-  ZEL_AVX512 static V zero() { return _mm512_setzero_si512(); }
-  ZEL_AVX512 static V set16(int v) { return _mm512_set1_epi16(static_cast<int16_t>(v)); }
-  ZEL_AVX512 static V set8(int v) { return _mm512_set1_epi8(static_cast<int8_t>(v)); }
-  ZEL_AVX512 static V add16(V a, V b) { return _mm512_add_epi16(a, b); }
-  ZEL_AVX512 static V sub16(V a, V b) { return _mm512_sub_epi16(a, b); }
-  ZEL_AVX512 static V addSatS16(V a, V b) { return _mm512_adds_epi16(a, b); }
-  ZEL_AVX512 static V addSatU16(V a, V b) { return _mm512_adds_epu16(a, b); }
-  ZEL_AVX512 static V mulHighS16(V a, V b) { return _mm512_mulhi_epi16(a, b); }
-  ZEL_AVX512 static V mulHighU16(V a, V b) { return _mm512_mulhi_epu16(a, b); }
-  ZEL_AVX512 static V mulHighRound(V a, V b) { return _mm512_mulhrs_epi16(a, b); }
+  // Units that follow each other are one load or store.
+  ZEL_AVX512_VBMI static V loadUnits(const void* p, int unitStride) {
+    const auto* b = static_cast<const uint8_t*>(p);
+    if (unitStride == 16) return _mm512_loadu_si512(p);
+    V v = _mm512_castsi128_si512(load128(b));
+    v = _mm512_inserti32x4(v, load128(b + unitStride), 1);
+    v = _mm512_inserti32x4(v, load128(b + 2 * unitStride), 2);
+    return _mm512_inserti32x4(v, load128(b + 3 * unitStride), 3);
+  }
+  ZEL_AVX512_VBMI static void storeUnits(void* p, int unitStride, V v) {
+    auto* b = static_cast<uint8_t*>(p);
+    if (unitStride == 16) {
+      _mm512_storeu_si512(p, v);
+    } else {
+      store128(b, _mm512_castsi512_si128(v));
+      store128(b + unitStride, lane128<1>(v));
+      store128(b + 2 * unitStride, lane128<2>(v));
+      store128(b + 3 * unitStride, lane128<3>(v));
+    }
+  }
+  ZEL_AVX512_VBMI static V shuffleOf(const Shuffle16& s) { return everyLane(load128(s.b)); }
+
+  ZEL_AVX512_VBMI static V zero() { return _mm512_setzero_si512(); }
+  ZEL_AVX512_VBMI static V set16(int v) { return _mm512_set1_epi16(static_cast<int16_t>(v)); }
+  ZEL_AVX512_VBMI static V set8(int v) { return _mm512_set1_epi8(static_cast<int8_t>(v)); }
+  ZEL_AVX512_VBMI static V add16(V a, V b) { return _mm512_add_epi16(a, b); }
+  ZEL_AVX512_VBMI static V sub16(V a, V b) { return _mm512_sub_epi16(a, b); }
+  ZEL_AVX512_VBMI static V addSatS16(V a, V b) { return _mm512_adds_epi16(a, b); }
+  ZEL_AVX512_VBMI static V addSatU16(V a, V b) { return _mm512_adds_epu16(a, b); }
+  ZEL_AVX512_VBMI static V mulHighS16(V a, V b) { return _mm512_mulhi_epi16(a, b); }
+  ZEL_AVX512_VBMI static V mulHighU16(V a, V b) { return _mm512_mulhi_epu16(a, b); }
+  ZEL_AVX512_VBMI static V mulHighRound(V a, V b) { return _mm512_mulhrs_epi16(a, b); }
   template <int N>
-  ZEL_AVX512 static V sra16(V a) { return _mm512_srai_epi16(a, N); }
+  ZEL_AVX512_VBMI static V sra16(V a) { return _mm512_srai_epi16(a, N); }
   template <int N>
-  ZEL_AVX512 static V srl16(V a) { return _mm512_srli_epi16(a, N); }
+  ZEL_AVX512_VBMI static V srl16(V a) { return _mm512_srli_epi16(a, N); }
   template <int N>
-  ZEL_AVX512 static V sll16(V a) { return _mm512_slli_epi16(a, N); }
-  ZEL_AVX512 static V or_(V a, V b) { return _mm512_or_si512(a, b); }
-  ZEL_AVX512 static V xor_(V a, V b) { return _mm512_xor_si512(a, b); }
-  ZEL_AVX512 static V unpackLo8(V a, V b) { return _mm512_unpacklo_epi8(a, b); }
-  ZEL_AVX512 static V unpackHi8(V a, V b) { return _mm512_unpackhi_epi8(a, b); }
-  ZEL_AVX512 static V unpackLo16(V a, V b) { return _mm512_unpacklo_epi16(a, b); }
-  ZEL_AVX512 static V unpackHi16(V a, V b) { return _mm512_unpackhi_epi16(a, b); }
-  ZEL_AVX512 static V packU8(V lo, V hi) { return _mm512_packus_epi16(lo, hi); }
-  ZEL_AVX512 static V packS8(V lo, V hi) { return _mm512_packs_epi16(lo, hi); }
-  ZEL_AVX512 static V set32(int32_t v) { return _mm512_set1_epi32(v); }
-  ZEL_AVX512 static V mulLo16(V a, V b) { return _mm512_mullo_epi16(a, b); }
-  ZEL_AVX512 static V madd16(V a, V b) { return _mm512_madd_epi16(a, b); }
-  ZEL_AVX512 static V add32(V a, V b) { return _mm512_add_epi32(a, b); }
-  ZEL_AVX512 static V sub32(V a, V b) { return _mm512_sub_epi32(a, b); }
-  // The all-ones zero mask is the plain shift, without the undefined merge
-  // source that the unmasked form hands the compiler.
+  ZEL_AVX512_VBMI static V sll16(V a) { return _mm512_slli_epi16(a, N); }
+  ZEL_AVX512_VBMI static V or_(V a, V b) { return _mm512_or_si512(a, b); }
+  ZEL_AVX512_VBMI static V xor_(V a, V b) { return _mm512_xor_si512(a, b); }
+  ZEL_AVX512_VBMI static V blend8(V a, V b, V m) { return _mm512_mask_blend_epi8(_mm512_movepi8_mask(m), a, b); }
+  ZEL_AVX512_VBMI static V shuffle8(V a, V m) { return _mm512_shuffle_epi8(a, m); }
+  ZEL_AVX512_VBMI static V unpackLo8(V a, V b) { return _mm512_unpacklo_epi8(a, b); }
+  ZEL_AVX512_VBMI static V unpackHi8(V a, V b) { return _mm512_unpackhi_epi8(a, b); }
+  ZEL_AVX512_VBMI static V unpackLo16(V a, V b) { return _mm512_unpacklo_epi16(a, b); }
+  ZEL_AVX512_VBMI static V unpackHi16(V a, V b) { return _mm512_unpackhi_epi16(a, b); }
+  ZEL_AVX512_VBMI static V packU8(V lo, V hi) { return _mm512_packus_epi16(lo, hi); }
+  ZEL_AVX512_VBMI static V packS8(V lo, V hi) { return _mm512_packs_epi16(lo, hi); }
+  ZEL_AVX512_VBMI static V set32(int32_t v) { return _mm512_set1_epi32(v); }
+  ZEL_AVX512_VBMI static V mulLo16(V a, V b) { return _mm512_mullo_epi16(a, b); }
+  ZEL_AVX512_VBMI static V madd16(V a, V b) { return _mm512_madd_epi16(a, b); }
+  ZEL_AVX512_VBMI static V add32(V a, V b) { return _mm512_add_epi32(a, b); }
+  ZEL_AVX512_VBMI static V sub32(V a, V b) { return _mm512_sub_epi32(a, b); }
   template <int N>
-  ZEL_AVX512 static V sra32(V a) { return _mm512_maskz_srai_epi32(__mmask16(~0u), a, N); }
-  ZEL_AVX512 static V packS32(V lo, V hi) { return _mm512_packs_epi32(lo, hi); }
+  ZEL_AVX512_VBMI static V sra32(V a) { return _mm512_srai_epi32(a, N); }
+  ZEL_AVX512_VBMI static V packS32(V lo, V hi) { return _mm512_packs_epi32(lo, hi); }
 };
+
+ZEL_TIER512_END
+
+// The widest unit the kernels may take on this processor (under the cap of
+// the vector tier): the 512-bit unit needs the byte permutes too.
+inline VectorTier unitTier() {
+  if (hasAvx512Vbmi()) return VectorTier::Avx512;
+  return hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41;
+}
 
 // Three channels of a block: bytes (16 pixels a unit) or 16-bit lanes.
 template <class U>

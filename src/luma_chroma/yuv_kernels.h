@@ -1,6 +1,6 @@
 // Row kernels of the full-resolution YUV conversions. Each converts one row
 // of `width` pixels with its member's body and tail; the vector body takes
-// the widest blocks that `tier` (at most rowTier()) allows first; the bits
+// the widest blocks that `tier` (at most unitTier()) allows first; the bits
 // are the same at every tier.
 #pragma once
 

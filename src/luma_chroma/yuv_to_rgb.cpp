@@ -110,9 +110,10 @@ ZEL_PUBLIC Status zeliYUVToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t*
 
 ZEL_PUBLIC Status zeliYUVToRGB_8u_C3C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
                                         uint8_t alpha) {
-  return walkInterleaved(src, srcStep, dst, dstStep, size, [alpha](const uint8_t* s, uint8_t* d, int width, VectorTier tier) {
-    yuvToRgbC3C4Row(s, d, width, alpha, tier);
-  });
+  return walkInterleaved(src, srcStep, dst, dstStep, size,
+                         [alpha](const uint8_t* s, uint8_t* d, int width, zel::VectorTier tier) {
+                           yuvToRgbC3C4Row(s, d, width, alpha, tier);
+                         });
 }
 
 ZEL_PUBLIC Status zeliYUVToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
@@ -120,7 +121,7 @@ ZEL_PUBLIC Status zeliYUVToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], int s
   if (!srcPlanes || !dst) return StatusNullPointerError;
   if (sizeBelowOne(size)) return StatusSizeError;
   if (anyPlaneNull(srcPlanes, 3)) return StatusNullPointerError;
-  const VectorTier tier = rowTier();
+  const zel::VectorTier tier = unitTier();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<const uint8_t, 3> s(srcPlanes, srcStep, y);
     yuvToRgbP3C3Row(s.p, zel::rowAt(dst, dstStep, y), size.width, tier);
@@ -135,7 +136,7 @@ ZEL_PUBLIC Status zeliYUVToRGB_8u_P3R(const uint8_t* const srcPlanes[3], int src
   if (sizeBelowOne(size)) return StatusSizeError;
   if (anyPlaneNull(dstPlanes, 3)) return StatusNullPointerError;
   if (anyPlaneNull(srcPlanes, 3)) return StatusNullPointerError;
-  const VectorTier tier = rowTier();
+  const zel::VectorTier tier = unitTier();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<const uint8_t, 3> s(srcPlanes, srcStep, y);
     const PlaneRows<uint8_t, 3> d(dstPlanes, dstStep, y);

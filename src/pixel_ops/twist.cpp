@@ -251,12 +251,11 @@ ZEL_AVX2 ZEL_INLINE __m256i twistEight8u(__m256i px, const __m256 (&t)[3][4]) {
 
 // Sixteen 8-bit three-channel pixels at a time: 48 bytes read whole (in
 // place too) before 48 bytes are written.
-ZEL_AVX2 int sixteen8uC3(const uint8_t* src, uint8_t* dst, int width, const __m256 (&t)[3][4]) {
+ZEL_AVX2 int sixteen8uC3(const uint8_t* src, uint8_t* dst, int x, int width, const __m256 (&t)[3][4]) {
   const __m256i first = _mm256_setr_epi32(0, 1, 2, 2, 3, 4, 5, 5);   // bytes 0..23 of a load at 0
   const __m256i second = _mm256_setr_epi32(2, 3, 4, 4, 5, 6, 7, 7);  // bytes 24..47 of a load at 16
   const __m256i low = _mm256_setr_epi32(0, 1, 2, 4, 5, 6, 6, 6);
   const __m256i high = _mm256_setr_epi32(2, 4, 5, 6, 0, 0, 0, 1);
-  int x = 0;
   for (; x + 16 <= width; x += 16) {
     const uint8_t* s = src + x * 3;
     const __m256i a = _mm256_permutevar8x32_epi32(load256(s), first);
@@ -271,12 +270,11 @@ ZEL_AVX2 int sixteen8uC3(const uint8_t* src, uint8_t* dst, int width, const __m2
 }
 
 template <typename T, int K>
-ZEL_AVX2 int wideBlocks(const T* const src[3], T* const dst[3], int width, const Matrix& m) {
+ZEL_AVX2 int wideBlocks(const T* const src[3], T* const dst[3], int x, int width, const Matrix& m) {
   __m256 t[3][4];
   for (int i = 0; i < 3; ++i)
     for (int j = 0; j < 4; ++j) t[i][j] = _mm256_set1_ps(m.t[i][j]);
-  int x = 0;
-  if constexpr (std::is_same_v<T, uint8_t> && K == C3) x = sixteen8uC3(src[0], dst[0], width, t);
+  if constexpr (std::is_same_v<T, uint8_t> && K == C3) x = sixteen8uC3(src[0], dst[0], x, width, t);
   for (; x + 8 <= width; x += 8) {
     __m256i v[3];
     if constexpr (K == Planar) {
@@ -359,11 +357,11 @@ inline void pixel(const T* const src[3], T* const dst[3], int x, const Matrix& m
 }  // namespace
 
 template <typename T, int K>
-void row(const T* const src[3], T* const dst[3], int width, const Matrix& m, bool wide) {
+void row(const T* const src[3], T* const dst[3], int width, const Matrix& m, VectorTier tier) {
   const Columns c(m);
   int x = 0;
   if constexpr (std::is_same_v<T, float> && K == C3) {
-    row32fC3(src[0], dst[0], width, m, false, wide);
+    row32fC3(src[0], dst[0], width, m, false, tier >= VectorTier::Avx2);
     return;
   } else if constexpr (std::is_same_v<T, float>) {
     for (; x + 4 <= width; x += 4) {
@@ -392,7 +390,8 @@ void row(const T* const src[3], T* const dst[3], int width, const Matrix& m, boo
       }
     }
   } else {
-    if (wide) x = wideBlocks<T, K>(src, dst, width, m);
+    if (tier >= VectorTier::Avx512) x = blocks512<T, K>(src, dst, width, m);
+    if (tier >= VectorTier::Avx2) x = wideBlocks<T, K>(src, dst, x, width, m);
     for (; x + 4 <= width; x += 4) {
       const Lanes3 v = load4<T, K>(src, x);
       __m128i r[3];
@@ -410,10 +409,10 @@ void row(const T* const src[3], T* const dst[3], int width, const Matrix& m, boo
   for (; x < width; ++x) pixel<T, K>(src, dst, x, m);
 }
 
-#define ZEL_TWIST_ROWS(T)                                                    \
-  template void row<T, Planar>(const T* const[3], T* const[3], int, const Matrix&, bool); \
-  template void row<T, C3>(const T* const[3], T* const[3], int, const Matrix&, bool);     \
-  template void row<T, AC4>(const T* const[3], T* const[3], int, const Matrix&, bool);
+#define ZEL_TWIST_ROWS(T)                                                                      \
+  template void row<T, Planar>(const T* const[3], T* const[3], int, const Matrix&, VectorTier); \
+  template void row<T, C3>(const T* const[3], T* const[3], int, const Matrix&, VectorTier);     \
+  template void row<T, AC4>(const T* const[3], T* const[3], int, const Matrix&, VectorTier);
 ZEL_TWIST_ROWS(uint8_t)
 ZEL_TWIST_ROWS(int8_t)
 ZEL_TWIST_ROWS(uint16_t)
@@ -583,7 +582,7 @@ template <typename T, int K>
 __attribute__((noinline)) void walk(const T* const* srcPlanes, int srcStep, T* const* dstPlanes, int dstStep,
                                     ImageSize size, const Matrix& m) {
   const int planes = K == Planar ? 3 : 1;
-  const bool wide = hasAvx2();
+  const VectorTier tier = std::is_same_v<T, float> ? (hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41) : integerTier();
   plainWalk(size.height, [&](int y) {
     const T* s[3];
     T* d[3];
@@ -591,7 +590,7 @@ __attribute__((noinline)) void walk(const T* const* srcPlanes, int srcStep, T* c
       s[k] = rowAt(srcPlanes[k < planes ? k : 0], srcStep, y);
       d[k] = rowAt(dstPlanes[k < planes ? k : 0], dstStep, y);
     }
-    row<T, K>(s, d, size.width, m, wide);
+    row<T, K>(s, d, size.width, m, tier);
   });
 }
 

@@ -3,8 +3,12 @@
 // or from the same column of three planes.
 #pragma once
 
+#include <cmath>
 #include <cstdint>
+#include <limits>
+#include <type_traits>
 
+#include "frame/simd.h"
 #include "pixel_ops/twist_formulas.h"
 
 namespace zel::twist {
@@ -12,10 +16,37 @@ namespace zel::twist {
 enum Kind { Planar = 1, C3 = 3, AC4 = 4 };
 
 // `src[k]`, `dst[k]`: the row of plane k, or the pixel row in [0]. Vector
-// blocks of four pixels (eight with `wide`, the caller having checked for
-// AVX2 in integer members), then one pixel at a time; one formula for all.
+// blocks of four pixels (eight from the AVX2 tier, sixteen from the 512-bit
+// one in integer members; `tier` as the caller found the processor), then
+// one pixel at a time; one formula for all.
 template <typename T, int K>
-void row(const T* const src[3], T* const dst[3], int width, const Matrix& m, bool wide);
+void row(const T* const src[3], T* const dst[3], int width, const Matrix& m, VectorTier tier);
+
+// Integer samples, sixteen pixels a block while whole blocks remain;
+// returns the pixels done. Needs the 512-bit tier with byte permutes.
+template <typename T, int K>
+ZEL_AVX512_VBMI int blocks512(const T* const src[3], T* const dst[3], int width, const Matrix& m);
+
+// True when no output of `m` can be NaN or reach 2^30 in magnitude for any
+// samples of type T: the rounded outputs then stay inside the 32-bit range,
+// and the saturating narrowing to T alone gives the clamped result.
+template <typename T>
+bool narrowingClamps(const Matrix& m) {
+  constexpr double reach = std::is_signed_v<T> ? -double(std::numeric_limits<T>::min())
+                                               : double(std::numeric_limits<T>::max());
+  for (int i = 0; i < 3; ++i) {
+    double weights = 0;
+    for (int j = 0; j < 3; ++j) weights += std::fabs(double(m.t[i][j]));
+    const double bound = std::fabs(double(m.t[i][3])) + reach * weights;
+    if (!(bound < 1073741824.0)) return false;  // NaN and infinities too
+  }
+  return true;
+}
+
+// The widest tier the integer blocks take on this processor.
+inline VectorTier integerTier() {
+  return hasAvx512Vbmi() ? VectorTier::Avx512 : hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41;
+}
 
 // Three-channel floats over `pixels` pixels; `stream` writes the blocks
 // with non-temporal stores (where the destination holds whole floats) and

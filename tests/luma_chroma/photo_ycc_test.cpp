@@ -20,6 +20,7 @@
 namespace {
 
 using namespace zel::lc;
+using zel::VectorTier;
 using namespace zel::lc::test;
 using zel::lc::test::str;
 using zel::test::TestImage;

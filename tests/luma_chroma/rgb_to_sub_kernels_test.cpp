@@ -1,6 +1,7 @@
 // Vector blocks of the subsampling encoders against the scalar side of the
-// same forms: rows of widths 1..70 at odd offsets, with SSE4.1 alone and
-// with AVX2 first, compared byte for byte with guards.
+// same forms: rows of widths 1..70 and a few past 128 at odd offsets, with
+// SSE4.1 alone, with AVX2 first and with 512-bit blocks first, compared byte
+// for byte with guards.
 #include <gtest/gtest.h>
 
 #include <cstring>
@@ -11,11 +12,13 @@
 #include "luma_chroma/rgb_to_sub_filter.h"
 #include "luma_chroma/rgb_to_sub_rows.h"
 #include "luma_chroma/rgb_to_sub_yuv_forms.h"
+#include "luma_chroma/tier_params.h"
 
 namespace {
 
 using namespace zel::lc;
 using namespace zel::lc::sub;
+using zel::VectorTier;
 
 // Bytes with guards on both sides, the first `offset` bytes past a 64-byte
 // boundary; one byte in four is an edge value of the formulas.
@@ -55,35 +58,39 @@ auto withSource(In in, int width, F f) {
   }
 }
 
-// Runs `blocked` (the converter with vector blocks) and `plain` (the scalar
-// span) into copies of one destination and compares them.
+// Widths 1..70 and some past two 512-bit blocks.
+std::vector<int> testWidths() {
+  std::vector<int> w;
+  for (int width = 1; width <= 70; ++width) w.push_back(width);
+  for (int width : {129, 150, 191, 255, 300}) w.push_back(width);
+  return w;
+}
+
+// Runs `blocked` (the converter with vector blocks from `tier` down) and
+// `plain` (the scalar span) into copies of one destination and compares
+// them.
 template <class Run>
-void agree(int inBytes, int outBytes, int rows, Run run) {
-  for (bool avx2 : {false, true}) {
-    if (avx2 && !zel::hasAvx2()) continue;
-    for (int width = 1; width <= 70; ++width)
-      for (int offset : {0, 1, 3, 7}) {
-        const uint32_t seed = uint32_t(width * 16 + offset);
-        const Guarded src(width * inBytes * rows, offset, seed);
-        const Guarded out(width * outBytes * rows, (offset * 5) & 15, seed + 1);
-        Guarded blocked(out), plain(out);
-        run(src.first, blocked.first, plain.first, width, avx2);
-        ASSERT_TRUE(blocked.bytes == plain.bytes) << "width " << width << " offset " << offset << " avx2 " << avx2;
-      }
-  }
+void agree(VectorTier tier, int inBytes, int outBytes, int rows, Run run) {
+  for (int width : testWidths())
+    for (int offset : {0, 1, 3, 7}) {
+      const uint32_t seed = uint32_t(width * 16 + offset);
+      const Guarded src(width * inBytes * rows, offset, seed);
+      const Guarded out(width * outBytes * rows, (offset * 5) & 15, seed + 1);
+      Guarded blocked(out), plain(out);
+      run(src.first, blocked.first, plain.first, width, tier);
+      ASSERT_TRUE(blocked.bytes == plain.bytes) << "width " << width << " offset " << offset;
+    }
 }
 
 // One row of 4:2:2 or 4:1:1: every whole block in the body form.
 template <int Ratio, bool Bgr, class Body>
-void rowBodyAgrees(const Body& body, In in, Out out) {
-  agree(pixelBytes(in), 2, 1, [&](const uint8_t* s, uint8_t* b, uint8_t* p, int w, bool avx2) {
+void rowBodyAgrees(VectorTier tier, const Body& body, In in, Out out) {
+  agree(tier, pixelBytes(in), 2, 1, [&](const uint8_t* s, uint8_t* b, uint8_t* p, int w, VectorTier t) {
     const int n = w & ~(Ratio - 1);
     withSource<Bgr>(in, w, [&](auto make) {
       const auto src = make(s);
       auto go = [&](const auto& ob, const auto& op) {
-        int x = avx2 ? rowBlocksAvx<Ratio>(src, ob, n, body) : 0;
-        x = rowBlocks<Sse, Ratio>(src, ob, x, n, body);
-        rowSpan<Ratio>(src, ob, x, n, body);
+        rowSpan<Ratio>(src, ob, rowVectorBlocks<Ratio>(src, ob, n, body, t), n, body);
         rowSpan<Ratio>(src, op, 0, n, body);
       };
       switch (out) {
@@ -106,15 +113,13 @@ void rowBodyAgrees(const Body& body, In in, Out out) {
 
 // One row pair of 4:2:0.
 template <bool Bgr, class Body>
-void pairBodyAgrees(const Body& body, In in, Out out) {
-  agree(pixelBytes(in), 3, 2, [&](const uint8_t* s, uint8_t* b, uint8_t* p, int w, bool avx2) {
+void pairBodyAgrees(VectorTier tier, const Body& body, In in, Out out) {
+  agree(tier, pixelBytes(in), 3, 2, [&](const uint8_t* s, uint8_t* b, uint8_t* p, int w, VectorTier t) {
     const int n = w & ~1;
     const int rowBytes = pixelBytes(in) * w;
     auto run = [&](const auto& top, const auto& bottom) {
       auto go = [&](const auto& ob, const auto& op) {
-        int x = avx2 ? pairBlocksAvx(top, bottom, ob, n, body) : 0;
-        x = pairBlocks<Sse>(top, bottom, ob, x, n, body);
-        pairSpan(top, bottom, ob, x, n, body);
+        pairSpan(top, bottom, ob, pairVectorBlocks(top, bottom, ob, n, body, t), n, body);
         pairSpan(top, bottom, op, 0, n, body);
       };
       if (out == Out::TwoPlane)
@@ -127,40 +132,44 @@ void pairBodyAgrees(const Body& body, In in, Out out) {
   });
 }
 
-TEST(SubsampledKernels, FourTwoZeroBlocksMatchTheScalarForms) {
-  pairBodyAgrees<true>(LanesBody<set601, 4>{}, In::C3, Out::Planes);
-  pairBodyAgrees<true>(LanesBody<set601, 4>{}, In::AC4, Out::Planes);
-  pairBodyAgrees<false>(LanesBody<set601, 4>{}, In::AC4, Out::Planes);
-  pairBodyAgrees<true>(LanesBody<set709Csc, 4>{}, In::C3, Out::TwoPlane);
-  pairBodyAgrees<true>(LanesBody<set709Hdtv, 4>{}, In::AC4, Out::Planes);
-  pairBodyAgrees<false>(RoundedBody<false>{}, In::C3, Out::Planes);
-  pairBodyAgrees<false>(RoundedBody<false>{}, In::AC4, Out::TwoPlane);
+using SubsampledKernels = zel::test::TierTest;
+
+TEST_P(SubsampledKernels, FourTwoZeroBlocksMatchTheScalarForms) {
+  pairBodyAgrees<true>(GetParam(), LanesBody<set601, 4>{}, In::C3, Out::Planes);
+  pairBodyAgrees<true>(GetParam(), LanesBody<set601, 4>{}, In::AC4, Out::Planes);
+  pairBodyAgrees<false>(GetParam(), LanesBody<set601, 4>{}, In::AC4, Out::Planes);
+  pairBodyAgrees<true>(GetParam(), LanesBody<set709Csc, 4>{}, In::C3, Out::TwoPlane);
+  pairBodyAgrees<true>(GetParam(), LanesBody<set709Hdtv, 4>{}, In::AC4, Out::Planes);
+  pairBodyAgrees<false>(GetParam(), RoundedBody<false>{}, In::C3, Out::Planes);
+  pairBodyAgrees<false>(GetParam(), RoundedBody<false>{}, In::AC4, Out::TwoPlane);
 }
 
-TEST(SubsampledKernels, RowBlocksMatchTheScalarForms) {
-  rowBodyAgrees<4, true>(RoundedBody<true>{}, In::C3, Out::Planes);
-  rowBodyAgrees<4, true>(LanesBody<set601, 4>{}, In::AC4, Out::Planes);
-  rowBodyAgrees<2, true>(LanesBody<set601, 2>{}, In::C3, Out::Planes);
-  rowBodyAgrees<2, false>(LanesBody<set601, 2>{}, In::C3, Out::Planes);
-  rowBodyAgrees<2, true>(LanesBody<set601, 2>{}, In::AC4, Out::Pairs);
-  rowBodyAgrees<2, false>(ExactPairBody{}, In::C3, Out::Pairs);
-  rowBodyAgrees<2, false>(ExactPairBody{}, In::P3, Out::PairsCrFirst);
-  rowBodyAgrees<2, true>(CbYCrBody<set601>{}, In::AC4, Out::PairsCbFirst);
-  rowBodyAgrees<2, true>(CbYCrBody<set709Hdtv>{}, In::C3, Out::PairsCbFirst);
+TEST_P(SubsampledKernels, RowBlocksMatchTheScalarForms) {
+  rowBodyAgrees<4, true>(GetParam(), RoundedBody<true>{}, In::C3, Out::Planes);
+  rowBodyAgrees<4, true>(GetParam(), LanesBody<set601, 4>{}, In::AC4, Out::Planes);
+  rowBodyAgrees<2, true>(GetParam(), LanesBody<set601, 2>{}, In::C3, Out::Planes);
+  rowBodyAgrees<2, false>(GetParam(), LanesBody<set601, 2>{}, In::C3, Out::Planes);
+  rowBodyAgrees<2, true>(GetParam(), LanesBody<set601, 2>{}, In::AC4, Out::Pairs);
+  rowBodyAgrees<2, false>(GetParam(), ExactPairBody{}, In::C3, Out::Pairs);
+  rowBodyAgrees<2, false>(GetParam(), ExactPairBody{}, In::P3, Out::PairsCrFirst);
+  rowBodyAgrees<2, true>(GetParam(), CbYCrBody<set601>{}, In::AC4, Out::PairsCbFirst);
+  rowBodyAgrees<2, true>(GetParam(), CbYCrBody<set709Hdtv>{}, In::C3, Out::PairsCbFirst);
 }
 
-TEST(SubsampledKernels, YuvBlocksMatchTheScalarForms) {
-  pairBodyAgrees<true>(DifferenceBody<4>{}, In::AC4, Out::Planes);
-  pairBodyAgrees<false>(DifferenceBody<4>{}, In::P3, Out::Planes);
-  pairBodyAgrees<false>(RoundedDifferenceBody<4>{}, In::C3, Out::Planes);
-  rowBodyAgrees<2, false>(DifferenceBody<2>{}, In::C3, Out::Planes);
-  rowBodyAgrees<2, false>(DifferenceBody<2>{}, In::P3, Out::Planes);
-  rowBodyAgrees<2, false>(DifferenceBody<2>{}, In::C3, Out::Pairs);
-  rowBodyAgrees<2, false>(RoundedDifferenceBody<2>{}, In::C3, Out::Planes);
+TEST_P(SubsampledKernels, YuvBlocksMatchTheScalarForms) {
+  pairBodyAgrees<true>(GetParam(), DifferenceBody<4>{}, In::AC4, Out::Planes);
+  pairBodyAgrees<false>(GetParam(), DifferenceBody<4>{}, In::P3, Out::Planes);
+  pairBodyAgrees<false>(GetParam(), RoundedDifferenceBody<4>{}, In::C3, Out::Planes);
+  rowBodyAgrees<2, false>(GetParam(), DifferenceBody<2>{}, In::C3, Out::Planes);
+  rowBodyAgrees<2, false>(GetParam(), DifferenceBody<2>{}, In::P3, Out::Planes);
+  rowBodyAgrees<2, false>(GetParam(), DifferenceBody<2>{}, In::C3, Out::Pairs);
+  rowBodyAgrees<2, false>(GetParam(), RoundedDifferenceBody<2>{}, In::C3, Out::Planes);
 }
 
-TEST(SubsampledKernels, WideYuvBlocksMatchTheWideForm) {
-  agree(3, 3, 2, [&](const uint8_t* s, uint8_t* b, uint8_t* p, int w, bool) {
+INSTANTIATE_TEST_SUITE_P(Tiers, SubsampledKernels, zel::test::allTiers(), zel::test::tierTestName);
+
+TEST(SubsampledSseKernels, WideYuvBlocksMatchTheWideForm) {
+  agree(VectorTier::Sse41, 3, 3, 2, [&](const uint8_t* s, uint8_t* b, uint8_t* p, int w, VectorTier) {
     const PlanesSource top{{s, s + w, s + 2 * w}}, bottom{{s + 3 * w, s + 4 * w, s + 5 * w}};
     const Planes420Out ob{b, b + w, b + 2 * w, b + 2 * w + w / 2}, op{p, p + w, p + 2 * w, p + 2 * w + w / 2};
     const int n = w & ~1;
@@ -169,9 +178,9 @@ TEST(SubsampledKernels, WideYuvBlocksMatchTheWideForm) {
   });
 }
 
-TEST(SubsampledKernels, FilteredBlocksMatchTheScalarPairs) {
+TEST(SubsampledSseKernels, FilteredBlocksMatchTheScalarPairs) {
   for (const uint8_t* table : {static_cast<const uint8_t*>(nullptr), gammaTable()})
-    agree(3, 2, 1, [&](const uint8_t* s, uint8_t* b, uint8_t* p, int w, bool) {
+    agree(VectorTier::Sse41, 3, 2, 1, [&](const uint8_t* s, uint8_t* b, uint8_t* p, int w, VectorTier) {
       filteredRow(s, b, w, table, true);
       filteredRow(s, p, w, table, false);
     });

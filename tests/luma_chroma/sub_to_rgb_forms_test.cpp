@@ -82,7 +82,7 @@ TEST(SubsampledForms, WorkedValues) {
 // A 4:2:2 row whose chroma runs through all 65536 pairs of samples, luma
 // from a seed; the whole row is body, converted in vector blocks.
 template <class Form>
-void expectVectorMatchesScalar(const char* name, const Form& form, bool avx2) {
+void expectVectorMatchesScalar(const char* name, const Form& form, zel::VectorTier tier) {
   constexpr int kPairs = 65536, kWidth = 2 * kPairs;
   std::vector<uint8_t> cb(kPairs), cr(kPairs), out(3 * kWidth);
   for (int k = 0; k < kPairs; ++k) {
@@ -94,38 +94,38 @@ void expectVectorMatchesScalar(const char* name, const Form& form, bool avx2) {
     for (int x = 0; x < kWidth; ++x) y[x] = uint8_t(x * 97 + seed + (x >> 9));
     const RowSet<1, LumaRow, ChromaPlanes<2>, PackedOut3<false>> row{
         {LumaRow{y.data()}}, ChromaPlanes<2>{cb.data(), cr.data()}, {PackedOut3<false>{out.data()}}};
-    expandRow(row, kWidth, kWidth, form, form, avx2);
+    expandRow(row, kWidth, kWidth, form, form, tier);
     for (int x = 0; x < kWidth; ++x) {
       const Rgb8 want = form.pixel(y[x], cb[x / 2], cr[x / 2]);
       const Rgb8 got{out[3 * x], out[3 * x + 1], out[3 * x + 2]};
       if (str(got) != str(want)) {
-        FAIL() << name << (avx2 ? " (AVX2)" : " (SSE4.1)") << " at " << int(y[x]) << "," << int(cb[x / 2]) << ","
+        FAIL() << name << " (tier " << int(tier) << ") at " << int(y[x]) << "," << int(cb[x / 2]) << ","
                << int(cr[x / 2]) << ": " << str(got) << " for " << str(want);
       }
     }
   }
 }
 
-std::vector<bool> vectorWidths() {
-  std::vector<bool> w{false};
-  if (zel::hasAvx2()) w.push_back(true);
-  return w;
+std::vector<zel::VectorTier> vectorTiers() {
+  std::vector<zel::VectorTier> t;
+  for (int k = 0; k <= int(unitTier()); ++k) t.push_back(zel::VectorTier(k));
+  return t;
 }
 
 TEST(SubsampledForms, VectorFormsMatchTheirScalarFormsOnEveryChromaPair) {
-  for (bool avx2 : vectorWidths()) {
-    expectVectorMatchesScalar("lanes 601a", LanesForm{lanes601a}, avx2);
-    expectVectorMatchesScalar("lanes 601b", LanesForm{lanes601b}, avx2);
-    expectVectorMatchesScalar("lanes 709", LanesForm{lanes709}, avx2);
-    expectVectorMatchesScalar("pair centred A", PairCentredForm{pairLanesA}, avx2);
-    expectVectorMatchesScalar("pair raw A", PairRawForm{pairLanesA}, avx2);
-    expectVectorMatchesScalar("pair raw B", PairRawForm{pairLanesB}, avx2);
-    expectVectorMatchesScalar("hdtv", SixteenthsForm{lanesHDTV}, avx2);
-    expectVectorMatchesScalar("yuv quad", SixteenthsForm{lanesYuvQuad}, avx2);
-    expectVectorMatchesScalar("halves 2", YuvHalvesForm{rgbLanes2Set}, avx2);
-    expectVectorMatchesScalar("halves 1", YuvHalvesForm{rgbLanes1Set}, avx2);
-    expectVectorMatchesScalar("yuv wide truncated", YuvWideForm{rgbWideA, {0, 0, 0}}, avx2);
-    expectVectorMatchesScalar("yuv wide rounded", YuvWideForm{rgbWideA, {32768, 32768, 32768}}, avx2);
+  for (zel::VectorTier tier : vectorTiers()) {
+    expectVectorMatchesScalar("lanes 601a", LanesForm{lanes601a}, tier);
+    expectVectorMatchesScalar("lanes 601b", LanesForm{lanes601b}, tier);
+    expectVectorMatchesScalar("lanes 709", LanesForm{lanes709}, tier);
+    expectVectorMatchesScalar("pair centred A", PairCentredForm{pairLanesA}, tier);
+    expectVectorMatchesScalar("pair raw A", PairRawForm{pairLanesA}, tier);
+    expectVectorMatchesScalar("pair raw B", PairRawForm{pairLanesB}, tier);
+    expectVectorMatchesScalar("hdtv", SixteenthsForm{lanesHDTV}, tier);
+    expectVectorMatchesScalar("yuv quad", SixteenthsForm{lanesYuvQuad}, tier);
+    expectVectorMatchesScalar("halves 2", YuvHalvesForm{rgbLanes2Set}, tier);
+    expectVectorMatchesScalar("halves 1", YuvHalvesForm{rgbLanes1Set}, tier);
+    expectVectorMatchesScalar("yuv wide truncated", YuvWideForm{rgbWideA, {0, 0, 0}}, tier);
+    expectVectorMatchesScalar("yuv wide rounded", YuvWideForm{rgbWideA, {32768, 32768, 32768}}, tier);
   }
 }
 

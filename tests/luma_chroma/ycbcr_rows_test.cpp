@@ -19,6 +19,7 @@
 namespace {
 
 using namespace zel::lc;
+using zel::VectorTier;
 using zel::test::TestImage;
 
 // ---- kernels: vector blocks against the scalar form ----
@@ -59,7 +60,7 @@ void rowsAgree(int inBytes, int outBytes, Blocked blocked, Scalar scalar, const 
         blocked(src.first, vector.first, width, tier);
         scalar(src.first, plain.first, width);
         ASSERT_TRUE(vector.bytes == plain.bytes)
-            << "width " << width << " offset " << offset << " " << zel::lc::test::tierName(tier);
+            << "width " << width << " offset " << offset << " " << zel::tierName(tier);
       }
 }
 
@@ -136,7 +137,7 @@ void everyTripleMatches(const Form& form) {
         }
         convertRow(PackedIn<3>{src.data()}, PackedOut3<false>{got.data()}, 256, 256, form, form, tier);
         formPixels(PackedIn<3>{src.data()}, PackedOut3<false>{want.data()}, 0, 256, form);
-        ASSERT_TRUE(got == want) << "Cb " << cb << " Cr " << cr << " " << zel::lc::test::tierName(tier);
+        ASSERT_TRUE(got == want) << "Cb " << cb << " Cr " << cr << " " << zel::tierName(tier);
       }
   }
 }

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "frame/scalar_ops.h"
+#include "luma_chroma/tier_params.h"
 #include "luma_chroma/vector_units.h"
 #include "luma_chroma/yuv_lanes.h"
 
@@ -99,9 +100,6 @@ inline std::vector<VectorTier> rowTiers(bool bytePermutes = true) {
   if (hasAvx2()) tiers.push_back(VectorTier::Avx2);
   if (bytePermutes ? hasAvx512Vbmi() : hasAvx512()) tiers.push_back(VectorTier::Avx512);
   return tiers;
-}
-inline const char* tierName(VectorTier t) {
-  return t == VectorTier::Avx512 ? "AVX-512" : t == VectorTier::Avx2 ? "AVX2" : "SSE4.1";
 }
 
 // Row widths for the kernel tests: every width up to 70 (the 16- and 32-pixel

@@ -17,6 +17,7 @@
 namespace {
 
 using namespace zel::lc;
+using zel::VectorTier;
 using zel::rowAt;
 using zel::lc::test::str;
 using zel::test::TestImage;
@@ -254,7 +255,7 @@ TEST(YuvMembers, LaneBodiesGiveTheLaneFormForEverySample) {
       for (VectorTier tier : zel::lc::test::rowTiers()) {
         yuvToRgbC3Row(src.data(), out3.data(), 256, tier);
         yuvToRgbC3C4Row(src.data(), out4.data(), 256, 7, tier);
-        ASSERT_TRUE(out3 == want3 && out4 == want4) << "U " << u << " V " << v << " " << zel::lc::test::tierName(tier);
+        ASSERT_TRUE(out3 == want3 && out4 == want4) << "U " << u << " V " << v << " " << zel::tierName(tier);
       }
     }
 }
@@ -275,7 +276,7 @@ TEST(YuvMembers, MatrixBodyGivesTheLaneFormForEverySample) {
         for (int r = 0; r < 256; ++r) {
           const Pixel8 want = yuvMatrixLanes(r, g, b);
           ASSERT_TRUE(dst[0][r] == want.c0 && dst[1][r] == want.c1 && dst[2][r] == want.c2)
-              << r << "," << g << "," << b << " " << zel::lc::test::tierName(tier);
+              << r << "," << g << "," << b << " " << zel::tierName(tier);
         }
       }
 }

@@ -11,8 +11,10 @@
 #include <type_traits>
 #include <vector>
 
+#include "frame/descriptor.h"
 #include "frame/simd.h"
 #include "pixel_ops/twist.h"
+#include "support/guarded_call.h"
 #include "support/test_image.h"
 #include "zelcc/zelcc.h"
 
@@ -34,16 +36,44 @@ Matrix randomMatrix(std::mt19937& rng, float weight, float constant) {
   return m;
 }
 
+// Weights and constants that are multiples of a quarter, so that many
+// outputs fall exactly halfway between two integers.
+Matrix tieMatrix(std::mt19937& rng, float constant) {
+  const float weights[] = {0.5f, -0.5f, 1.5f, 0.25f, -0.75f, 2.5f, -1.25f};
+  std::uniform_int_distribution<int> c(-int(constant), int(constant));
+  Matrix m{};
+  for (int i = 0; i < 3; ++i) {
+    for (int j = 0; j < 3; ++j) m.t[i][j] = weights[rng() % std::size(weights)];
+    m.t[i][3] = float(c(rng)) + 0.5f;
+  }
+  return m;
+}
+
+using zel::VectorTier;
+
+bool hasTier(VectorTier tier) {
+  return tier == VectorTier::Sse41 || (tier == VectorTier::Avx2 && zel::hasAvx2()) ||
+         (tier == VectorTier::Avx512 && integerTier() == VectorTier::Avx512);
+}
+
+const std::vector<int> kWidths70 = [] {
+  std::vector<int> w;
+  for (int x = 1; x <= 70; ++x) w.push_back(x);
+  return w;
+}();
+
 // Rows of one layout through the kernel, in place or not, against the
 // formula of each sample; alpha and everything past the row unchanged.
+// A weight of -1 asks for tieMatrix.
 template <typename T, int K>
-void checkKernel(float weight, float constant, bool inPlace, bool wide) {
+void checkKernel(float weight, float constant, bool inPlace, VectorTier tier,
+                 const std::vector<int>& widths = kWidths70) {
   std::mt19937 rng(K * 100 + int(sizeof(T)));
   const int planes = K == Planar ? 3 : 1, perPixel = K == Planar ? 1 : K;
-  for (int width = 1; width <= 70; ++width)
+  for (int width : widths)
     for (int offset : {0, 1, 2, 5}) {
       if (offset % int(sizeof(T))) continue;
-      const Matrix m = randomMatrix(rng, weight, constant);
+      const Matrix m = weight < 0 ? tieMatrix(rng, constant) : randomMatrix(rng, weight, constant);
       std::vector<TestImage<T>> src, dst;
       for (int k = 0; k < planes; ++k) {
         src.emplace_back(width * perPixel, 1, offset);
@@ -66,7 +96,7 @@ void checkKernel(float weight, float constant, bool inPlace, bool wide) {
         s[k] = src[k < planes ? k : 0].data();
         d[k] = out[k < planes ? k : 0].data();
       }
-      row<T, K>(s, d, width, m, wide);
+      row<T, K>(s, d, width, m, tier);
       for (int x = 0; x < width; ++x) {
         auto inAt = [&](int ch) { return K == Planar ? in[ch][x] : in[0][x * K + ch]; };
         const float a = float(inAt(0)), b = float(inAt(1)), c = float(inAt(2));
@@ -85,15 +115,17 @@ void checkKernel(float weight, float constant, bool inPlace, bool wide) {
 }
 
 template <typename T>
-void checkAllLayouts(float weight, float constant) {
-  for (bool wide : {false, true}) {
-    if (wide && !zel::hasAvx2()) continue;
-    for (bool inPlace : {false, true}) {
-      checkKernel<T, C3>(weight, constant, inPlace, wide);
-      checkKernel<T, AC4>(weight, constant, inPlace, wide);
-      checkKernel<T, Planar>(weight, constant, inPlace, wide);
-    }
+void checkAllLayouts(float weight, float constant, VectorTier tier, const std::vector<int>& widths = kWidths70) {
+  for (bool inPlace : {false, true}) {
+    checkKernel<T, C3>(weight, constant, inPlace, tier, widths);
+    checkKernel<T, AC4>(weight, constant, inPlace, tier, widths);
+    checkKernel<T, Planar>(weight, constant, inPlace, tier, widths);
   }
+}
+template <typename T>
+void checkAllLayouts(float weight, float constant) {
+  for (VectorTier tier : {VectorTier::Sse41, VectorTier::Avx2})
+    if (hasTier(tier)) checkAllLayouts<T>(weight, constant, tier);
 }
 
 TEST(TwistKernels, BlocksMatchTheFormulaOfEveryType) {
@@ -103,6 +135,7 @@ TEST(TwistKernels, BlocksMatchTheFormulaOfEveryType) {
   checkAllLayouts<uint16_t>(1.5f, 40000.0f);
   checkAllLayouts<int16_t>(1.5f, 40000.0f);
   checkAllLayouts<float>(2.0f, 1.0f);
+  checkAllLayouts<uint8_t>(-1, 100.0f);  // ties
 }
 
 TEST(TwistKernels, NonFiniteAndHugeEntriesClampAlikeInBlocksAndTails) {
@@ -110,6 +143,100 @@ TEST(TwistKernels, NonFiniteAndHugeEntriesClampAlikeInBlocksAndTails) {
   checkAllLayouts<int8_t>(0, 0);
   checkAllLayouts<uint16_t>(0, 0);
   checkAllLayouts<int16_t>(0, 0);
+}
+
+// Sixteen-pixel blocks: every width up to 70 and a few past 128 (several
+// whole blocks, then the narrower blocks and the pixel tail).
+TEST(TwistKernels, SixteenPixelBlocksMatchTheFormula) {
+  if (!hasTier(VectorTier::Avx512)) GTEST_SKIP() << "no 512-bit tier with byte permutes";
+  std::vector<int> widths = kWidths70;
+  for (int w : {127, 128, 129, 143, 160, 171}) widths.push_back(w);
+  const VectorTier t = VectorTier::Avx512;
+  // Weights and constants big enough to reach both clamps often, including
+  // constants far beyond the sample range on either side.
+  checkAllLayouts<uint8_t>(1.5f, 200.0f, t, widths);
+  checkAllLayouts<uint8_t>(3.0f, 2000.0f, t, widths);
+  checkAllLayouts<int8_t>(1.5f, 200.0f, t, widths);
+  checkAllLayouts<uint16_t>(1.5f, 40000.0f, t, widths);
+  checkAllLayouts<int16_t>(1.5f, 40000.0f, t, widths);
+  // Non-finite and huge entries.
+  checkAllLayouts<uint8_t>(0, 0, t, widths);
+  checkAllLayouts<int8_t>(0, 0, t, widths);
+  checkAllLayouts<uint16_t>(0, 0, t, widths);
+  checkAllLayouts<int16_t>(0, 0, t, widths);
+  // Outputs halfway between integers round to even.
+  checkAllLayouts<uint8_t>(-1, 100.0f, t, widths);
+  checkAllLayouts<int8_t>(-1, 100.0f, t, widths);
+  checkAllLayouts<uint16_t>(-1, 100.0f, t, widths);
+  checkAllLayouts<int16_t>(-1, 100.0f, t, widths);
+}
+
+// Outputs near the end of the 32-bit range: the sixteen-pixel blocks leave
+// the clamp to the packs only while the matrix keeps every output below
+// 2^30; past 2^31 the rounded integer would be the indefinite one.
+TEST(TwistKernels, SixteenPixelBlocksClampOutputsBeyondTheIntegerRange) {
+  std::mt19937 rng(8);
+  EXPECT_TRUE(narrowingClamps<uint8_t>(randomMatrix(rng, 1.5f, 300.0f)));
+  Matrix m{};
+  m.t[0][0] = 4.2e6f;  // 255 * 4.2e6 = 1.071e9, just below 2^30
+  EXPECT_TRUE(narrowingClamps<uint8_t>(m));
+  EXPECT_FALSE(narrowingClamps<uint16_t>(m));
+  m.t[1][3] = -1.1e9f;
+  EXPECT_FALSE(narrowingClamps<uint8_t>(m));
+  m.t[1][3] = 0;
+  m.t[2][1] = std::numeric_limits<float>::quiet_NaN();
+  EXPECT_FALSE(narrowingClamps<uint8_t>(m));
+  m.t[2][1] = std::numeric_limits<float>::infinity();
+  EXPECT_FALSE(narrowingClamps<int16_t>(m));
+  EXPECT_FALSE(narrowingClamps<int8_t>(Matrix{{{0, 0, 0, 1.1e9f}}}));
+  EXPECT_TRUE(narrowingClamps<int8_t>(Matrix{{{8.3e6f, 0, 0, 0}}}));  // 128 * 8.3e6 < 2^30
+
+  if (!hasTier(VectorTier::Avx512)) GTEST_SKIP() << "no 512-bit tier with byte permutes";
+  // Weights that take sample 255 past 2^31 on either side, and one that
+  // stays just inside.
+  for (float w : {8.5e6f, -8.5e6f, 1.7e7f, 3.0e9f, 4.1e6f}) {
+    const Matrix big = {{{w, 0.5f, 0, 0.25f}, {0, -w, 1, 0}, {0.5f, 0, w, -w}}};
+    const int width = 100;
+    TestImage<uint8_t> in(width * 3, 1), out(width * 3, 1);
+    in.fillRandom(rng());
+    for (int x = 0; x < 12; ++x) in.set(x, 0, x % 2 ? 255 : 0);
+    const uint8_t* s[3] = {in.data(), in.data(), in.data()};
+    uint8_t* d[3] = {out.data(), out.data(), out.data()};
+    row<uint8_t, C3>(s, d, width, big, VectorTier::Avx512);
+    for (int x = 0; x < width; ++x)
+      for (int ch = 0; ch < 3; ++ch) {
+        const uint8_t* p = in.data() + 3 * x;
+        ASSERT_EQ(out.get(3 * x + ch, 0), Sample<uint8_t>::out(big, ch, p[0], p[1], p[2]))
+            << w << " pixel " << x << " ch " << ch;
+      }
+  }
+}
+
+// Every integer member at widths around the block sizes, the last row
+// ending on an inaccessible page, in each tier: no block reads or writes
+// past the row.
+TEST(TwistKernels, NoTierTouchesBytesPastTheRow) {
+  using namespace zel::meta;
+  const VectorTier cap = zel::vectorTierCap();
+  zel::test::GuardedCall guarded;
+  std::vector<VectorTier> tiers;
+  for (VectorTier tier : {VectorTier::Sse41, VectorTier::Avx2, VectorTier::Avx512})
+    if (hasTier(tier)) tiers.push_back(tier);
+  for (VectorTier tier : tiers) {
+    zel::setVectorTierCap(tier);
+    for (const Descriptor& d : allDescriptors()) {
+      if (d.name.rfind("zeliColorTwist32f_", 0) != 0) continue;
+      for (int width : {15, 16, 17, 21, 22, 31, 32, 33, 37, 38, 39, 47, 53, 54, 55, 64, 70}) {
+        Workspace w(d, ImageSize{width, 2}, 0, 0, Fence::After);
+        w.fillRandom(uint32_t(width));
+        const auto out = guarded.call(w);
+        ASSERT_FALSE(out.faulted) << d.name << " width " << width << ": " << out.message;
+        ASSERT_EQ(out.status, StatusOk) << d.name;
+        ASSERT_EQ(w.checkGuards(), "") << d.name << " width " << width;
+      }
+    }
+  }
+  zel::setVectorTierCap(cap);
 }
 
 TEST(TwistKernels, FloatRunsMatchTheFormula) {
