@@ -199,6 +199,7 @@ struct PackedIn {
       return {out[0], out[1], out[2]};
     }
   }
+  // 64 pixels for the full-resolution forms (see the 64-pixel blocks above).
   ZEL_AVX512_VBMI ZEL_INLINE HighWords512 highWords512(int x) const {
     const uint8_t* q = p + Stride * x;
     const HighGather<Stride>& g = kHighGather<Stride>;
@@ -227,6 +228,7 @@ struct PlanesIn {
   ZEL_INLINE Trio<U> block(int x) const {
     return {U::loadUnits(p0 + x, 16), U::loadUnits(p1 + x, 16), U::loadUnits(p2 + x, 16)};
   }
+  // 64 pixels for the full-resolution forms (see the 64-pixel blocks above).
   ZEL_AVX512_VBMI ZEL_INLINE HighWords512 highWords512(int x) const {
     const HighGather<1>& g = kHighGather<1>;
     const __m512i lo = indexOf(g.half[0][0]), hi = indexOf(g.half[1][0]);
@@ -267,6 +269,7 @@ struct PackedOut3 {
       }
     }
   }
+  // 64 pixels from lane-split bytes (block<Avx512> takes memory order).
   ZEL_AVX512_VBMI ZEL_INLINE void block512(int x, const Trio<Avx512>& v) const {
     const __m512i first = Reverse ? v.c2 : v.c0, third = Reverse ? v.c0 : v.c2;
     const SplitScatter<3>& s = kSplitScatter<3>;
@@ -307,6 +310,7 @@ struct PackedOutAlpha {
       U::storeUnits(q + 48, 64, U::unpackHi16(hi01, hi23));
     }
   }
+  // 64 pixels from lane-split bytes (block<Avx512> takes memory order).
   ZEL_AVX512_VBMI ZEL_INLINE void block512(int x, const Trio<Avx512>& v) const {
     const SplitScatter<4>& s = kSplitScatter<4>;
     const __m512i a = _mm512_set1_epi8(static_cast<char>(alpha));
@@ -342,7 +346,8 @@ struct PackedOutKeep {
     uint8_t* q = p + 4 * x;
     for (int i = 0; i < U::kPixels; ++i) std::memcpy(q + 4 * i, px + 4 * i, 3);
   }
-  // A masked store writes the three bytes of each pixel and no other.
+  // 64 pixels from lane-split bytes; a masked store writes the three bytes
+  // of each pixel and no other.
   ZEL_AVX512_VBMI ZEL_INLINE void block512(int x, const Trio<Avx512>& v) const {
     const SplitScatter<4>& s = kSplitScatter<4>;
     uint8_t* q = p + 4 * x;
@@ -366,6 +371,7 @@ struct PlanesOut {
     U::storeUnits(p1 + x, 16, v.c1);
     U::storeUnits(p2 + x, 16, v.c2);
   }
+  // 64 pixels from lane-split bytes (block<Avx512> takes memory order).
   ZEL_AVX512_VBMI ZEL_INLINE void block512(int x, const Trio<Avx512>& v) const {
     const __m512i order = indexOf(kToMemory);
     _mm512_storeu_si512(p0 + x, _mm512_maskz_permutexvar_epi8(kToMemory.mask, order, v.c0));
