@@ -24,6 +24,15 @@
 
 namespace zel::lc {
 
+using zel::VectorTier;
+
+// The widest unit the row kernels of these families take on this processor
+// (under the tier cap): the 512-bit one needs the byte permutes too.
+inline VectorTier rowTier() {
+  if (hasAvx512Vbmi()) return VectorTier::Avx512;
+  return hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41;
+}
+
 // The scalar meaning of a 16-bit lane sum without saturation: it wraps.
 // With the luma-chroma constants no sum comes near the limit.
 inline int16_t wrapAdd16(int a, int b) { return static_cast<int16_t>(a + b); }
