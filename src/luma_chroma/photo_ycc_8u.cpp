@@ -39,28 +39,28 @@ struct InverseWide {
 // The body runs below width AND NOT 7 for three-byte pixels and below width
 // AND NOT 3 for four-byte ones, whose fourth byte is kept.
 template <int Channels, class Body, class Tail>
-void yccRow8u(const uint8_t* src, uint8_t* dst, int width, bool avx2) {
+void yccRow8u(const uint8_t* src, uint8_t* dst, int width, VectorTier tier) {
   if constexpr (Channels == 3)
-    convertRow(PackedIn<3>{src}, PackedOut3<false>{dst}, width, width & ~7, Body{}, Tail{}, avx2);
+    convertRow(PackedIn<3>{src}, PackedOut3<false>{dst}, width, width & ~7, Body{}, Tail{}, tier);
   else
-    convertRow(PackedIn<4>{src}, PackedOutKeep{dst}, width, width & ~3, Body{}, Tail{}, avx2);
+    convertRow(PackedIn<4>{src}, PackedOutKeep{dst}, width, width & ~3, Body{}, Tail{}, tier);
 }
 
 }  // namespace
 
 template <int Channels>
-void rgbToYcc8uRow(const uint8_t* src, uint8_t* dst, int width, bool avx2) {
-  yccRow8u<Channels, ForwardLanes, ForwardWide>(src, dst, width, avx2);
+void rgbToYcc8uRow(const uint8_t* src, uint8_t* dst, int width, VectorTier tier) {
+  yccRow8u<Channels, ForwardLanes, ForwardWide>(src, dst, width, tier);
 }
 template <int Channels>
-void yccToRgb8uRow(const uint8_t* src, uint8_t* dst, int width, bool avx2) {
-  yccRow8u<Channels, InverseLanes, InverseWide>(src, dst, width, avx2);
+void yccToRgb8uRow(const uint8_t* src, uint8_t* dst, int width, VectorTier tier) {
+  yccRow8u<Channels, InverseLanes, InverseWide>(src, dst, width, tier);
 }
 
-template void rgbToYcc8uRow<3>(const uint8_t*, uint8_t*, int, bool);
-template void rgbToYcc8uRow<4>(const uint8_t*, uint8_t*, int, bool);
-template void yccToRgb8uRow<3>(const uint8_t*, uint8_t*, int, bool);
-template void yccToRgb8uRow<4>(const uint8_t*, uint8_t*, int, bool);
+template void rgbToYcc8uRow<3>(const uint8_t*, uint8_t*, int, VectorTier);
+template void rgbToYcc8uRow<4>(const uint8_t*, uint8_t*, int, VectorTier);
+template void yccToRgb8uRow<3>(const uint8_t*, uint8_t*, int, VectorTier);
+template void yccToRgb8uRow<4>(const uint8_t*, uint8_t*, int, VectorTier);
 
 }  // namespace zel::lc
 

@@ -82,9 +82,10 @@ struct Float3 {
   float c0, c1, c2;
 };
 
-// Float lanes at two widths, one operation per intrinsic, so the same form
+// Float lanes at three widths, one operation per intrinsic, so the same form
 // gives the same bits lane by lane: Ps4 four lanes (SSE), Ps8 eight (AVX2,
-// lane k + 4 of a block is pixel k + 4).
+// lane k + 4 of a block is pixel k + 4), Ps16 sixteen (512-bit, in pixel
+// order).
 struct Ps4 {
   using V = __m128;
   static V set(float v) { return _mm_set1_ps(v); }
@@ -105,6 +106,18 @@ struct Ps8 {
   ZEL_AVX2 static V mul(V a, V b) { return _mm256_mul_ps(a, b); }
   ZEL_AVX2 static V min(V a, V b) { return _mm256_min_ps(a, b); }
   ZEL_AVX2 static V max(V a, V b) { return _mm256_max_ps(a, b); }
+};
+struct Ps16 {
+  using V = __m512;
+  ZEL_AVX512 static V set(float v) { return _mm512_set1_ps(v); }
+  ZEL_AVX512 static V zero() { return _mm512_setzero_ps(); }
+  ZEL_AVX512 static V add(V a, V b) { return _mm512_add_ps(a, b); }
+  ZEL_AVX512 static V sub(V a, V b) { return _mm512_sub_ps(a, b); }
+  ZEL_AVX512 static V mul(V a, V b) { return _mm512_mul_ps(a, b); }
+  // The all-ones zero mask is the plain instruction (without the undefined
+  // merge source that the unmasked form hands the compiler).
+  ZEL_AVX512 static V min(V a, V b) { return _mm512_maskz_min_ps(__mmask16(~0u), a, b); }
+  ZEL_AVX512 static V max(V a, V b) { return _mm512_maskz_max_ps(__mmask16(~0u), a, b); }
 };
 
 template <class P>
@@ -224,12 +237,15 @@ ZEL_INLINE FloatTrio<P> yccToRgb32f(typename P::V Y, typename P::V C1, typename 
   return {clampUnit<P>(P::add(y, c2)), clampUnit<P>(g), clampUnit<P>(P::add(y, c1))};
 }
 
-// The four float forms as row forms, at either width.
+// The four float forms as row forms, at every width.
 #define ZEL_PHOTO_YCC_FORM(Name, form)                                                                         \
   struct Name {                                                                                                \
     Float3 operator()(float a, float b, float c) const { return form(a, b, c); }                              \
     Floats3 operator()(__m128 a, __m128 b, __m128 c) const { return form<Ps4>(a, b, c); }                     \
     ZEL_AVX2 ZEL_INLINE FloatTrio<Ps8> operator()(__m256 a, __m256 b, __m256 c) const { return form<Ps8>(a, b, c); } \
+    ZEL_AVX512 ZEL_INLINE FloatTrio<Ps16> operator()(__m512 a, __m512 b, __m512 c) const {                     \
+      return form<Ps16>(a, b, c);                                                                              \
+    }                                                                                                          \
   };
 ZEL_PHOTO_YCC_FORM(RgbToYccBody16Form, rgbToYccBody16)
 ZEL_PHOTO_YCC_FORM(YccToRgbBody16Form, yccToRgbBody16)

@@ -71,6 +71,89 @@ template <int Stride>
 inline constexpr GatherPatterns<Stride> kGather = makeGather<Stride>();
 inline constexpr RotatePatterns kRotate3 = makeRotate();
 
+// ---- 64-pixel blocks (Avx512) ----
+
+// The full-resolution rows hand a form 64 pixels as two halves of 16-bit
+// lanes, pixels 0..31 and 32..63 in order, each sample in the high byte of
+// its lane (S << 8): one zero-masked byte permute a half and channel. The
+// form's bytes come back in lane-split order, the order in which the byte
+// pack of the two halves leaves them: byte m of 128-bit lane k is pixel
+// 8k + m for m < 8 and pixel 32 + 8k + m - 8 for m >= 8.
+constexpr int splitPosition(int p) { return 16 * ((p & 31) >> 3) + (p & 32 ? 8 : 0) + (p & 7); }
+
+// The odd bytes: the high bytes of the 16-bit lanes.
+inline constexpr uint64_t kHighByteLanes = 0xAAAAAAAAAAAAAAAAu;
+
+// Interleaved pixels of Stride bytes: half h reads two 64-byte parts of the
+// block (the first two, or the last two); half[h][c] names, in the high byte
+// of lane w, the byte of those 128 that holds channel c of pixel 32h + w.
+// Planes (Stride 1) take half[h][0] from their 64 bytes.
+template <int Stride>
+struct HighGather {
+  Permute64 half[2][3];
+};
+template <int Stride>
+constexpr HighGather<Stride> makeHighGather() {
+  HighGather<Stride> g{};
+  for (int h = 0; h < 2; ++h)
+    for (int c = 0; c < 3; ++c) {
+      g.half[h][c].mask = kHighByteLanes;
+      for (int w = 0; w < 32; ++w) {
+        const int first = Stride > 1 ? 64 * (Stride - 2) * h : 0;  // the half's first byte
+        g.half[h][c].index[2 * w + 1] = static_cast<uint8_t>(Stride * (32 * h + w) + c - first);
+      }
+    }
+  return g;
+}
+
+struct HighWords512 {
+  Trio<Avx512> lo, hi;
+};
+
+// Interleaved destinations of Stride bytes a pixel from lane-split bytes,
+// 64 bytes at a time: byte j of part r takes the pixel at position
+// part[r].index[j] of the channel that its place names (plus 64 for the
+// second channel, read from the second of two tables); part[r].mask marks
+// the bytes of the third channel. A fourth channel's bytes are kFourthBytes.
+template <int Stride>
+struct SplitScatter {
+  Permute64 part[Stride];
+};
+template <int Stride>
+constexpr SplitScatter<Stride> makeSplitScatter() {
+  SplitScatter<Stride> s{};
+  for (int r = 0; r < Stride; ++r)
+    for (int j = 0; j < 64; ++j) {
+      const int at = 64 * r + j, channel = at % Stride;
+      s.part[r].index[j] = static_cast<uint8_t>(splitPosition(at / Stride) + (channel == 1 ? 64 : 0));
+      if (channel == 2) s.part[r].mask |= uint64_t(1) << j;
+    }
+  return s;
+}
+inline constexpr uint64_t kFourthBytes = 0x8888888888888888u;
+
+// Plane bytes from lane-split order to memory order.
+constexpr Permute64 makeMemoryOrder() {
+  Permute64 o{};
+  for (int j = 0; j < 64; ++j) o.index[j] = static_cast<uint8_t>(splitPosition(j));
+  o.mask = ~uint64_t(0);
+  return o;
+}
+
+template <int Stride>
+inline constexpr HighGather<Stride> kHighGather = makeHighGather<Stride>();
+template <int Stride>
+inline constexpr SplitScatter<Stride> kSplitScatter = makeSplitScatter<Stride>();
+inline constexpr Permute64 kToMemory = makeMemoryOrder();
+
+// Four-byte pixels of one 64-byte part of an interleaved destination: the
+// first three channels placed, the fourth byte left to the caller.
+ZEL_AVX512_VBMI inline __m512i scatterPart(const SplitScatter<4>& s, int r, __m512i first, __m512i second,
+                                           __m512i third) {
+  const __m512i index = indexOf(s.part[r]);
+  return _mm512_mask_permutexvar_epi8(_mm512_permutex2var_epi8(first, index, second), s.part[r].mask, index, third);
+}
+
 // ---- sources ----
 
 // Interleaved pixels of Stride bytes (C3: 3, AC4: 4; a fourth byte is
@@ -116,6 +199,19 @@ struct PackedIn {
       return {out[0], out[1], out[2]};
     }
   }
+  // 64 pixels for the full-resolution forms (see the 64-pixel blocks above).
+  ZEL_AVX512_VBMI ZEL_INLINE HighWords512 highWords512(int x) const {
+    const uint8_t* q = p + Stride * x;
+    const HighGather<Stride>& g = kHighGather<Stride>;
+    __m512i chunk[Stride];
+    for (int k = 0; k < Stride; ++k) chunk[k] = _mm512_loadu_si512(q + 64 * k);
+    __m512i out[2][3];
+    for (int h = 0; h < 2; ++h)
+      for (int c = 0; c < 3; ++c)
+        out[h][c] = _mm512_maskz_permutex2var_epi8(g.half[h][c].mask, chunk[h ? Stride - 2 : 0],
+                                                   indexOf(g.half[h][c]), chunk[h ? Stride - 1 : 1]);
+    return {{out[0][0], out[0][1], out[0][2]}, {out[1][0], out[1][1], out[1][2]}};
+  }
 };
 
 // Three planes at full resolution.
@@ -131,6 +227,16 @@ struct PlanesIn {
   template <class U>
   ZEL_INLINE Trio<U> block(int x) const {
     return {U::loadUnits(p0 + x, 16), U::loadUnits(p1 + x, 16), U::loadUnits(p2 + x, 16)};
+  }
+  // 64 pixels for the full-resolution forms (see the 64-pixel blocks above).
+  ZEL_AVX512_VBMI ZEL_INLINE HighWords512 highWords512(int x) const {
+    const HighGather<1>& g = kHighGather<1>;
+    const __m512i lo = indexOf(g.half[0][0]), hi = indexOf(g.half[1][0]);
+    const __m512i a = _mm512_loadu_si512(p0 + x), b = _mm512_loadu_si512(p1 + x), c = _mm512_loadu_si512(p2 + x);
+    return {{half(lo, a), half(lo, b), half(lo, c)}, {half(hi, a), half(hi, b), half(hi, c)}};
+  }
+  ZEL_AVX512_VBMI ZEL_INLINE static __m512i half(__m512i index, __m512i v) {
+    return _mm512_maskz_permutexvar_epi8(kHighByteLanes, index, v);
   }
 };
 
@@ -163,6 +269,17 @@ struct PackedOut3 {
       }
     }
   }
+  // 64 pixels from lane-split bytes (block<Avx512> takes memory order).
+  ZEL_AVX512_VBMI ZEL_INLINE void block512(int x, const Trio<Avx512>& v) const {
+    const __m512i first = Reverse ? v.c2 : v.c0, third = Reverse ? v.c0 : v.c2;
+    const SplitScatter<3>& s = kSplitScatter<3>;
+    uint8_t* q = p + 3 * x;
+    for (int r = 0; r < 3; ++r) {
+      const __m512i index = indexOf(s.part[r]);
+      const __m512i two = _mm512_permutex2var_epi8(first, index, v.c1);
+      _mm512_storeu_si512(q + 64 * r, _mm512_mask_permutexvar_epi8(two, s.part[r].mask, index, third));
+    }
+  }
 };
 
 // Four-byte pixels whose fourth byte is the caller's alpha (C4).
@@ -193,6 +310,16 @@ struct PackedOutAlpha {
       U::storeUnits(q + 48, 64, U::unpackHi16(hi01, hi23));
     }
   }
+  // 64 pixels from lane-split bytes (block<Avx512> takes memory order).
+  ZEL_AVX512_VBMI ZEL_INLINE void block512(int x, const Trio<Avx512>& v) const {
+    const SplitScatter<4>& s = kSplitScatter<4>;
+    const __m512i a = _mm512_set1_epi8(static_cast<char>(alpha));
+    uint8_t* q = p + 4 * x;
+    for (int r = 0; r < 4; ++r) {
+      const __m512i rgb = scatterPart(s, r, Reverse ? v.c2 : v.c0, v.c1, Reverse ? v.c0 : v.c2);
+      _mm512_storeu_si512(q + 64 * r, _mm512_mask_blend_epi8(kFourthBytes, rgb, a));
+    }
+  }
 };
 
 // Four-byte pixels whose fourth byte is left as it is (AC4). Written one
@@ -219,6 +346,14 @@ struct PackedOutKeep {
     uint8_t* q = p + 4 * x;
     for (int i = 0; i < U::kPixels; ++i) std::memcpy(q + 4 * i, px + 4 * i, 3);
   }
+  // 64 pixels from lane-split bytes; a masked store writes the three bytes
+  // of each pixel and no other.
+  ZEL_AVX512_VBMI ZEL_INLINE void block512(int x, const Trio<Avx512>& v) const {
+    const SplitScatter<4>& s = kSplitScatter<4>;
+    uint8_t* q = p + 4 * x;
+    for (int r = 0; r < 4; ++r)
+      _mm512_mask_storeu_epi8(q + 64 * r, ~kFourthBytes, scatterPart(s, r, v.c0, v.c1, v.c2));
+  }
 };
 
 struct PlanesOut {
@@ -236,6 +371,13 @@ struct PlanesOut {
     U::storeUnits(p1 + x, 16, v.c1);
     U::storeUnits(p2 + x, 16, v.c2);
   }
+  // 64 pixels from lane-split bytes (block<Avx512> takes memory order).
+  ZEL_AVX512_VBMI ZEL_INLINE void block512(int x, const Trio<Avx512>& v) const {
+    const __m512i order = indexOf(kToMemory);
+    _mm512_storeu_si512(p0 + x, _mm512_maskz_permutexvar_epi8(kToMemory.mask, order, v.c0));
+    _mm512_storeu_si512(p1 + x, _mm512_maskz_permutexvar_epi8(kToMemory.mask, order, v.c1));
+    _mm512_storeu_si512(p2 + x, _mm512_maskz_permutexvar_epi8(kToMemory.mask, order, v.c2));
+  }
 };
 
 // ---- the row converter ----
@@ -252,25 +394,71 @@ struct TakesBytes : std::false_type {};
 template <class Form>
 struct TakesBytes<Form, std::void_t<decltype(Form::kBytes)>> : std::bool_constant<Form::kBytes> {};
 
+// One block of bytes in, bytes out, by the form's own byte path or by its
+// 16-bit lanes on the two widened halves.
+template <class U, class Form>
+ZEL_INLINE Trio<U> formBlock(const Form& form, const Trio<U>& s) {
+  if constexpr (TakesBytes<Form>::value) {
+    return form.template bytes<U>(s);
+  } else {
+    const Wide16<U> a = widen<U>(s.c0), b = widen<U>(s.c1), c = widen<U>(s.c2);
+    const Trio<U> lo = form.template lanes<U>(Trio<U>{a.lo, b.lo, c.lo});
+    const Trio<U> hi = form.template lanes<U>(Trio<U>{a.hi, b.hi, c.hi});
+    return {U::packU8(lo.c0, hi.c0), U::packU8(lo.c1, hi.c1), U::packU8(lo.c2, hi.c2)};
+  }
+}
+
 template <class U, class In, class Out, class Form>
 ZEL_INLINE int formBlocks(const In& in, const Out& out, int x, int end, const Form& form) {
-  if constexpr (TakesBytes<Form>::value) {
-    for (; x + U::kPixels <= end; x += U::kPixels) out.template block<U>(x, form.template bytes<U>(in.template block<U>(x)));
-  } else {
-    for (; x + U::kPixels <= end; x += U::kPixels) {
-      const Trio<U> s = in.template block<U>(x);
-      const Wide16<U> a = widen<U>(s.c0), b = widen<U>(s.c1), c = widen<U>(s.c2);
-      const Trio<U> lo = form.template lanes<U>(Trio<U>{a.lo, b.lo, c.lo});
-      const Trio<U> hi = form.template lanes<U>(Trio<U>{a.hi, b.hi, c.hi});
-      out.template block<U>(x, Trio<U>{U::packU8(lo.c0, hi.c0), U::packU8(lo.c1, hi.c1), U::packU8(lo.c2, hi.c2)});
-    }
-  }
+  for (; x + U::kPixels <= end; x += U::kPixels) out.template block<U>(x, formBlock<U>(form, in.template block<U>(x)));
   return x;
 }
 
 template <class In, class Out, class Form>
-ZEL_AVX2 __attribute__((flatten)) int formBlocksAvx(const In& in, const Out& out, int end, const Form& form) {
-  return formBlocks<Avx>(in, out, 0, end, form);
+ZEL_AVX2 __attribute__((flatten)) int formBlocksAvx(const In& in, const Out& out, int x, int end, const Form& form) {
+  return formBlocks<Avx>(in, out, x, end, form);
+}
+
+// A form may take samples in the high bytes of 16-bit lanes (S << 8), as
+// the 64-pixel blocks give them: `highLanes<U>` (kHighLanes) maps them to
+// lanes before SaturateU8, `highBytes<U>` (kHighBytes) maps both halves to
+// the bytes of the block. Other forms take the samples shifted down.
+template <class Form, class = void>
+struct TakesHighLanes : std::false_type {};
+template <class Form>
+struct TakesHighLanes<Form, std::void_t<decltype(Form::kHighLanes)>> : std::bool_constant<Form::kHighLanes> {};
+template <class Form, class = void>
+struct TakesHighBytes : std::false_type {};
+template <class Form>
+struct TakesHighBytes<Form, std::void_t<decltype(Form::kHighBytes)>> : std::bool_constant<Form::kHighBytes> {};
+
+template <class Form>
+ZEL_INLINE Trio<Avx512> formHighWords(const Form& form, const HighWords512& w) {
+  using U = Avx512;
+  if constexpr (TakesHighBytes<Form>::value) {
+    return form.template highBytes<U>(w.lo, w.hi);
+  } else {
+    Trio<U> lo, hi;
+    if constexpr (TakesHighLanes<Form>::value) {
+      lo = form.template highLanes<U>(w.lo);
+      hi = form.template highLanes<U>(w.hi);
+    } else {
+      auto down = [](const Trio<U>& t) ZEL_LAMBDA_INLINE {
+        return Trio<U>{U::template srl16<8>(t.c0), U::template srl16<8>(t.c1), U::template srl16<8>(t.c2)};
+      };
+      lo = form.template lanes<U>(down(w.lo));
+      hi = form.template lanes<U>(down(w.hi));
+    }
+    return {U::packU8(lo.c0, hi.c0), U::packU8(lo.c1, hi.c1), U::packU8(lo.c2, hi.c2)};
+  }
+}
+
+// 64-pixel blocks from the start of the row.
+template <class In, class Out, class Form>
+ZEL_AVX512_VBMI __attribute__((flatten)) int formBlocks512(const In& in, const Out& out, int end, const Form& form) {
+  int x = 0;
+  for (; x + 64 <= end; x += 64) out.block512(x, formHighWords(form, in.highWords512(x)));
+  return x;
 }
 
 template <class In, class Out, class Form>
@@ -284,14 +472,16 @@ inline void formPixels(const In& in, const Out& out, int x, int end, const Form&
 }
 
 // Pixels [0, bodyEnd) take the body form, [bodyEnd, width) the tail form.
-// Whole vector blocks of the body run in AVX2 (when `avx2`) and SSE4.1;
-// the body's last pixels take the same form one at a time.
+// Whole vector blocks of the body run at the widest unit that `tier` allows
+// (64 pixels, then 32, then 16); the body's last pixels take the same form
+// one at a time.
 template <class In, class Out, class Body, class Tail>
 inline void convertRow(const In& in, const Out& out, int width, int bodyEnd, const Body& body, const Tail& tail,
-                       bool avx2) {
+                       VectorTier tier) {
   int x = 0;
   if constexpr (Body::kVector) {
-    if (avx2) x = formBlocksAvx(in, out, bodyEnd, body);
+    if (tier >= VectorTier::Avx512) x = formBlocks512(in, out, bodyEnd, body);
+    if (tier >= VectorTier::Avx2) x = formBlocksAvx(in, out, x, bodyEnd, body);
     x = formBlocks<Sse>(in, out, x, bodyEnd, body);
   }
   formPixels(in, out, x, bodyEnd, body);

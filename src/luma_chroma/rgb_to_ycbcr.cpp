@@ -16,10 +16,10 @@ namespace {
 // and the wide form after it.
 template <class Body, class InRow, class OutRow>
 void walkRows(ImageSize size, int blockMask, const Body& body, InRow inRow, OutRow outRow) {
-  const bool avx2 = hasAvx2();
+  const VectorTier tier = unitTier();
   const int bodyEnd = size.width & ~blockMask;
   plainWalk(size.height,
-            [&](int y) { convertRow(inRow(y), outRow(y), size.width, bodyEnd, body, WideFwd{}, avx2); });
+            [&](int y) { convertRow(inRow(y), outRow(y), size.width, bodyEnd, body, WideFwd{}, tier); });
 }
 
 bool badSize(ImageSize size) { return size.width < 1 || size.height < 1; }

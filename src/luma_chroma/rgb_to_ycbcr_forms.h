@@ -83,11 +83,11 @@ struct LaneYCbCr {
   typename U::V y, cb, cr;  // 16-bit lanes before SaturateU8
 };
 
+// From the samples shifted left by 8 (r8) and by 7 (r7).
 template <class U>
-ZEL_INLINE LaneYCbCr<U> ycbcrHighWord(typename U::V r, typename U::V g, typename U::V b) {
+ZEL_INLINE LaneYCbCr<U> ycbcrHighWord(typename U::V r8, typename U::V g8, typename U::V b8, typename U::V r7,
+                                      typename U::V g7, typename U::V b7) {
   using V = typename U::V;
-  const V r8 = U::template sll16<8>(r), g8 = U::template sll16<8>(g), b8 = U::template sll16<8>(b);
-  const V r7 = U::template sll16<7>(r), g7 = U::template sll16<7>(g), b7 = U::template sll16<7>(b);
   const V ys = U::addSatU16(U::addSatU16(U::addSatU16(U::mulHighU16(r8, U::set16(kYR)), U::mulHighU16(g8, U::set16(kYG))),
                                          U::mulHighU16(b8, U::set16(kYB))),
                             U::set16(128));
@@ -101,14 +101,25 @@ ZEL_INLINE LaneYCbCr<U> ycbcrHighWord(typename U::V r, typename U::V g, typename
 }
 
 template <class U>
-ZEL_INLINE LaneYCbCr<U> ycbcrRounded(typename U::V r, typename U::V g, typename U::V b) {
+ZEL_INLINE LaneYCbCr<U> ycbcrHighWord(typename U::V r, typename U::V g, typename U::V b) {
+  return ycbcrHighWord<U>(U::template sll16<8>(r), U::template sll16<8>(g), U::template sll16<8>(b),
+                          U::template sll16<7>(r), U::template sll16<7>(g), U::template sll16<7>(b));
+}
+
+// From the samples shifted left by 7.
+template <class U>
+ZEL_INLINE LaneYCbCr<U> ycbcrRounded7(typename U::V r7, typename U::V g7, typename U::V b7) {
   using V = typename U::V;
-  const V r7 = U::template sll16<7>(r), g7 = U::template sll16<7>(g), b7 = U::template sll16<7>(b);
   auto m = [&](V s, int c) ZEL_LAMBDA_INLINE { return U::mulHighRound(s, U::set16(c)); };
   const V y = U::add16(U::add16(U::add16(m(r7, 4211), m(g7, 8258)), m(b7, 1606)), U::set16(1026));
   const V cb = U::add16(U::sub16(U::sub16(m(b7, 7193), m(g7, 4768)), m(r7, 2425)), U::set16(8194));
   const V cr = U::add16(U::sub16(U::sub16(m(r7, 7193), m(g7, 6029)), m(b7, 1163)), U::set16(8194));
   return {U::template sra16<6>(y), U::template sra16<6>(cb), U::template sra16<6>(cr)};
+}
+
+template <class U>
+ZEL_INLINE LaneYCbCr<U> ycbcrRounded(typename U::V r, typename U::V g, typename U::V b) {
+  return ycbcrRounded7<U>(U::template sll16<7>(r), U::template sll16<7>(g), U::template sll16<7>(b));
 }
 
 // ---- the forms as row forms: samples R, G, B in, Y, Cb, Cr out ----
@@ -121,22 +132,37 @@ struct WideFwd {
   __m128i pixels4(__m128i px) const { return ycbcrWide4(px); }
 };
 
+// `highLanes` takes the samples shifted left by 8 (see pixel_rows.h).
 struct HighWordFwd {
   static constexpr bool kVector = true;
+  static constexpr bool kHighLanes = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(ycbcrHighWord(s.c0, s.c1, s.c2)); }
   template <class U>
   ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     const LaneYCbCr<U> r = ycbcrHighWord<U>(s.c0, s.c1, s.c2);
     return {r.y, r.cb, r.cr};
   }
+  template <class U>
+  ZEL_INLINE Trio<U> highLanes(const Trio<U>& s8) const {
+    const LaneYCbCr<U> r = ycbcrHighWord<U>(s8.c0, s8.c1, s8.c2, U::template srl16<1>(s8.c0),
+                                            U::template srl16<1>(s8.c1), U::template srl16<1>(s8.c2));
+    return {r.y, r.cb, r.cr};
+  }
 };
 
 struct RoundedFwd {
   static constexpr bool kVector = true;
+  static constexpr bool kHighLanes = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(ycbcrRounded(s.c0, s.c1, s.c2)); }
   template <class U>
   ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     const LaneYCbCr<U> r = ycbcrRounded<U>(s.c0, s.c1, s.c2);
+    return {r.y, r.cb, r.cr};
+  }
+  template <class U>
+  ZEL_INLINE Trio<U> highLanes(const Trio<U>& s8) const {
+    const LaneYCbCr<U> r = ycbcrRounded7<U>(U::template srl16<1>(s8.c0), U::template srl16<1>(s8.c1),
+                                            U::template srl16<1>(s8.c2));
     return {r.y, r.cb, r.cr};
   }
 };

@@ -184,6 +184,7 @@ struct LaneAddedBytes {
   static_assert(S.luma % 32 == 0, "the luma offset must leave no fraction");
   static constexpr bool kVector = true;
   static constexpr bool kBytes = true;
+  static constexpr bool kHighBytes = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(laneAdded(S, s.c0, s.c1, s.c2, K)); }
 
   template <class U>
@@ -207,6 +208,16 @@ struct LaneAddedBytes {
   ZEL_INLINE Trio<U> bytes(const Trio<U>& ycc) const {
     const Wide16<U> y = widenHigh<U>(ycc.c0), u = widenCentred<U>(ycc.c1), v = widenCentred<U>(ycc.c2);
     const LaneRgb<U> lo = half<U>(y.lo, u.lo, v.lo), hi = half<U>(y.hi, u.hi, v.hi);
+    return {U::packU8(lo.r, hi.r), U::packU8(lo.g, hi.g), U::packU8(lo.b, hi.b)};
+  }
+
+  // Two halves of samples in the high bytes of the lanes; the chroma's top
+  // bit flipped centres it.
+  template <class U>
+  ZEL_INLINE Trio<U> highBytes(const Trio<U>& lo8, const Trio<U>& hi8) const {
+    const typename U::V top = U::set16(-32768);
+    const LaneRgb<U> lo = half<U>(lo8.c0, U::xor_(lo8.c1, top), U::xor_(lo8.c2, top));
+    const LaneRgb<U> hi = half<U>(hi8.c0, U::xor_(hi8.c1, top), U::xor_(hi8.c2, top));
     return {U::packU8(lo.r, hi.r), U::packU8(lo.g, hi.g), U::packU8(lo.b, hi.b)};
   }
 };

@@ -22,8 +22,8 @@ PlanesIn planesIn(const uint8_t* const planes[3], int step, int y) {
 // Plain walk over rows; pixels [0, bodyEnd) take the body form.
 template <class Body, class Tail, class InRow, class OutRow>
 void walkRows(ImageSize size, int bodyEnd, const Body& body, const Tail& tail, InRow inRow, OutRow outRow) {
-  const bool avx2 = hasAvx2();
-  plainWalk(size.height, [&](int y) { convertRow(inRow(y), outRow(y), size.width, bodyEnd, body, tail, avx2); });
+  const VectorTier tier = unitTier();
+  plainWalk(size.height, [&](int y) { convertRow(inRow(y), outRow(y), size.width, bodyEnd, body, tail, tier); });
 }
 
 // Three planes to interleaved pixels; the BGR names take the body form

@@ -7,6 +7,7 @@
 #include "frame/image_layout.h"
 #include "frame/row_driver.h"
 #include "frame/simd.h"
+#include "luma_chroma/vector_units.h"
 #include "zelcc/zelcc.h"
 
 namespace zel::lc {
@@ -23,13 +24,13 @@ struct PlaneRows {
 };
 
 // Interleaved source and destination: the pointers, the size, then a plain
-// walk; `row(src, dst, width, avx2)` converts one row.
+// walk; `row(src, dst, width, tier)` converts one row.
 template <typename Row>
 inline Status walkInterleaved(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size, Row row) {
   if (!src || !dst) return StatusNullPointerError;
   if (sizeBelowOne(size)) return StatusSizeError;
-  const bool avx2 = hasAvx2();
-  plainWalk(size.height, [&](int y) { row(rowAt(src, srcStep, y), rowAt(dst, dstStep, y), size.width, avx2); });
+  const VectorTier tier = unitTier();
+  plainWalk(size.height, [&](int y) { row(rowAt(src, srcStep, y), rowAt(dst, dstStep, y), size.width, tier); });
   return StatusOk;
 }
 

@@ -36,7 +36,14 @@ struct MatrixBytes {
   template <class U>
   ZEL_INLINE Trio<U> bytes(const Trio<U>& rgb) const {
     const Wide16<U> r = widenHigh<U>(rgb.c0), g = widenHigh<U>(rgb.c1), b = widenHigh<U>(rgb.c2);
-    const Trio<U> lo = half<U>(r.lo, g.lo, b.lo), hi = half<U>(r.hi, g.hi, b.hi);
+    return highBytes<U>({r.lo, g.lo, b.lo}, {r.hi, g.hi, b.hi});
+  }
+
+  // Two halves of samples already in the high bytes of the lanes.
+  static constexpr bool kHighBytes = true;
+  template <class U>
+  ZEL_INLINE Trio<U> highBytes(const Trio<U>& lo8, const Trio<U>& hi8) const {
+    const Trio<U> lo = half<U>(lo8.c0, lo8.c1, lo8.c2), hi = half<U>(hi8.c0, hi8.c1, hi8.c2);
     const typename U::V top = U::set8(0x80);
     return {U::packU8(lo.c0, hi.c0), U::xor_(U::packS8(lo.c1, hi.c1), top), U::xor_(U::packS8(lo.c2, hi.c2), top)};
   }
@@ -82,27 +89,27 @@ inline __m128i fourthBytes(const uint8_t* p) {
 
 }  // namespace
 
-void rgbToYuvC3Row(const uint8_t* src, uint8_t* dst, int width, bool avx2) {
-  convertRow(PackedIn<3>{src}, PackedOut3<false>{dst}, width, width & ~15, MatrixBytes{}, DifferenceTruncated{}, avx2);
+void rgbToYuvC3Row(const uint8_t* src, uint8_t* dst, int width, VectorTier tier) {
+  convertRow(PackedIn<3>{src}, PackedOut3<false>{dst}, width, width & ~15, MatrixBytes{}, DifferenceTruncated{}, tier);
 }
 
-void rgbToYuvC3P3Row(const uint8_t* src, uint8_t* const dst[3], int width, bool avx2) {
-  convertRow(PackedIn<3>{src}, planesOut(dst), width, width & ~7, MatrixBytes{}, DifferenceTruncated{}, avx2);
+void rgbToYuvC3P3Row(const uint8_t* src, uint8_t* const dst[3], int width, VectorTier tier) {
+  convertRow(PackedIn<3>{src}, planesOut(dst), width, width & ~7, MatrixBytes{}, DifferenceTruncated{}, tier);
 }
 
 // Y, U and V of a row come from one pass: with planes that do not overlap
 // (the only defined use) that is the same as a pass per output plane.
-void rgbToYuvP3Row(const uint8_t* const src[3], uint8_t* const dst[3], int width, bool avx2) {
-  convertRow(PlanesIn{src[0], src[1], src[2]}, planesOut(dst), width, width & ~15, MatrixBytes{}, MatrixWide{}, avx2);
+void rgbToYuvP3Row(const uint8_t* const src[3], uint8_t* const dst[3], int width, VectorTier tier) {
+  convertRow(PlanesIn{src[0], src[1], src[2]}, planesOut(dst), width, width & ~15, MatrixBytes{}, MatrixWide{}, tier);
 }
 
 // One exact formula for the whole row, in vector blocks and one by one.
-void rgbToYuvAC4Row(const uint8_t* src, uint8_t* dst, int width, bool avx2) {
-  convertRow(PackedIn<4>{src}, PackedOutKeep{dst}, width, width, DifferenceRounded{}, DifferenceRounded{}, avx2);
+void rgbToYuvAC4Row(const uint8_t* src, uint8_t* dst, int width, VectorTier tier) {
+  convertRow(PackedIn<4>{src}, PackedOutKeep{dst}, width, width, DifferenceRounded{}, DifferenceRounded{}, tier);
 }
 
-void rgbToYuvAC4P4Row(const uint8_t* src, uint8_t* const dst[4], int width, bool avx2) {
-  convertRow(PackedIn<4>{src}, planesOut(dst), width, width & ~7, DifferenceLanes{}, DifferenceRounded{}, avx2);
+void rgbToYuvAC4P4Row(const uint8_t* src, uint8_t* const dst[4], int width, VectorTier tier) {
+  convertRow(PackedIn<4>{src}, planesOut(dst), width, width & ~7, DifferenceLanes{}, DifferenceRounded{}, tier);
   // The fourth source byte of every pixel goes to the fourth plane.
   int x = 0;
   for (; x + 16 <= width; x += 16) store128(dst[3] + x, fourthBytes(src + 4 * x));
@@ -127,10 +134,10 @@ ZEL_PUBLIC Status zeliRGBToYUV_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t
   if (!src || !dstPlanes) return StatusNullPointerError;
   if (sizeBelowOne(size)) return StatusSizeError;
   if (anyPlaneNull(dstPlanes, 3)) return StatusNullPointerError;
-  const bool avx2 = zel::hasAvx2();
+  const zel::VectorTier tier = unitTier();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<uint8_t, 3> d(dstPlanes, dstStep, y);
-    rgbToYuvC3P3Row(zel::rowAt(src, srcStep, y), d.p, size.width, avx2);
+    rgbToYuvC3P3Row(zel::rowAt(src, srcStep, y), d.p, size.width, tier);
   });
   return StatusOk;
 }
@@ -141,10 +148,10 @@ ZEL_PUBLIC Status zeliRGBToYUV_8u_AC4P4R(const uint8_t* src, int srcStep, uint8_
   if (!src || !dstPlanes) return StatusNullPointerError;
   if (sizeBelowOne(size)) return StatusSizeError;
   if (anyPlaneNull(dstPlanes, 3)) return StatusNullPointerError;
-  const bool avx2 = zel::hasAvx2();
+  const zel::VectorTier tier = unitTier();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<uint8_t, 4> d(dstPlanes, dstStep, y);
-    rgbToYuvAC4P4Row(zel::rowAt(src, srcStep, y), d.p, size.width, avx2);
+    rgbToYuvAC4P4Row(zel::rowAt(src, srcStep, y), d.p, size.width, tier);
   });
   return StatusOk;
 }
@@ -155,11 +162,11 @@ ZEL_PUBLIC Status zeliRGBToYUV_8u_P3R(const uint8_t* const srcPlanes[3], int src
   if (sizeBelowOne(size)) return StatusSizeError;
   if (anyPlaneNull(srcPlanes, 3)) return StatusNullPointerError;
   if (anyPlaneNull(dstPlanes, 3)) return StatusNullPointerError;
-  const bool avx2 = zel::hasAvx2();
+  const zel::VectorTier tier = unitTier();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<const uint8_t, 3> s(srcPlanes, srcStep, y);
     const PlaneRows<uint8_t, 3> d(dstPlanes, dstStep, y);
-    rgbToYuvP3Row(s.p, d.p, size.width, avx2);
+    rgbToYuvP3Row(s.p, d.p, size.width, tier);
   });
   return StatusOk;
 }

@@ -238,12 +238,10 @@ inline Pixel8 rgbLanesShape(const RgbLaneSet& k, int Y, int U, int V) {
           SaturateU8(AddSaturateS16(b, Round) >> Shift)};
 }
 
-template <int YShift, int CShift, int Round, int Shift, bool SubtractGreen, class U>
-ZEL_INLINE Trio<U> rgbLanesShape(const RgbLaneSet& k, const Trio<U>& yuv) {
+// From Y' and the shifted u', v'.
+template <int Round, int Shift, bool SubtractGreen, class U>
+ZEL_INLINE Trio<U> rgbLanesShifted(const RgbLaneSet& k, typename U::V y, typename U::V u, typename U::V v) {
   using V = typename U::V;
-  const V y = U::template sll16<YShift>(yuv.c0);
-  const V u = U::template sll16<CShift>(U::sub16(yuv.c1, U::set16(128)));
-  const V v = U::template sll16<CShift>(U::sub16(yuv.c2, U::set16(128)));
   const V r = U::addSatS16(y, U::mulHighS16(v, U::set16(k.vToR)));
   V g;
   if constexpr (SubtractGreen)
@@ -256,11 +254,34 @@ ZEL_INLINE Trio<U> rgbLanesShape(const RgbLaneSet& k, const Trio<U>& yuv) {
           U::template sra16<Shift>(U::addSatS16(b, round))};
 }
 
+template <int YShift, int CShift, int Round, int Shift, bool SubtractGreen, class U>
+ZEL_INLINE Trio<U> rgbLanesShape(const RgbLaneSet& k, const Trio<U>& yuv) {
+  return rgbLanesShifted<Round, Shift, SubtractGreen, U>(
+      k, U::template sll16<YShift>(yuv.c0), U::template sll16<CShift>(U::sub16(yuv.c1, U::set16(128))),
+      U::template sll16<CShift>(U::sub16(yuv.c2, U::set16(128))));
+}
+
+// The same from samples in the high bytes of the lanes (S << 8): Y' is a
+// logical shift down, and the top bit flipped makes (C - 128) << 8, whose
+// arithmetic shift down is exact.
+template <int YShift, int CShift, int Round, int Shift, bool SubtractGreen, class U>
+ZEL_INLINE Trio<U> rgbLanesShapeHigh(const RgbLaneSet& k, const Trio<U>& yuv8) {
+  static_assert(YShift <= 8 && CShift <= 8, "the shifts stay within the high byte");
+  const typename U::V top = U::set16(-32768);
+  return rgbLanesShifted<Round, Shift, SubtractGreen, U>(k, U::template srl16<8 - YShift>(yuv8.c0),
+                                                         U::template sra16<8 - CShift>(U::xor_(yuv8.c1, top)),
+                                                         U::template sra16<8 - CShift>(U::xor_(yuv8.c2, top)));
+}
+
 // rgbLanes1: SaturateU8(Y + terms), chroma << 3.
 inline Pixel8 rgbLanes1(int Y, int U, int V) { return rgbLanesShape<0, 3, 0, 0, false>(rgbLanes1Set, Y, U, V); }
 template <class U>
 ZEL_INLINE Trio<U> rgbLanes1(const Trio<U>& yuv) {
   return rgbLanesShape<0, 3, 0, 0, false, U>(rgbLanes1Set, yuv);
+}
+template <class U>
+ZEL_INLINE Trio<U> rgbLanes1High(const Trio<U>& yuv8) {
+  return rgbLanesShapeHigh<0, 3, 0, 0, false, U>(rgbLanes1Set, yuv8);
 }
 
 // rgbLanes2: SaturateU8(((Y << 1) + terms) >> 1), chroma << 4.
@@ -269,6 +290,10 @@ template <class U>
 ZEL_INLINE Trio<U> rgbLanes2(const Trio<U>& yuv) {
   return rgbLanesShape<1, 4, 0, 1, false, U>(rgbLanes2Set, yuv);
 }
+template <class U>
+ZEL_INLINE Trio<U> rgbLanes2High(const Trio<U>& yuv8) {
+  return rgbLanesShapeHigh<1, 4, 0, 1, false, U>(rgbLanes2Set, yuv8);
+}
 
 // rgbLanes3: SaturateU8(((Y << 3) + terms + 4) >> 3), chroma << 7, green
 // subtracted.
@@ -276,6 +301,10 @@ inline Pixel8 rgbLanes3(int Y, int U, int V) { return rgbLanesShape<3, 7, 4, 3, 
 template <class U>
 ZEL_INLINE Trio<U> rgbLanes3(const Trio<U>& yuv) {
   return rgbLanesShape<3, 7, 4, 3, true, U>(rgbLanes3Set, yuv);
+}
+template <class U>
+ZEL_INLINE Trio<U> rgbLanes3High(const Trio<U>& yuv8) {
+  return rgbLanesShapeHigh<3, 7, 4, 3, true, U>(rgbLanes3Set, yuv8);
 }
 
 }  // namespace zel::lc

@@ -13,28 +13,43 @@ namespace {
 
 struct Lanes1 {
   static constexpr bool kVector = true;
+  static constexpr bool kHighLanes = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(rgbLanes1(s.c0, s.c1, s.c2)); }
   template <class U>
   ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     return rgbLanes1<U>(s);
   }
+  template <class U>
+  ZEL_INLINE Trio<U> highLanes(const Trio<U>& s8) const {
+    return rgbLanes1High<U>(s8);
+  }
 };
 
 struct Lanes2 {
   static constexpr bool kVector = true;
+  static constexpr bool kHighLanes = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(rgbLanes2(s.c0, s.c1, s.c2)); }
   template <class U>
   ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     return rgbLanes2<U>(s);
   }
+  template <class U>
+  ZEL_INLINE Trio<U> highLanes(const Trio<U>& s8) const {
+    return rgbLanes2High<U>(s8);
+  }
 };
 
 struct Lanes3 {
   static constexpr bool kVector = true;
+  static constexpr bool kHighLanes = true;
   Samples3 pixel(const Samples3& s) const { return samplesOf(rgbLanes3(s.c0, s.c1, s.c2)); }
   template <class U>
   ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
     return rgbLanes3<U>(s);
+  }
+  template <class U>
+  ZEL_INLINE Trio<U> highLanes(const Trio<U>& s8) const {
+    return rgbLanes3High<U>(s8);
   }
 };
 
@@ -59,25 +74,25 @@ PlanesIn planesIn(const uint8_t* const src[3]) { return {src[0], src[1], src[2]}
 
 }  // namespace
 
-void yuvToRgbC3Row(const uint8_t* src, uint8_t* dst, int width, bool avx2) {
-  convertRow(PackedIn<3>{src}, PackedOut3<false>{dst}, width, width & ~7, Lanes1{}, kWideAGreenTruncated, avx2);
+void yuvToRgbC3Row(const uint8_t* src, uint8_t* dst, int width, VectorTier tier) {
+  convertRow(PackedIn<3>{src}, PackedOut3<false>{dst}, width, width & ~7, Lanes1{}, kWideAGreenTruncated, tier);
 }
 
 // One exact formula for the whole row, in vector blocks and one by one.
-void yuvToRgbAC4Row(const uint8_t* src, uint8_t* dst, int width, bool avx2) {
-  convertRow(PackedIn<4>{src}, PackedOutKeep{dst}, width, width, kWideAGreenTruncated, kWideAGreenTruncated, avx2);
+void yuvToRgbAC4Row(const uint8_t* src, uint8_t* dst, int width, VectorTier tier) {
+  convertRow(PackedIn<4>{src}, PackedOutKeep{dst}, width, width, kWideAGreenTruncated, kWideAGreenTruncated, tier);
 }
 
-void yuvToRgbC3C4Row(const uint8_t* src, uint8_t* dst, int width, uint8_t alpha, bool avx2) {
-  convertRow(PackedIn<3>{src}, PackedOutAlpha<false>{dst, alpha}, width, width & ~7, Lanes3{}, kWideARounded, avx2);
+void yuvToRgbC3C4Row(const uint8_t* src, uint8_t* dst, int width, uint8_t alpha, VectorTier tier) {
+  convertRow(PackedIn<3>{src}, PackedOutAlpha<false>{dst, alpha}, width, width & ~7, Lanes3{}, kWideARounded, tier);
 }
 
-void yuvToRgbP3C3Row(const uint8_t* const src[3], uint8_t* dst, int width, bool avx2) {
-  convertRow(planesIn(src), PackedOut3<false>{dst}, width, width & ~15, Lanes2{}, kWideBTruncated, avx2);
+void yuvToRgbP3C3Row(const uint8_t* const src[3], uint8_t* dst, int width, VectorTier tier) {
+  convertRow(planesIn(src), PackedOut3<false>{dst}, width, width & ~15, Lanes2{}, kWideBTruncated, tier);
 }
 
-void yuvToRgbP3Row(const uint8_t* const src[3], uint8_t* const dst[3], int width, bool avx2) {
-  convertRow(planesIn(src), PlanesOut{dst[0], dst[1], dst[2]}, width, width, kWideBTruncated, kWideBTruncated, avx2);
+void yuvToRgbP3Row(const uint8_t* const src[3], uint8_t* const dst[3], int width, VectorTier tier) {
+  convertRow(planesIn(src), PlanesOut{dst[0], dst[1], dst[2]}, width, width, kWideBTruncated, kWideBTruncated, tier);
 }
 
 }  // namespace zel::lc
@@ -95,9 +110,10 @@ ZEL_PUBLIC Status zeliYUVToRGB_8u_AC4R(const uint8_t* src, int srcStep, uint8_t*
 
 ZEL_PUBLIC Status zeliYUVToRGB_8u_C3C4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size,
                                         uint8_t alpha) {
-  return walkInterleaved(src, srcStep, dst, dstStep, size, [alpha](const uint8_t* s, uint8_t* d, int width, bool avx2) {
-    yuvToRgbC3C4Row(s, d, width, alpha, avx2);
-  });
+  return walkInterleaved(src, srcStep, dst, dstStep, size,
+                         [alpha](const uint8_t* s, uint8_t* d, int width, zel::VectorTier tier) {
+                           yuvToRgbC3C4Row(s, d, width, alpha, tier);
+                         });
 }
 
 ZEL_PUBLIC Status zeliYUVToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* dst, int dstStep,
@@ -105,10 +121,10 @@ ZEL_PUBLIC Status zeliYUVToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], int s
   if (!srcPlanes || !dst) return StatusNullPointerError;
   if (sizeBelowOne(size)) return StatusSizeError;
   if (anyPlaneNull(srcPlanes, 3)) return StatusNullPointerError;
-  const bool avx2 = zel::hasAvx2();
+  const zel::VectorTier tier = unitTier();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<const uint8_t, 3> s(srcPlanes, srcStep, y);
-    yuvToRgbP3C3Row(s.p, zel::rowAt(dst, dstStep, y), size.width, avx2);
+    yuvToRgbP3C3Row(s.p, zel::rowAt(dst, dstStep, y), size.width, tier);
   });
   return StatusOk;
 }
@@ -120,11 +136,11 @@ ZEL_PUBLIC Status zeliYUVToRGB_8u_P3R(const uint8_t* const srcPlanes[3], int src
   if (sizeBelowOne(size)) return StatusSizeError;
   if (anyPlaneNull(dstPlanes, 3)) return StatusNullPointerError;
   if (anyPlaneNull(srcPlanes, 3)) return StatusNullPointerError;
-  const bool avx2 = zel::hasAvx2();
+  const zel::VectorTier tier = unitTier();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<const uint8_t, 3> s(srcPlanes, srcStep, y);
     const PlaneRows<uint8_t, 3> d(dstPlanes, dstStep, y);
-    yuvToRgbP3Row(s.p, d.p, size.width, avx2);
+    yuvToRgbP3Row(s.p, d.p, size.width, tier);
   });
   return StatusOk;
 }

@@ -9,6 +9,7 @@
 #include <functional>
 #include <limits>
 
+#include "core/zelcore.h"
 #include "frame/image_layout.h"
 #include "luma_chroma/photo_ycc_forms.h"
 #include "luma_chroma/photo_ycc_kernels.h"
@@ -19,6 +20,7 @@
 namespace {
 
 using namespace zel::lc;
+using zel::VectorTier;
 using namespace zel::lc::test;
 using zel::lc::test::str;
 using zel::test::TestImage;
@@ -174,15 +176,15 @@ std::vector<Member<uint8_t>> eightBitMembers() {
       {"zeliYCCToRGB_8u_C3R", 3, zeliYCCToRGB_8u_C3R, zones(8, yccToRgbLanes, yccToRgbWide)},
       {"zeliYCCToRGB_8u_AC4R", 4, zeliYCCToRGB_8u_AC4R, zones(4, yccToRgbLanes, yccToRgbWide)}};
   // The row kernels on each vector width, walked here.
-  using Row = void (*)(const uint8_t*, uint8_t*, int, bool);
+  using Row = void (*)(const uint8_t*, uint8_t*, int, VectorTier);
   const Row rows[4] = {rgbToYcc8uRow<3>, rgbToYcc8uRow<4>, yccToRgb8uRow<3>, yccToRgb8uRow<4>};
-  for (bool avx2 : vectorWidths())
+  for (VectorTier tier : rowTiers())
     for (int k = 0; k < 4; ++k) {
       Member<uint8_t> m = out[k];
       const Row row = rows[k];
-      m.run = [row, avx2](P src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
+      m.run = [row, tier](P src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
         for (int y = 0; y < size.height; ++y)
-          row(zel::rowAt(src, srcStep, y), zel::rowAt(dst, dstStep, y), size.width, avx2);
+          row(zel::rowAt(src, srcStep, y), zel::rowAt(dst, dstStep, y), size.width, tier);
         return StatusOk;
       };
       out.push_back(m);
@@ -210,18 +212,22 @@ std::function<std::array<T, 3>(const T*, int, int)> wordZones(Float3 (*body)(flo
   };
 }
 
-// The members again through their row kernels on each vector width, walked
-// here; `rows` are the kernels in member order, on the kernels' sample type W.
+// The members again through their row kernels on each vector tier, walked
+// here; `rows` are the kernels in member order, on the kernels' sample type
+// W (a null entry has no such kernel). A streaming kernel fences at the end.
 template <typename W, typename T>
-void addRowKernels(std::vector<Member<T>>& out, const std::array<void (*)(const W*, W*, int, bool), 4>& rows) {
-  for (bool avx2 : vectorWidths())
+void addRowKernels(std::vector<Member<T>>& out, const std::array<void (*)(const W*, W*, int, VectorTier), 4>& rows,
+                   bool streaming = false) {
+  for (VectorTier tier : rowTiers(false))
     for (int k = 0; k < 4; ++k) {
+      if (!rows[k]) continue;
       Member<T> m = out[k];
       const auto row = rows[k];
-      m.run = [row, avx2](const T* src, int srcStep, T* dst, int dstStep, ImageSize size) {
+      m.run = [row, tier, streaming](const T* src, int srcStep, T* dst, int dstStep, ImageSize size) {
         for (int y = 0; y < size.height; ++y)
           row(reinterpret_cast<const W*>(zel::rowAt(src, srcStep, y)), reinterpret_cast<W*>(zel::rowAt(dst, dstStep, y)),
-              size.width, avx2);
+              size.width, tier);
+        if (streaming) zel::StreamStores::fence();
         return StatusOk;
       };
       out.push_back(m);
@@ -260,7 +266,11 @@ std::vector<Member<float>> floatMembers() {
                                     {"zeliRGBToYCC_32f_AC4R", 4, zeliRGBToYCC_32f_AC4R, all(rgbToYcc32f)},
                                     {"zeliYCCToRGB_32f_C3R", 3, zeliYCCToRGB_32f_C3R, all(yccToRgb32f)},
                                     {"zeliYCCToRGB_32f_AC4R", 4, zeliYCCToRGB_32f_AC4R, all(yccToRgb32f)}};
-  addRowKernels<float>(out, {rgbToYcc32fRow<3>, rgbToYcc32fRow<4>, yccToRgb32fRow<3>, yccToRgb32fRow<4>});
+  using zel::PlainStores;
+  using zel::StreamStores;
+  addRowKernels<float>(out, {rgbToYcc32fRow<3, PlainStores>, rgbToYcc32fRow<4, PlainStores>,
+                             yccToRgb32fRow<3, PlainStores>, yccToRgb32fRow<4, PlainStores>});
+  addRowKernels<float>(out, {rgbToYcc32fRow<3, StreamStores>, nullptr, yccToRgb32fRow<3, StreamStores>, nullptr}, true);
   return out;
 }
 
@@ -275,7 +285,7 @@ bool sameBits(T a, T b) {
 template <typename T>
 void checkMembers(const std::vector<Member<T>>& members) {
   for (const Member<T>& m : members)
-    for (int width = 1; width <= 70; ++width)
+    for (int width : rowWidths())
       for (int offset : {0, int(sizeof(T)), 3}) {
         const int height = 2, n = m.channels;
         TestImage<T> src(width * n, height, offset, 2 * int(sizeof(T)));
@@ -304,6 +314,35 @@ TEST(PhotoYccMembers, EightBitEveryWidth) { checkMembers(eightBitMembers()); }
 TEST(PhotoYccMembers, UnsignedSixteenBitEveryWidth) { checkMembers(unsignedMembers()); }
 TEST(PhotoYccMembers, SignedSixteenBitEveryWidth) { checkMembers(signedMembers()); }
 TEST(PhotoYccMembers, FloatEveryWidth) { checkMembers(floatMembers()); }
+
+// A three-channel float frame of more than a mebibyte, against a cache of one
+// mebibyte, streams its output: rows at addresses that reach the vector
+// alignment after a few pixels and rows off the float grid, every sample by
+// its formula, the padding and guards untouched.
+TEST(PhotoYccMembers, FloatFramesBeyondTheCacheStreamTheSameBits) {
+  const int width = 301, height = 150;  // 1.08 MB read and written
+  zelTestOverrideCacheSize(0, 1 << 20);
+  EXPECT_TRUE(zel::streamsBeyondCache(int64_t(width) * height * 24));
+  const std::vector<Member<float>> members = floatMembers();
+  for (int k : {0, 2}) {  // the C3 members
+    const Member<float>& m = members[size_t(k)];
+    for (int offset : {0, 4, 3}) {
+      TestImage<float> src(width * 3, height, offset, 8), dst(width * 3, height, offset + 8, 20);
+      src.fillRandom(uint32_t(k * 10 + offset), -0.2, 1.2);
+      ASSERT_EQ(m.run(src.data(), src.step(), dst.data(), dst.step(), ImageSize{width, height}), StatusOk);
+      for (int y = 0; y < height; ++y)
+        for (int x = 0; x < width; ++x) {
+          const float px[3] = {src.get(3 * x, y), src.get(3 * x + 1, y), src.get(3 * x + 2, y)};
+          const std::array<float, 3> want = m.expected(px, x, width);
+          for (int c = 0; c < 3; ++c)
+            ASSERT_TRUE(sameBits(dst.get(3 * x + c, y), want[c]))
+                << m.name << " offset " << offset << " pixel " << x << "," << y << " channel " << c;
+        }
+      ASSERT_TRUE(dst.guardsIntact()) << m.name << " offset " << offset;
+    }
+  }
+  zelTestOverrideCacheSize(-1, 0);
+}
 
 TEST(PhotoYccMembers, UnevenStepsLoseTheirLowBits) {
   // A step one byte past the rows' true distance walks the same rows as the

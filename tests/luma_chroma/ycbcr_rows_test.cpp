@@ -12,12 +12,14 @@
 #include "luma_chroma/pixel_rows.h"
 #include "luma_chroma/rgb_to_ycbcr_forms.h"
 #include "luma_chroma/ycbcr_lanes.h"
+#include "luma_chroma/yuv_lane_check.h"
 #include "support/test_image.h"
 #include "zelcc/zelcc.h"
 
 namespace {
 
 using namespace zel::lc;
+using zel::VectorTier;
 using zel::test::TestImage;
 
 // ---- kernels: vector blocks against the scalar form ----
@@ -41,44 +43,45 @@ struct Guarded {
   }
 };
 
-// Converts rows of every width 1..70 at odd offsets through a blocked row
-// function (SSE4.1 only, then with AVX2 where the processor has it) and
-// through the scalar form alone; the two buffers must agree byte for byte,
-// guards included.
+// Converts rows of every width 1..70 and some past 128 at odd offsets
+// through a blocked row function (on every vector tier the processor has)
+// and through the scalar form alone; the two buffers must agree byte for
+// byte, guards included.
 template <class Blocked, class Scalar>
-void rowsAgree(int inBytes, int outBytes, Blocked blocked, Scalar scalar) {
-  for (bool avx2 : {false, true}) {
-    if (avx2 && !zel::hasAvx2()) continue;
-    for (int width = 1; width <= 70; ++width)
+void rowsAgree(int inBytes, int outBytes, Blocked blocked, Scalar scalar, const std::vector<VectorTier>& tiers) {
+  for (VectorTier tier : tiers)
+    for (int width : zel::lc::test::rowWidths())
       for (int offset : {0, 1, 3, 7}) {
         const uint32_t seed = uint32_t(width * 16 + offset);
         const Guarded src(width * inBytes, offset, seed);
         Guarded vector(width * outBytes, (offset * 5) & 15, seed + 1);
         Guarded plain = vector;
         plain.first = plain.bytes.data() + (vector.first - vector.bytes.data());
-        blocked(src.first, vector.first, width, avx2);
+        blocked(src.first, vector.first, width, tier);
         scalar(src.first, plain.first, width);
-        ASSERT_TRUE(vector.bytes == plain.bytes) << "width " << width << " offset " << offset << " avx2 " << avx2;
+        ASSERT_TRUE(vector.bytes == plain.bytes)
+            << "width " << width << " offset " << offset << " " << zel::tierName(tier);
       }
-  }
 }
 
 template <class Form, class MakeIn, class MakeOut>
-void kernelMatchesScalar(const Form& form, int inBytes, int outBytes, MakeIn makeIn, MakeOut makeOut) {
+void kernelMatchesScalar(const Form& form, int inBytes, int outBytes, MakeIn makeIn, MakeOut makeOut,
+                         const std::vector<VectorTier>& tiers = zel::lc::test::rowTiers()) {
   rowsAgree(
       inBytes, outBytes,
-      [&](const uint8_t* s, uint8_t* d, int w, bool avx2) {
-        convertRow(makeIn(s, w), makeOut(d, w), w, w, form, form, avx2);
+      [&](const uint8_t* s, uint8_t* d, int w, VectorTier tier) {
+        convertRow(makeIn(s, w), makeOut(d, w), w, w, form, form, tier);
       },
-      [&](const uint8_t* s, uint8_t* d, int w) { formPixels(makeIn(s, w), makeOut(d, w), 0, w, form); });
+      [&](const uint8_t* s, uint8_t* d, int w) { formPixels(makeIn(s, w), makeOut(d, w), 0, w, form); }, tiers);
 }
 
 // The wide forms four pixels at a time, the fourth byte kept.
 template <class Form>
 void keepAlphaMatchesScalar(const Form& form) {
   rowsAgree(
-      4, 4, [&](const uint8_t* s, uint8_t* d, int w, bool) { keepAlphaRow(s, d, w, form); },
-      [&](const uint8_t* s, uint8_t* d, int w) { formPixels(PackedIn<4>{s}, PackedOutKeep{d}, 0, w, form); });
+      4, 4, [&](const uint8_t* s, uint8_t* d, int w, VectorTier) { keepAlphaRow(s, d, w, form); },
+      [&](const uint8_t* s, uint8_t* d, int w) { formPixels(PackedIn<4>{s}, PackedOutKeep{d}, 0, w, form); },
+      {VectorTier::Sse41});
 }
 
 auto planesIn = [](const uint8_t* p, int width) { return PlanesIn{p, p + width, p + 2 * width}; };
@@ -124,8 +127,7 @@ TEST(YCbCrKernels, InverseBlocksMatchTheScalarForms) {
 template <class Form>
 void everyTripleMatches(const Form& form) {
   std::vector<uint8_t> src(256 * 3), got(256 * 3), want(256 * 3);
-  for (bool avx2 : {false, true}) {
-    if (avx2 && !zel::hasAvx2()) continue;
+  for (VectorTier tier : zel::lc::test::rowTiers()) {
     for (int cb = 0; cb < 256; ++cb)
       for (int cr = 0; cr < 256; ++cr) {
         for (int y = 0; y < 256; ++y) {
@@ -133,11 +135,37 @@ void everyTripleMatches(const Form& form) {
           src[3 * y + 1] = uint8_t(cb);
           src[3 * y + 2] = uint8_t(cr);
         }
-        convertRow(PackedIn<3>{src.data()}, PackedOut3<false>{got.data()}, 256, 256, form, form, avx2);
+        convertRow(PackedIn<3>{src.data()}, PackedOut3<false>{got.data()}, 256, 256, form, form, tier);
         formPixels(PackedIn<3>{src.data()}, PackedOut3<false>{want.data()}, 0, 256, form);
-        ASSERT_TRUE(got == want) << "Cb " << cb << " Cr " << cr << " avx2 " << avx2;
+        ASSERT_TRUE(got == want) << "Cb " << cb << " Cr " << cr << " " << zel::tierName(tier);
       }
   }
+}
+
+// A form that gives back its samples: the 64-pixel blocks through it must
+// return every byte to its own pixel and channel, whatever the layouts.
+struct SameSamples {
+  static constexpr bool kVector = true;
+  Samples3 pixel(const Samples3& s) const { return s; }
+  template <class U>
+  ZEL_INLINE Trio<U> lanes(const Trio<U>& s) const {
+    return s;
+  }
+};
+
+TEST(YCbCrKernels, Blocks512MoveEveryByteToItsPixel) {
+  if (!zel::hasAvx512Vbmi()) GTEST_SKIP() << "no 512-bit tier with byte permutes";
+  const std::vector<VectorTier> wide{VectorTier::Avx512};
+  const SameSamples same;
+  kernelMatchesScalar(same, 3, 3, packedIn<3>, packedOut<false>, wide);
+  kernelMatchesScalar(same, 3, 3, packedIn<3>, packedOut<true>, wide);
+  kernelMatchesScalar(same, 3, 3, packedIn<3>, planesOut, wide);
+  kernelMatchesScalar(same, 4, 3, packedIn<4>, planesOut, wide);
+  kernelMatchesScalar(same, 3, 3, planesIn, planesOut, wide);
+  kernelMatchesScalar(same, 3, 3, planesIn, packedOut<true>, wide);
+  kernelMatchesScalar(same, 3, 4, planesIn, alphaOut<false>, wide);
+  kernelMatchesScalar(same, 3, 4, planesIn, alphaOut<true>, wide);
+  kernelMatchesScalar(same, 4, 4, packedIn<4>, [](uint8_t* p, int) { return PackedOutKeep{p}; }, wide);
 }
 
 TEST(YCbCrKernels, ByteFormsGiveTheLaneFormForEverySample) {
@@ -286,7 +314,7 @@ void checkMember(const Member& m, int width, int height, int srcOffset, int dstO
 
 TEST(YCbCrExports, EveryWidthTakesItsZones) {
   for (const Member& m : members())
-    for (int width = 1; width <= 70; ++width)
+    for (int width : zel::lc::test::rowWidths())
       for (int offsets : {0, 1, 2}) {
         checkMember(m, width, 3, offsets * 3, offsets * 5 % 7);
         if (HasFatalFailure()) return;

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "frame/scalar_ops.h"
+#include "luma_chroma/tier_params.h"
 #include "luma_chroma/vector_units.h"
 #include "luma_chroma/yuv_lanes.h"
 
@@ -88,6 +89,25 @@ void expectLanesMatch(const char* name, const F& f, bool avx2, const std::vector
 inline std::vector<bool> vectorWidths() {
   std::vector<bool> widths{false};
   if (hasAvx2()) widths.push_back(true);
+  return widths;
+}
+
+// The tiers of the row kernels this processor runs (under the tier cap):
+// SSE4.1, AVX2 where present, and the 512-bit tier, with the byte permutes
+// where the kernels need them.
+inline std::vector<VectorTier> rowTiers(bool bytePermutes = true) {
+  std::vector<VectorTier> tiers{VectorTier::Sse41};
+  if (hasAvx2()) tiers.push_back(VectorTier::Avx2);
+  if (bytePermutes ? hasAvx512Vbmi() : hasAvx512()) tiers.push_back(VectorTier::Avx512);
+  return tiers;
+}
+
+// Row widths for the kernel tests: every width up to 70 (the 16- and 32-pixel
+// blocks and every tail), and some past 128 for the 64-pixel blocks.
+inline std::vector<int> rowWidths() {
+  std::vector<int> widths;
+  for (int w = 1; w <= 70; ++w) widths.push_back(w);
+  for (int w : {127, 128, 129, 143, 191, 200, 263}) widths.push_back(w);
   return widths;
 }
 

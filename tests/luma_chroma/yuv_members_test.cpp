@@ -17,6 +17,7 @@
 namespace {
 
 using namespace zel::lc;
+using zel::VectorTier;
 using zel::rowAt;
 using zel::lc::test::str;
 using zel::test::TestImage;
@@ -53,7 +54,7 @@ struct Member {
   int block;              // body = width AND NOT (block - 1); 0: no body
   Form body, tail;
   std::function<Status(const Call&)> run;
-  std::function<void(const Call&, int y, bool avx2)> row;  // the row kernel alone
+  std::function<void(const Call&, int y, VectorTier tier)> row;  // the row kernel alone
   int alpha = -1;  // a C4 destination's fourth byte
 };
 
@@ -61,35 +62,35 @@ std::vector<Member> members() {
   return {
       {"zeliRGBToYUV_8u_C3R", false, false, 3, 3, 16, yuvMatrixLanes, yuvDifferenceTruncated,
        [](const Call& c) { return zeliRGBToYUV_8u_C3R(c.src[0], c.srcStep, c.dst[0], c.dstStep, c.size); },
-       [](const Call& c, int y, bool a) { rgbToYuvC3Row(c.srcRow(y)[0], c.dstRow(y)[0], c.size.width, a); }},
+       [](const Call& c, int y, VectorTier a) { rgbToYuvC3Row(c.srcRow(y)[0], c.dstRow(y)[0], c.size.width, a); }},
       {"zeliRGBToYUV_8u_C3P3R", false, true, 3, 3, 8, yuvMatrixLanes, yuvDifferenceTruncated,
        [](const Call& c) { return zeliRGBToYUV_8u_C3P3R(c.src[0], c.srcStep, c.dst.data(), c.dstStep, c.size); },
-       [](const Call& c, int y, bool a) { rgbToYuvC3P3Row(c.srcRow(y)[0], c.dstRow(y).data(), c.size.width, a); }},
+       [](const Call& c, int y, VectorTier a) { rgbToYuvC3P3Row(c.srcRow(y)[0], c.dstRow(y).data(), c.size.width, a); }},
       {"zeliRGBToYUV_8u_P3R", true, true, 3, 3, 16, yuvMatrixLanes, yuvMatrixWide,
        [](const Call& c) { return zeliRGBToYUV_8u_P3R(c.src.data(), c.srcStep, c.dst.data(), c.dstStep, c.size); },
-       [](const Call& c, int y, bool a) { rgbToYuvP3Row(c.srcRow(y).data(), c.dstRow(y).data(), c.size.width, a); }},
+       [](const Call& c, int y, VectorTier a) { rgbToYuvP3Row(c.srcRow(y).data(), c.dstRow(y).data(), c.size.width, a); }},
       {"zeliRGBToYUV_8u_AC4R", false, false, 4, 4, 0, nullptr, yuvDifferenceRounded,
        [](const Call& c) { return zeliRGBToYUV_8u_AC4R(c.src[0], c.srcStep, c.dst[0], c.dstStep, c.size); },
-       [](const Call& c, int y, bool a) { rgbToYuvAC4Row(c.srcRow(y)[0], c.dstRow(y)[0], c.size.width, a); }},
+       [](const Call& c, int y, VectorTier a) { rgbToYuvAC4Row(c.srcRow(y)[0], c.dstRow(y)[0], c.size.width, a); }},
       {"zeliRGBToYUV_8u_AC4P4R", false, true, 4, 4, 8, yuvDifferenceLanes, yuvDifferenceRounded,
        [](const Call& c) { return zeliRGBToYUV_8u_AC4P4R(c.src[0], c.srcStep, c.dst.data(), c.dstStep, c.size); },
-       [](const Call& c, int y, bool a) { rgbToYuvAC4P4Row(c.srcRow(y)[0], c.dstRow(y).data(), c.size.width, a); }},
+       [](const Call& c, int y, VectorTier a) { rgbToYuvAC4P4Row(c.srcRow(y)[0], c.dstRow(y).data(), c.size.width, a); }},
       {"zeliYUVToRGB_8u_C3R", false, false, 3, 3, 8, rgbLanes1, wideAGreenTruncated,
        [](const Call& c) { return zeliYUVToRGB_8u_C3R(c.src[0], c.srcStep, c.dst[0], c.dstStep, c.size); },
-       [](const Call& c, int y, bool a) { yuvToRgbC3Row(c.srcRow(y)[0], c.dstRow(y)[0], c.size.width, a); }},
+       [](const Call& c, int y, VectorTier a) { yuvToRgbC3Row(c.srcRow(y)[0], c.dstRow(y)[0], c.size.width, a); }},
       {"zeliYUVToRGB_8u_AC4R", false, false, 4, 4, 0, nullptr, wideAGreenTruncated,
        [](const Call& c) { return zeliYUVToRGB_8u_AC4R(c.src[0], c.srcStep, c.dst[0], c.dstStep, c.size); },
-       [](const Call& c, int y, bool a) { yuvToRgbAC4Row(c.srcRow(y)[0], c.dstRow(y)[0], c.size.width, a); }},
+       [](const Call& c, int y, VectorTier a) { yuvToRgbAC4Row(c.srcRow(y)[0], c.dstRow(y)[0], c.size.width, a); }},
       {"zeliYUVToRGB_8u_C3C4R", false, false, 3, 4, 8, rgbLanes3, wideARounded,
        [](const Call& c) { return zeliYUVToRGB_8u_C3C4R(c.src[0], c.srcStep, c.dst[0], c.dstStep, c.size, 201); },
-       [](const Call& c, int y, bool a) { yuvToRgbC3C4Row(c.srcRow(y)[0], c.dstRow(y)[0], c.size.width, 201, a); },
+       [](const Call& c, int y, VectorTier a) { yuvToRgbC3C4Row(c.srcRow(y)[0], c.dstRow(y)[0], c.size.width, 201, a); },
        201},
       {"zeliYUVToRGB_8u_P3C3R", true, false, 3, 3, 16, rgbLanes2, wideBTruncated,
        [](const Call& c) { return zeliYUVToRGB_8u_P3C3R(c.src.data(), c.srcStep, c.dst[0], c.dstStep, c.size); },
-       [](const Call& c, int y, bool a) { yuvToRgbP3C3Row(c.srcRow(y).data(), c.dstRow(y)[0], c.size.width, a); }},
+       [](const Call& c, int y, VectorTier a) { yuvToRgbP3C3Row(c.srcRow(y).data(), c.dstRow(y)[0], c.size.width, a); }},
       {"zeliYUVToRGB_8u_P3R", true, true, 3, 3, 0, nullptr, wideBTruncated,
        [](const Call& c) { return zeliYUVToRGB_8u_P3R(c.src.data(), c.srcStep, c.dst.data(), c.dstStep, c.size); },
-       [](const Call& c, int y, bool a) { yuvToRgbP3Row(c.srcRow(y).data(), c.dstRow(y).data(), c.size.width, a); }},
+       [](const Call& c, int y, VectorTier a) { yuvToRgbP3Row(c.srcRow(y).data(), c.dstRow(y).data(), c.size.width, a); }},
   };
 }
 
@@ -154,18 +155,18 @@ void checkMember(const Member& m, int width, int height, int offset, int pad,
 
 TEST(YuvMembers, EveryWidthTakesItsZonesForms) {
   for (const Member& m : members())
-    for (int width = 1; width <= 70; ++width)
+    for (int width : zel::lc::test::rowWidths())
       for (int offset : {0, 3})
         checkMember(m, width, 2, offset + (width & 1), width % 3 == 0 ? 0 : 9,
                     [&](const Call& c) { ASSERT_EQ(m.run(c), StatusOk) << m.name; });
 }
 
-TEST(YuvMembers, RowKernelsOnBothVectorWidths) {
+TEST(YuvMembers, RowKernelsOnEveryVectorTier) {
   for (const Member& m : members())
-    for (bool avx2 : zel::lc::test::vectorWidths())
-      for (int width : {1, 7, 8, 9, 15, 16, 17, 24, 31, 32, 33, 47, 48, 64, 70})
+    for (VectorTier tier : zel::lc::test::rowTiers())
+      for (int width : {1, 7, 8, 9, 15, 16, 17, 24, 31, 32, 33, 47, 48, 64, 70, 127, 128, 129, 143, 200})
         checkMember(m, width, 3, 1 + (width & 6), 2, [&](const Call& c) {
-          for (int y = 0; y < c.size.height; ++y) m.row(c, y, avx2);
+          for (int y = 0; y < c.size.height; ++y) m.row(c, y, tier);
         });
 }
 
@@ -235,6 +236,30 @@ TEST(YuvMembers, PixelsWhoseZoneShows) {
 
 namespace {
 
+// The lane bodies of the interleaved YUV-to-RGB members, on every tier: the
+// 64-pixel blocks take their samples in the high bytes of the lanes and
+// shift them down their own way; every sample triple gives the lane form's
+// bits. Rows of every Y at each U and V.
+TEST(YuvMembers, LaneBodiesGiveTheLaneFormForEverySample) {
+  std::vector<uint8_t> src(3 * 256), out3(3 * 256), out4(4 * 256), want3(3 * 256), want4(4 * 256);
+  for (int u = 0; u < 256; ++u)
+    for (int v = 0; v < 256; ++v) {
+      for (int y = 0; y < 256; ++y) {
+        src[3 * y] = uint8_t(y);
+        src[3 * y + 1] = uint8_t(u);
+        src[3 * y + 2] = uint8_t(v);
+        const Pixel8 a = rgbLanes1(y, u, v), b = rgbLanes3(y, u, v);
+        want3[3 * y] = a.c0, want3[3 * y + 1] = a.c1, want3[3 * y + 2] = a.c2;
+        want4[4 * y] = b.c0, want4[4 * y + 1] = b.c1, want4[4 * y + 2] = b.c2, want4[4 * y + 3] = 7;
+      }
+      for (VectorTier tier : zel::lc::test::rowTiers()) {
+        yuvToRgbC3Row(src.data(), out3.data(), 256, tier);
+        yuvToRgbC3C4Row(src.data(), out4.data(), 256, 7, tier);
+        ASSERT_TRUE(out3 == want3 && out4 == want4) << "U " << u << " V " << v << " " << zel::tierName(tier);
+      }
+    }
+}
+
 // The matrix body regroups the lane form's shifts and its final clamp; every
 // sample triple takes the lane form's bits. Rows of every R at each G and B.
 TEST(YuvMembers, MatrixBodyGivesTheLaneFormForEverySample) {
@@ -242,16 +267,16 @@ TEST(YuvMembers, MatrixBodyGivesTheLaneFormForEverySample) {
   const uint8_t* const src[3] = {planes.data(), planes.data() + 256, planes.data() + 512};
   uint8_t* const dst[3] = {out.data(), out.data() + 256, out.data() + 512};
   for (int r = 0; r < 256; ++r) planes[r] = uint8_t(r);
-  for (bool avx2 : zel::lc::test::vectorWidths())
+  for (VectorTier tier : zel::lc::test::rowTiers())
     for (int g = 0; g < 256; ++g)
       for (int b = 0; b < 256; ++b) {
         std::fill(planes.begin() + 256, planes.begin() + 512, uint8_t(g));
         std::fill(planes.begin() + 512, planes.end(), uint8_t(b));
-        rgbToYuvP3Row(src, dst, 256, avx2);
+        rgbToYuvP3Row(src, dst, 256, tier);
         for (int r = 0; r < 256; ++r) {
           const Pixel8 want = yuvMatrixLanes(r, g, b);
           ASSERT_TRUE(dst[0][r] == want.c0 && dst[1][r] == want.c1 && dst[2][r] == want.c2)
-              << r << "," << g << "," << b << " avx2 " << avx2;
+              << r << "," << g << "," << b << " " << zel::tierName(tier);
         }
       }
 }
