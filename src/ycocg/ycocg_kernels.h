@@ -265,6 +265,8 @@ struct BytePlanesBack {
 // Reading ahead: the source lines of a block some way further on are asked
 // for now, so that memory keeps pace on large frames. A prefetch is a hint
 // that neither faults nor changes a byte, so it may point past the row.
+// Only the interleaved source of the forward rows takes it: the three
+// plane streams of the inverse keep pace without, and ran slower with.
 constexpr int kReadAhead = 8192;
 template <int Bytes>
 ZEL_INLINE void readAhead(const void* p) {
@@ -375,10 +377,8 @@ ZEL_INLINE int inverseBlocks(const typename Op::Plane* const* in, Dst* dst, int 
   const V alphaLanes = U::set16(alpha);
   for (; x + U::kPixels <= end; x += U::kPixels) {
     V e[4];
-    for (int p = 0; p < 3; ++p) readAhead<U::kPixels * int(sizeof(typename Op::Plane))>(in[p] + x);
     Op::template block<U>(in, x, e);
     e[3] = alphaLanes;
-    if constexpr (!Stream) readAhead<U::kPixels * Ch * int(sizeof(Dst))>(dst + x * Ch);  // lines to be written
     Interleaved<U, int(sizeof(Dst)), Ch>::template store<Stream>(dst + x * Ch, e);
   }
   return x;
