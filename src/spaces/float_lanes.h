@@ -18,11 +18,29 @@
 #include <type_traits>
 
 #include "frame/simd.h"
+#include "spaces/row_stores.h"
+
+// The 512-bit intrinsics start some results from an undefined vector,
+// which the compiler then reports as maybe uninitialised; nothing here
+// reads such a value.
+#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
 
 #define ZEL_LANE inline __attribute__((always_inline))
 #define ZEL_LANE_AVX2 ZEL_AVX2 inline __attribute__((always_inline))
+#define ZEL_LANE_AVX512 ZEL_AVX512 inline __attribute__((always_inline))
 
 namespace zel::lanes {
+
+// Reading ahead: a block's source lines some way further on are asked for
+// now, so that memory keeps pace with the arithmetic (the processor's own
+// prefetch does not, on large frames). A prefetch is a hint: it neither
+// faults nor changes a byte, so it may point past the row.
+inline constexpr int kReadAhead = 8192;
+template <int Bytes>
+ZEL_LANE void readAhead(const void* p) {
+  const char* at = static_cast<const char*>(p) + kReadAhead;
+  for (int b = 0; b < Bytes; b += 64) _mm_prefetch(at + b, _MM_HINT_T0);
+}
 
 // ---------------------------------------------------------------- 4 lanes
 
@@ -33,6 +51,7 @@ struct I4 {
 
 struct F4 {
   using Int = I4;
+  using Mask = F4;  // comparisons give all-ones lanes
   static constexpr int kLanes = 4;
   __m128 v;
   static ZEL_LANE F4 splat(float x) { return {_mm_set1_ps(x)}; }
@@ -236,6 +255,32 @@ ZEL_LANE void storePixels(float* p, F4 c0, F4 c1, F4 c2) {
   storeRaw<Stride, false>(p, asInt(c0), asInt(c1), asInt(c2));
 }
 
+// Float pixels read and written as `how` says (see row_stores.h); only
+// three-sample pixels are ever streamed or cut to a part.
+template <int Stride, bool Bias16, typename T>
+ZEL_LANE void getPixels(const spaces::RowStores& how, const T* p, F4& c0, F4& c1, F4& c2) {
+  if constexpr (Stride == 3 && std::is_same_v<T, float>) {
+    if (how.kind == spaces::RowStores::Part) {
+      alignas(16) float v[12] = {};
+      std::memcpy(v, p, sizeof(float) * 3 * size_t(how.keep));
+      loadPixels<3, false>(v, c0, c1, c2);
+      return;
+    }
+  }
+  loadPixels<Stride, Bias16>(p, c0, c1, c2);
+}
+template <int Stride>
+ZEL_LANE void putPixels(const spaces::RowStores& how, float* p, F4 c0, F4 c1, F4 c2) {
+  if (Stride != 3 || how.kind == spaces::RowStores::Plain) return storePixels<Stride>(p, c0, c1, c2);
+  alignas(16) float v[12];
+  storePixels<3>(v, c0, c1, c2);
+  if (how.kind == spaces::RowStores::Part) {
+    std::memcpy(p, v, sizeof(float) * 3 * size_t(how.keep));
+    return;
+  }
+  for (int k = 0; k < 3; ++k) _mm_stream_ps(p + 4 * k, _mm_load_ps(v + 4 * k));
+}
+
 // ---------------------------------------------------------------- 8 lanes
 
 struct I8 {
@@ -245,6 +290,7 @@ struct I8 {
 
 struct F8 {
   using Int = I8;
+  using Mask = F8;
   static constexpr int kLanes = 8;
   __m256 v;
   static ZEL_LANE_AVX2 F8 splat(float x) { return {_mm256_set1_ps(x)}; }
@@ -362,14 +408,16 @@ ZEL_LANE_AVX2 void loadRaw(const T* p, I8& c0, I8& c1, I8& c2) {
 // channel is picked from the three by two blends (its samples sit at
 // distinct places of the three) and put in pixel order by one permute.
 // Storing is the same the other way round.
-ZEL_LANE_AVX2 void loadFloat3(const float* p, F8& c0, F8& c1, F8& c2) {
-  const __m256 v0 = _mm256_loadu_ps(p), v1 = _mm256_loadu_ps(p + 8), v2 = _mm256_loadu_ps(p + 16);
+ZEL_LANE_AVX2 void deinterleaveFloat3(__m256 v0, __m256 v1, __m256 v2, F8& c0, F8& c1, F8& c2) {
   const __m256 a = _mm256_blend_ps(_mm256_blend_ps(v0, v1, 0x92), v2, 0x24);
   const __m256 b = _mm256_blend_ps(_mm256_blend_ps(v0, v1, 0x24), v2, 0x49);
   const __m256 c = _mm256_blend_ps(_mm256_blend_ps(v0, v1, 0x49), v2, 0x92);
   c0.v = _mm256_permutevar8x32_ps(a, _mm256_setr_epi32(0, 3, 6, 1, 4, 7, 2, 5));
   c1.v = _mm256_permutevar8x32_ps(b, _mm256_setr_epi32(1, 4, 7, 2, 5, 0, 3, 6));
   c2.v = _mm256_permutevar8x32_ps(c, _mm256_setr_epi32(2, 5, 0, 3, 6, 1, 4, 7));
+}
+ZEL_LANE_AVX2 void loadFloat3(const float* p, F8& c0, F8& c1, F8& c2) {
+  deinterleaveFloat3(_mm256_loadu_ps(p), _mm256_loadu_ps(p + 8), _mm256_loadu_ps(p + 16), c0, c1, c2);
 }
 
 ZEL_LANE_AVX2 void storeFloat3(float* p, F8 c0, F8 c1, F8 c2) {
@@ -412,6 +460,46 @@ ZEL_LANE_AVX2 void storePixels(float* p, F8 c0, F8 c1, F8 c2) {
   else storeRaw<Stride, false>(p, asInt(c0), asInt(c1), asInt(c2));
 }
 
+// The three vectors of storeFloat3 streamed (p aligned to 32), or the
+// samples of the first `keep` pixels alone; and those read alone.
+ZEL_LANE_AVX2 __m256i firstSamples(int samples, int k) {
+  return _mm256_cmpgt_epi32(_mm256_set1_epi32(samples - 8 * k), _mm256_setr_epi32(0, 1, 2, 3, 4, 5, 6, 7));
+}
+ZEL_LANE_AVX2 void interleaveFloat3(F8 c0, F8 c1, F8 c2, __m256* out) {
+  const __m256 a = _mm256_permutevar8x32_ps(c0.v, _mm256_setr_epi32(0, 3, 6, 1, 4, 7, 2, 5));
+  const __m256 b = _mm256_permutevar8x32_ps(c1.v, _mm256_setr_epi32(5, 0, 3, 6, 1, 4, 7, 2));
+  const __m256 c = _mm256_permutevar8x32_ps(c2.v, _mm256_setr_epi32(2, 5, 0, 3, 6, 1, 4, 7));
+  out[0] = _mm256_blend_ps(_mm256_blend_ps(a, b, 0x92), c, 0x24);
+  out[1] = _mm256_blend_ps(_mm256_blend_ps(c, a, 0x92), b, 0x24);
+  out[2] = _mm256_blend_ps(_mm256_blend_ps(b, c, 0x92), a, 0x24);
+}
+
+template <int Stride>
+ZEL_LANE_AVX2 void putPixels(const spaces::RowStores& how, float* p, F8 c0, F8 c1, F8 c2) {
+  if (Stride != 3 || how.kind == spaces::RowStores::Plain) return storePixels<Stride>(p, c0, c1, c2);
+  __m256 v[3];
+  interleaveFloat3(c0, c1, c2, v);
+  if (how.kind == spaces::RowStores::Stream) {
+    for (int k = 0; k < 3; ++k) _mm256_stream_ps(p + 8 * k, v[k]);
+    return;
+  }
+  for (int k = 0; k < 3; ++k) _mm256_maskstore_ps(p + 8 * k, firstSamples(3 * how.keep, k), v[k]);
+}
+
+template <int Stride, bool Bias16, typename T>
+ZEL_LANE_AVX2 void getPixels(const spaces::RowStores& how, const T* p, F8& c0, F8& c1, F8& c2) {
+  if constexpr (Stride == 3 && std::is_same_v<T, float>) {
+    if (how.kind == spaces::RowStores::Part) {
+      const __m256 v0 = _mm256_maskload_ps(p, firstSamples(3 * how.keep, 0));
+      const __m256 v1 = _mm256_maskload_ps(p + 8, firstSamples(3 * how.keep, 1));
+      const __m256 v2 = _mm256_maskload_ps(p + 16, firstSamples(3 * how.keep, 2));
+      deinterleaveFloat3(v0, v1, v2, c0, c1, c2);
+      return;
+    }
+  }
+  loadPixels<Stride, Bias16>(p, c0, c1, c2);
+}
+
 // Integer lanes stored as bytes saturated to 0..255 (SaturateS16 then
 // SaturateU8, which together clamp any int32 to 0..255). Eight pixels of
 // three bytes pack with saturation and take one shuffle; other shapes clamp
@@ -446,6 +534,300 @@ ZEL_LANE_AVX2 void storeClampedBytes(uint8_t* p, I8 c0, I8 c1, I8 c2) {
   } else {
     storeRaw<Stride, false>(p, clampToByte(c0), clampToByte(c1), clampToByte(c2));
   }
+}
+
+// ---------------------------------------------------------------- 16 lanes
+//
+// The 512-bit tier. Comparisons give a mask register (M16) rather than
+// all-ones lanes; select and the masked forms read it. ApproxRcp stays
+// RCPPS: the sixteen lanes take two 256-bit reciprocals, lane by lane the
+// same bits as every other width.
+
+struct I16 {
+  __m512i v;
+  static ZEL_LANE_AVX512 I16 splat(int32_t x) { return {_mm512_set1_epi32(x)}; }
+};
+
+struct M16 {
+  __mmask16 k;
+};
+
+struct F16 {
+  using Int = I16;
+  using Mask = M16;
+  static constexpr int kLanes = 16;
+  __m512 v;
+  static ZEL_LANE_AVX512 F16 splat(float x) { return {_mm512_set1_ps(x)}; }
+};
+
+ZEL_LANE_AVX512 F16 operator+(F16 a, F16 b) { return {_mm512_add_ps(a.v, b.v)}; }
+ZEL_LANE_AVX512 F16 operator-(F16 a, F16 b) { return {_mm512_sub_ps(a.v, b.v)}; }
+ZEL_LANE_AVX512 F16 operator*(F16 a, F16 b) { return {_mm512_mul_ps(a.v, b.v)}; }
+ZEL_LANE_AVX512 F16 operator/(F16 a, F16 b) { return {_mm512_div_ps(a.v, b.v)}; }
+// VMINPS / VMAXPS keep the legacy rule: the second operand when the
+// comparison fails.
+ZEL_LANE_AVX512 F16 vmin(F16 a, F16 b) { return {_mm512_min_ps(a.v, b.v)}; }
+ZEL_LANE_AVX512 F16 vmax(F16 a, F16 b) { return {_mm512_max_ps(a.v, b.v)}; }
+ZEL_LANE_AVX512 F16 approxRcp(F16 a) {
+  const __m256 lo = _mm256_rcp_ps(_mm512_castps512_ps256(a.v));
+  const __m256 hi = _mm256_rcp_ps(_mm512_extractf32x8_ps(a.v, 1));
+  return {_mm512_insertf32x8(_mm512_castps256_ps512(lo), hi, 1)};
+}
+ZEL_LANE_AVX512 F16 refinedRcp(F16 x) {
+  const F16 r = approxRcp(x);
+  return (r + r) - ((x * r) * r);
+}
+ZEL_LANE_AVX512 F16 vabs(F16 a) { return {_mm512_abs_ps(a.v)}; }
+ZEL_LANE_AVX512 M16 eq(F16 a, F16 b) { return {_mm512_cmp_ps_mask(a.v, b.v, _CMP_EQ_OQ)}; }
+ZEL_LANE_AVX512 M16 lt(F16 a, F16 b) { return {_mm512_cmp_ps_mask(a.v, b.v, _CMP_LT_OS)}; }
+ZEL_LANE_AVX512 M16 le(F16 a, F16 b) { return {_mm512_cmp_ps_mask(a.v, b.v, _CMP_LE_OS)}; }
+ZEL_LANE_AVX512 M16 gt(F16 a, F16 b) { return {_mm512_cmp_ps_mask(a.v, b.v, _CMP_GT_OS)}; }
+ZEL_LANE_AVX512 M16 ge(F16 a, F16 b) { return {_mm512_cmp_ps_mask(a.v, b.v, _CMP_GE_OS)}; }
+ZEL_LANE_AVX512 M16 maskOr(M16 a, M16 b) { return {__mmask16(a.k | b.k)}; }
+ZEL_LANE_AVX512 M16 maskAnd(M16 a, M16 b) { return {__mmask16(a.k & b.k)}; }
+// The value where the mask is set, zero elsewhere (as maskAnd of an
+// all-ones mask and a value).
+ZEL_LANE_AVX512 F16 maskAnd(M16 m, F16 a) { return {_mm512_maskz_mov_ps(m.k, a.v)}; }
+ZEL_LANE_AVX512 F16 select(M16 m, F16 a, F16 b) { return {_mm512_mask_blend_ps(m.k, b.v, a.v)}; }
+ZEL_LANE_AVX512 F16 clearWhere(M16 m, F16 a) { return {_mm512_maskz_mov_ps(__mmask16(~m.k), a.v)}; }
+ZEL_LANE_AVX512 M16 clearWhere(M16 m, M16 a) { return {__mmask16(a.k & ~m.k)}; }
+ZEL_LANE_AVX512 I16 roundEven(F16 a) { return {_mm512_cvtps_epi32(a.v)}; }
+ZEL_LANE_AVX512 I16 truncate(F16 a) { return {_mm512_cvttps_epi32(a.v)}; }
+ZEL_LANE_AVX512 F16 toFloat(I16 a) { return {_mm512_cvtepi32_ps(a.v)}; }
+ZEL_LANE_AVX512 F16 asFloat(I16 a) { return {_mm512_castsi512_ps(a.v)}; }
+ZEL_LANE_AVX512 I16 asInt(F16 a) { return {_mm512_castps_si512(a.v)}; }
+
+ZEL_LANE_AVX512 I16 operator+(I16 a, I16 b) { return {_mm512_add_epi32(a.v, b.v)}; }
+ZEL_LANE_AVX512 I16 operator-(I16 a, I16 b) { return {_mm512_sub_epi32(a.v, b.v)}; }
+ZEL_LANE_AVX512 I16 operator|(I16 a, I16 b) { return {_mm512_or_si512(a.v, b.v)}; }
+ZEL_LANE_AVX512 I16 operator&(I16 a, I16 b) { return {_mm512_and_si512(a.v, b.v)}; }
+ZEL_LANE_AVX512 I16 operator^(I16 a, I16 b) { return {_mm512_xor_si512(a.v, b.v)}; }
+template <int N>
+ZEL_LANE_AVX512 I16 shiftRightArith(I16 a) {
+  return {_mm512_srai_epi32(a.v, N)};
+}
+template <int N>
+ZEL_LANE_AVX512 I16 shiftLeft(I16 a) {
+  return {_mm512_slli_epi32(a.v, N)};
+}
+ZEL_LANE_AVX512 I16 imin(I16 a, I16 b) { return {_mm512_min_epi32(a.v, b.v)}; }
+ZEL_LANE_AVX512 I16 imax(I16 a, I16 b) { return {_mm512_max_epi32(a.v, b.v)}; }
+ZEL_LANE_AVX512 M16 ieq(I16 a, I16 b) { return {_mm512_cmpeq_epi32_mask(a.v, b.v)}; }
+ZEL_LANE_AVX512 I16 iselect(M16 m, I16 a, I16 b) { return {_mm512_mask_blend_epi32(m.k, b.v, a.v)}; }
+ZEL_LANE_AVX512 I16 multiplyAddPairs(I16 a, I16 b) { return {_mm512_madd_epi16(a.v, b.v)}; }
+ZEL_LANE_AVX512 I16 clampToByte(I16 x) { return imax(imin(x, I16::splat(255)), I16::splat(0)); }
+ZEL_LANE_AVX512 I16 clampToWord(I16 x) { return imax(imin(x, I16::splat(65535)), I16::splat(0)); }
+
+// Sixteen (c, w) pairs, each one 64-bit read, as the narrower forms.
+ZEL_LANE_AVX512 void gatherPairs(const float (*table)[2], I16 index, F16& c, F16& w) {
+  alignas(64) int32_t at[16];
+  _mm512_store_si512(at, index.v);
+  auto pair = [&](int k) { return _mm_castpd_ps(_mm_load_sd(reinterpret_cast<const double*>(table[at[k]]))); };
+  auto high = [&](__m128 lo, int k) { return _mm_loadh_pi(lo, reinterpret_cast<const __m64*>(table[at[k]])); };
+  // Quarters [c0 w0 c1 w1 | c4 w4 c5 w5 | c8 .. | c12 ..] and the same
+  // from pixels 2, 3, 6, 7, ...
+  __m512 a = _mm512_castps128_ps512(high(pair(0), 1)), b = _mm512_castps128_ps512(high(pair(2), 3));
+  a = _mm512_insertf32x4(a, high(pair(4), 5), 1), b = _mm512_insertf32x4(b, high(pair(6), 7), 1);
+  a = _mm512_insertf32x4(a, high(pair(8), 9), 2), b = _mm512_insertf32x4(b, high(pair(10), 11), 2);
+  a = _mm512_insertf32x4(a, high(pair(12), 13), 3), b = _mm512_insertf32x4(b, high(pair(14), 15), 3);
+  c.v = _mm512_shuffle_ps(a, b, _MM_SHUFFLE(2, 0, 2, 0));
+  w.v = _mm512_shuffle_ps(a, b, _MM_SHUFFLE(3, 1, 3, 1));
+}
+
+// Sixteen float pixels of three samples are three whole vectors. Sample
+// 3k + c (channel c of pixel k) lies at place (3k + c) % 16 of vector
+// (3k + c) / 16, and for one channel those places are distinct across the
+// three vectors (p = c, c + 2, c + 1 modulo 3 in vectors 0, 1, 2): each
+// channel is two masked blends and one permute, and back.
+struct Float3Order {
+  int32_t order[3][16];   // pixel k of channel c sits at place order[c][k]
+  int32_t spread[3][16];  // and place p holds pixel spread[c][p]
+  static constexpr Float3Order make() {
+    Float3Order m{};
+    for (int c = 0; c < 3; ++c)
+      for (int k = 0; k < 16; ++k) {
+        m.order[c][k] = (3 * k + c) % 16;
+        m.spread[c][(3 * k + c) % 16] = k;
+      }
+    return m;
+  }
+};
+inline constexpr Float3Order kFloat3Order = Float3Order::make();
+
+// Places p of vector v (0..2) that hold channel c: (16 v + p) % 3 == c.
+constexpr __mmask16 channelPlaces(int v, int c) {
+  int bits = 0;
+  for (int p = 0; p < 16; ++p)
+    if ((16 * v + p) % 3 == c) bits |= 1 << p;
+  return __mmask16(bits);
+}
+
+ZEL_LANE_AVX512 __m512i indexVector(const int32_t* at) { return _mm512_loadu_si512(at); }
+// Lanes of v by index (VPERMPS / VPERMD).
+ZEL_LANE_AVX512 __m512 permuteLanes(__m512i index, __m512 v) { return _mm512_permutexvar_ps(index, v); }
+ZEL_LANE_AVX512 __m512i permuteLanes(__m512i index, __m512i v) { return _mm512_permutexvar_epi32(index, v); }
+
+template <int C>
+ZEL_LANE_AVX512 __m512 channelOf(__m512 v0, __m512 v1, __m512 v2) {
+  const __m512 a = _mm512_mask_blend_ps(channelPlaces(2, C), _mm512_mask_blend_ps(channelPlaces(1, C), v0, v1), v2);
+  return permuteLanes(indexVector(kFloat3Order.order[C]), a);
+}
+ZEL_LANE_AVX512 void deinterleaveFloat3(__m512 v0, __m512 v1, __m512 v2, F16& c0, F16& c1, F16& c2) {
+  c0.v = channelOf<0>(v0, v1, v2);
+  c1.v = channelOf<1>(v0, v1, v2);
+  c2.v = channelOf<2>(v0, v1, v2);
+}
+
+template <int V>
+ZEL_LANE_AVX512 __m512 vectorOf(__m512 s0, __m512 s1, __m512 s2) {
+  return _mm512_mask_blend_ps(channelPlaces(V, 2), _mm512_mask_blend_ps(channelPlaces(V, 1), s0, s1), s2);
+}
+ZEL_LANE_AVX512 void interleaveFloat3(F16 c0, F16 c1, F16 c2, __m512* out) {
+  // Each channel spread to its places (place (3k + c) % 16 takes pixel k).
+  const __m512 s0 = permuteLanes(indexVector(kFloat3Order.spread[0]), c0.v);
+  const __m512 s1 = permuteLanes(indexVector(kFloat3Order.spread[1]), c1.v);
+  const __m512 s2 = permuteLanes(indexVector(kFloat3Order.spread[2]), c2.v);
+  out[0] = vectorOf<0>(s0, s1, s2);
+  out[1] = vectorOf<1>(s0, s1, s2);
+  out[2] = vectorOf<2>(s0, s1, s2);
+}
+
+ZEL_LANE_AVX512 void loadFloat3(const float* p, F16& c0, F16& c1, F16& c2) {
+  deinterleaveFloat3(_mm512_loadu_ps(p), _mm512_loadu_ps(p + 16), _mm512_loadu_ps(p + 32), c0, c1, c2);
+}
+// The masks of the first `samples` floats of three vectors.
+ZEL_LANE_AVX512 __mmask16 firstSampleBits(int samples, int k) {
+  return __mmask16(((uint64_t(1) << samples) - 1) >> (16 * k));
+}
+
+ZEL_LANE_AVX512 void storeFloat3(float* p, F16 c0, F16 c1, F16 c2) {
+  __m512 v[3];
+  interleaveFloat3(c0, c1, c2, v);
+  _mm512_storeu_ps(p, v[0]);
+  _mm512_storeu_ps(p + 16, v[1]);
+  _mm512_storeu_ps(p + 32, v[2]);
+}
+
+// Sixteen byte pixels of three samples (48 bytes, read exactly): each
+// 128-bit lane takes the 12 bytes of four pixels, then one byte shuffle a
+// channel as in the 8-lane form.
+ZEL_LANE_AVX512 __m512i bytes3ToLanes(const uint8_t* p) {
+  const __m512i raw = _mm512_maskz_loadu_epi32(0x0FFF, p);
+  return permuteLanes(_mm512_setr_epi32(0, 1, 2, 0, 3, 4, 5, 0, 6, 7, 8, 0, 9, 10, 11, 0), raw);
+}
+// The same byte shuffle in every 128-bit lane.
+ZEL_LANE_AVX512 __m512i laneShuffle(__m512i v, __m128i mask) {
+  return _mm512_shuffle_epi8(v, _mm512_broadcast_i32x4(mask));
+}
+ZEL_LANE_AVX512 void loadBytes3(const uint8_t* p, I16& c0, I16& c1, I16& c2) {
+  const __m512i v = bytes3ToLanes(p);
+  c0.v = laneShuffle(v, _mm_setr_epi8(0, -1, -1, -1, 3, -1, -1, -1, 6, -1, -1, -1, 9, -1, -1, -1));
+  c1.v = laneShuffle(v, _mm_setr_epi8(1, -1, -1, -1, 4, -1, -1, -1, 7, -1, -1, -1, 10, -1, -1, -1));
+  c2.v = laneShuffle(v, _mm_setr_epi8(2, -1, -1, -1, 5, -1, -1, -1, 8, -1, -1, -1, 11, -1, -1, -1));
+}
+// Twelve bytes at the start of each 128-bit lane back to 48 bytes, written
+// exactly.
+ZEL_LANE_AVX512 void storeLanesAsBytes3(uint8_t* p, __m512i v) {
+  const __m512i packed =
+      permuteLanes(_mm512_setr_epi32(0, 1, 2, 4, 5, 6, 8, 9, 10, 12, 13, 14, 0, 0, 0, 0), v);
+  _mm512_mask_storeu_epi32(p, 0x0FFF, packed);
+}
+// The low byte of each lane to its place.
+ZEL_LANE_AVX512 void storeBytes3(uint8_t* p, I16 c0, I16 c1, I16 c2) {
+  const __m512i v =
+      _mm512_or_si512(_mm512_or_si512(laneShuffle(c0.v, _mm_setr_epi8(0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1,
+                                                                      -1, -1, -1)),
+                                      laneShuffle(c1.v, _mm_setr_epi8(-1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1,
+                                                                      -1, -1, -1))),
+                      laneShuffle(c2.v, _mm_setr_epi8(-1, -1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1)));
+  storeLanesAsBytes3(p, v);
+}
+
+// Four-byte pixels: the first three bytes of each as lanes; back, the
+// three bytes alone are written and the fourth is not touched.
+ZEL_LANE_AVX512 void loadBytes4(const uint8_t* p, I16& c0, I16& c1, I16& c2) {
+  const __m512i v = _mm512_loadu_si512(p), low = _mm512_set1_epi32(0xFF);
+  c0.v = _mm512_and_si512(v, low);
+  c1.v = _mm512_and_si512(_mm512_srli_epi32(v, 8), low);
+  c2.v = _mm512_and_si512(_mm512_srli_epi32(v, 16), low);
+}
+ZEL_LANE_AVX512 void storeBytes4(uint8_t* p, I16 c0, I16 c1, I16 c2) {
+  const __m512i low = _mm512_set1_epi32(0xFF);
+  const __m512i v01 = _mm512_or_si512(_mm512_and_si512(c0.v, low), _mm512_slli_epi32(_mm512_and_si512(c1.v, low), 8));
+  const __m512i v = _mm512_or_si512(v01, _mm512_slli_epi32(c2.v, 16));
+  _mm512_mask_storeu_epi8(p, 0x7777777777777777ull, v);
+}
+
+template <int Stride, bool Bias16, typename T>
+ZEL_LANE_AVX512 void loadRaw(const T* p, I16& c0, I16& c1, I16& c2) {
+  static_assert(sizeof(T) == 1 && !Bias16, "the 16-lane forms read bytes");
+  if constexpr (Stride == 3) loadBytes3(p, c0, c1, c2);
+  else loadBytes4(p, c0, c1, c2);
+}
+
+template <int Stride, bool Bias16, typename T>
+ZEL_LANE_AVX512 void loadPixels(const T* p, F16& c0, F16& c1, F16& c2) {
+  if constexpr (std::is_same_v<T, float>) {
+    static_assert(Stride == 3, "the 16-lane forms read three-float pixels");
+    loadFloat3(p, c0, c1, c2);
+  } else {
+    I16 r0, r1, r2;
+    loadRaw<Stride, Bias16>(p, r0, r1, r2);
+    c0 = toFloat(r0), c1 = toFloat(r1), c2 = toFloat(r2);
+  }
+}
+
+template <int Stride, bool Bias16, typename T>
+ZEL_LANE_AVX512 void storeRaw(T* p, I16 c0, I16 c1, I16 c2) {
+  static_assert(sizeof(T) == 1 && !Bias16, "the 16-lane forms write bytes");
+  if constexpr (Stride == 3) storeBytes3(p, c0, c1, c2);
+  else storeBytes4(p, c0, c1, c2);
+}
+
+template <int Stride>
+ZEL_LANE_AVX512 void storeClampedBytes(uint8_t* p, I16 c0, I16 c1, I16 c2) {
+  if constexpr (Stride == 3) {
+    // Per 128-bit lane: c0 of four pixels, c1, c2, c2 again, as saturated
+    // bytes, then put in pixel order.
+    const __m512i bytes = _mm512_packus_epi16(_mm512_packs_epi32(c0.v, c1.v), _mm512_packs_epi32(c2.v, c2.v));
+    storeLanesAsBytes3(p, laneShuffle(bytes, _mm_setr_epi8(0, 4, 8, 1, 5, 9, 2, 6, 10, 3, 7, 11, -1, -1, -1, -1)));
+  } else {
+    storeBytes4(p, clampToByte(c0), clampToByte(c1), clampToByte(c2));
+  }
+}
+
+template <int Stride>
+ZEL_LANE_AVX512 void storePixels(float* p, F16 c0, F16 c1, F16 c2) {
+  static_assert(Stride == 3, "the 16-lane forms write three-float pixels");
+  storeFloat3(p, c0, c1, c2);
+}
+
+template <int Stride>
+ZEL_LANE_AVX512 void putPixels(const spaces::RowStores& how, float* p, F16 c0, F16 c1, F16 c2) {
+  static_assert(Stride == 3, "the 16-lane forms write three-float pixels");
+  __m512 v[3];
+  interleaveFloat3(c0, c1, c2, v);
+  if (how.kind == spaces::RowStores::Plain) {
+    for (int k = 0; k < 3; ++k) _mm512_storeu_ps(p + 16 * k, v[k]);
+  } else if (how.kind == spaces::RowStores::Stream) {
+    for (int k = 0; k < 3; ++k) _mm512_stream_ps(p + 16 * k, v[k]);
+  } else {
+    for (int k = 0; k < 3; ++k) _mm512_mask_storeu_ps(p + 16 * k, firstSampleBits(3 * how.keep, k), v[k]);
+  }
+}
+
+template <int Stride, bool Bias16, typename T>
+ZEL_LANE_AVX512 void getPixels(const spaces::RowStores& how, const T* p, F16& c0, F16& c1, F16& c2) {
+  if constexpr (Stride == 3 && std::is_same_v<T, float>) {
+    if (how.kind == spaces::RowStores::Part) {
+      const int n = 3 * how.keep;
+      deinterleaveFloat3(_mm512_maskz_loadu_ps(firstSampleBits(n, 0), p),
+                         _mm512_maskz_loadu_ps(firstSampleBits(n, 1), p + 16),
+                         _mm512_maskz_loadu_ps(firstSampleBits(n, 2), p + 32), c0, c1, c2);
+      return;
+    }
+  }
+  loadPixels<Stride, Bias16>(p, c0, c1, c2);
 }
 
 }  // namespace zel::lanes

@@ -11,12 +11,32 @@
 #include "spaces/float_lanes.h"
 #include "spaces/hls_formulas.h"
 #include "spaces/hls_rows.h"
+#include "spaces/space_frame.h"
 
 namespace zel::hls {
+
+using spaces::Lanes;
+using spaces::laneCount;
+using spaces::pixelsToAlignment;
+using spaces::RowContext;
+using spaces::RowStores;
+using spaces::widestLanes;
+
+// The masked helpers of hls_vector.inl as selects, for the lane sets whose
+// masks are all-ones lanes (written into each set, so that they take its
+// instruction set).
+#define ZEL_HLS_SELECT_FORMS                                                          \
+  static M maskAndNot(M a, M b) { return andNot(a, b); }                              \
+  static F addWhere(M m, F src, F a, F b) { return select(m, add(a, b), src); }       \
+  static F subWhere(M m, F src, F a, F b) { return select(m, sub(a, b), src); }       \
+  static F addUnless(M m, F src, F a, F b) { return select(m, src, add(a, b)); }      \
+  static F subUnless(M m, F src, F a, F b) { return select(m, src, sub(a, b)); }      \
+  static F divUnless(M m, F a, F b) { return andNot(m, div(a, b)); }
 
 struct Sse {
   using F = __m128;
   using I = __m128i;
+  using M = __m128;
   static constexpr int kGroups = 1;
   static F set(float v) { return _mm_set1_ps(v); }
   static F add(F a, F b) { return _mm_add_ps(a, b); }
@@ -28,9 +48,11 @@ struct Sse {
   static F eq(F a, F b) { return _mm_cmpeq_ps(a, b); }
   static F le(F a, F b) { return _mm_cmple_ps(a, b); }
   static F lt(F a, F b) { return _mm_cmplt_ps(a, b); }
+  static F notLess(F a, F b) { return _mm_cmpnlt_ps(a, b); }
   static F gt(F a, F b) { return _mm_cmpgt_ps(a, b); }
   static F select(F mask, F yes, F no) { return _mm_blendv_ps(no, yes, mask); }
   static F andNot(F mask, F v) { return _mm_andnot_ps(mask, v); }
+  ZEL_HLS_SELECT_FORMS
   static F rcp(F x) { return _mm_rcp_ps(x); }
   static I round(F x) { return _mm_cvtps_epi32(x); }
   static I truncate(F x) { return _mm_cvttps_epi32(x); }
@@ -43,8 +65,8 @@ struct Sse {
   static __m128i part(I v, int) { return v; }
   // Whole vectors of three-float pixels: only with eight lanes.
   static constexpr bool kWholeFloat3 = false;
-  static void loadFloat3(const float*, F*) {}
-  static void storeFloat3(float*, const F*) {}
+  static void getFloat3(const RowStores&, const float*, F*) {}
+  static void putFloat3(const RowStores&, float*, const F*) {}
   static void loadBytes3(const uint8_t*, F*) {}
   static void storeBytes3(uint8_t*, const I*) {}
 };
@@ -59,6 +81,7 @@ namespace sse41 {
 struct Avx {
   using F = __m256;
   using I = __m256i;
+  using M = __m256;
   static constexpr int kGroups = 2;
   static F set(float v) { return _mm256_set1_ps(v); }
   static F add(F a, F b) { return _mm256_add_ps(a, b); }
@@ -70,9 +93,11 @@ struct Avx {
   static F eq(F a, F b) { return _mm256_cmp_ps(a, b, _CMP_EQ_OQ); }
   static F le(F a, F b) { return _mm256_cmp_ps(a, b, _CMP_LE_OS); }
   static F lt(F a, F b) { return _mm256_cmp_ps(a, b, _CMP_LT_OS); }
+  static F notLess(F a, F b) { return _mm256_cmp_ps(a, b, _CMP_NLT_US); }
   static F gt(F a, F b) { return _mm256_cmp_ps(a, b, _CMP_GT_OS); }
   static F select(F mask, F yes, F no) { return _mm256_blendv_ps(no, yes, mask); }
   static F andNot(F mask, F v) { return _mm256_andnot_ps(mask, v); }
+  ZEL_HLS_SELECT_FORMS
   static F rcp(F x) { return _mm256_rcp_ps(x); }
   static I round(F x) { return _mm256_cvtps_epi32(x); }
   static I truncate(F x) { return _mm256_cvttps_epi32(x); }
@@ -86,12 +111,14 @@ struct Avx {
   static I join(const __m128i* parts) { return _mm256_set_m128i(parts[1], parts[0]); }
   static __m128i part(I v, int k) { return k == 0 ? _mm256_castsi256_si128(v) : _mm256_extracti128_si256(v, 1); }
   static constexpr bool kWholeFloat3 = true;
-  static void loadFloat3(const float* p, F* c) {
+  static void getFloat3(const RowStores& how, const float* p, F* c) {
     lanes::F8 c0, c1, c2;
-    lanes::loadFloat3(p, c0, c1, c2);
+    lanes::getPixels<3, false>(how, p, c0, c1, c2);
     c[0] = c0.v, c[1] = c1.v, c[2] = c2.v;
   }
-  static void storeFloat3(float* p, const F* c) { lanes::storeFloat3(p, {c[0]}, {c[1]}, {c[2]}); }
+  static void putFloat3(const RowStores& how, float* p, const F* c) {
+    lanes::putPixels<3>(how, p, {c[0]}, {c[1]}, {c[2]});
+  }
   // Eight pixels of three bytes as float lanes, and integer lanes (already
   // clamped) back to their low bytes.
   static void loadBytes3(const uint8_t* p, F* c) {
@@ -105,6 +132,84 @@ struct Avx {
 namespace avx2 {
 #include "spaces/hls_vector.inl"
 }  // namespace avx2
+
+#pragma GCC pop_options
+
+#pragma GCC push_options
+#pragma GCC target("avx2,avx512f,avx512bw,avx512vl,avx512dq")
+
+// Sixteen lanes, masks in mask registers; used by the float members with
+// three-float pixels (whole vectors in and out), where the arithmetic
+// rather than memory bounds the speed.
+struct Avx512 {
+  using F = __m512;
+  using I = __m512i;
+  using M = __mmask16;
+  static constexpr int kGroups = 4;
+  static F set(float v) { return _mm512_set1_ps(v); }
+  static F add(F a, F b) { return _mm512_add_ps(a, b); }
+  static F sub(F a, F b) { return _mm512_sub_ps(a, b); }
+  static F mul(F a, F b) { return _mm512_mul_ps(a, b); }
+  static F div(F a, F b) { return _mm512_div_ps(a, b); }
+  static F max(F a, F b) { return lanes::vmax(lanes::F16{a}, lanes::F16{b}).v; }
+  static F min(F a, F b) { return lanes::vmin(lanes::F16{a}, lanes::F16{b}).v; }
+  static M eq(F a, F b) { return _mm512_cmp_ps_mask(a, b, _CMP_EQ_OQ); }
+  static M le(F a, F b) { return _mm512_cmp_ps_mask(a, b, _CMP_LE_OS); }
+  static M lt(F a, F b) { return _mm512_cmp_ps_mask(a, b, _CMP_LT_OS); }
+  static M notLess(F a, F b) { return _mm512_cmp_ps_mask(a, b, _CMP_NLT_US); }
+  static M gt(F a, F b) { return _mm512_cmp_ps_mask(a, b, _CMP_GT_OS); }
+  static F select(M mask, F yes, F no) { return _mm512_mask_blend_ps(mask, no, yes); }
+  static F andNot(M mask, F v) { return _mm512_maskz_mov_ps(__mmask16(~mask), v); }
+  static M maskAndNot(M a, M b) { return __mmask16(b & ~a); }
+  static F addWhere(M m, F src, F a, F b) { return _mm512_mask_add_ps(src, m, a, b); }
+  static F subWhere(M m, F src, F a, F b) { return _mm512_mask_sub_ps(src, m, a, b); }
+  static F addUnless(M m, F src, F a, F b) { return _mm512_mask_add_ps(src, __mmask16(~m), a, b); }
+  static F subUnless(M m, F src, F a, F b) { return _mm512_mask_sub_ps(src, __mmask16(~m), a, b); }
+  static F divUnless(M m, F a, F b) { return _mm512_maskz_div_ps(__mmask16(~m), a, b); }
+  static F rcp(F x) { return lanes::approxRcp(lanes::F16{x}).v; }
+  static I round(F x) { return _mm512_cvtps_epi32(x); }
+  static I truncate(F x) { return _mm512_cvttps_epi32(x); }
+  static F toFloat(I v) { return _mm512_cvtepi32_ps(v); }
+  static F asFloat(I v) { return _mm512_castsi512_ps(v); }
+  static I asInt(F v) { return _mm512_castps_si512(v); }
+  static I clamp(I v, int max) {
+    return _mm512_min_epi32(_mm512_max_epi32(v, _mm512_setzero_si512()), _mm512_set1_epi32(max));
+  }
+  static I lowBits(I v, int max) { return _mm512_and_si512(v, _mm512_set1_epi32(max)); }
+  static I join(const __m128i* parts) {
+    I v = _mm512_castsi128_si512(parts[0]);
+    v = _mm512_inserti32x4(v, parts[1], 1);
+    v = _mm512_inserti32x4(v, parts[2], 2);
+    return _mm512_inserti32x4(v, parts[3], 3);
+  }
+  static __m128i part(I v, int k) {
+    switch (k) {
+      case 0: return _mm512_castsi512_si128(v);
+      case 1: return _mm512_extracti32x4_epi32(v, 1);
+      case 2: return _mm512_extracti32x4_epi32(v, 2);
+      default: return _mm512_extracti32x4_epi32(v, 3);
+    }
+  }
+  static constexpr bool kWholeFloat3 = true;
+  static void getFloat3(const RowStores& how, const float* p, F* c) {
+    lanes::F16 c0, c1, c2;
+    lanes::getPixels<3, false>(how, p, c0, c1, c2);
+    c[0] = c0.v, c[1] = c1.v, c[2] = c2.v;
+  }
+  static void putFloat3(const RowStores& how, float* p, const F* c) {
+    lanes::putPixels<3>(how, p, {c[0]}, {c[1]}, {c[2]});
+  }
+  static void loadBytes3(const uint8_t* p, F* c) {
+    lanes::I16 c0, c1, c2;
+    lanes::loadBytes3(p, c0, c1, c2);
+    c[0] = _mm512_cvtepi32_ps(c0.v), c[1] = _mm512_cvtepi32_ps(c1.v), c[2] = _mm512_cvtepi32_ps(c2.v);
+  }
+  static void storeBytes3(uint8_t* p, const I* c) { lanes::storeBytes3(p, {c[0]}, {c[1]}, {c[2]}); }
+};
+
+namespace avx512 {
+#include "spaces/hls_vector.inl"
+}  // namespace avx512
 
 #pragma GCC pop_options
 
@@ -124,14 +229,50 @@ void forwardTailPixel(const typename M::In& in, const typename M::Out& out, int 
   if constexpr (M::kCopyAlpha) out.put(x, 3, in.at(x, 3));
 }
 
+// Byte pixels of three samples on both sides take 16-lane groups where the
+// processor has them.
 template <class M>
-void forwardRow(const typename M::In& in, const typename M::Out& out, int width, bool useAvx2) {
+constexpr bool kWholeBytes =
+    std::is_same_v<typename M::In, Packed<uint8_t, 3>> && std::is_same_v<typename M::Out, Packed<uint8_t, 3>>;
+
+template <class M>
+void forwardRow(const typename M::In& in, const typename M::Out& out, int width, const RowContext& context) {
   const int body = bodyEnd(width, M::kBlock);
   int x = 0;
-  if (useAvx2) x = avx2::forwardGroups<Avx, M>(in, out, x, body);
+  if constexpr (kWholeBytes<M>)
+    if (context.widest == Lanes::Avx512) x = avx512::forwardGroups<Avx512, M>(in, out, x, body);
+  if (context.widest != Lanes::Sse4) x = avx2::forwardGroups<Avx, M>(in, out, x, body);
   x = sse41::forwardGroups<Sse, M>(in, out, x, body);
   for (; x < width; ++x) forwardTailPixel<M>(in, out, x);
 }
+
+// Three-float pixels on both sides: the 16-lane groups where the processor
+// has them, and streamed stores where the call streams. A streaming row is
+// cut at its first aligned pixel: the pixels before it go as a part of one
+// group, whole groups stream from there, and the body pixels after the
+// last whole group go as a part of one more (all body pixels, all by the
+// body recipe). `groups(lanes, x, end, how)` runs the group loop of one
+// lane set.
+template <class Groups>
+int floatBody(float* row, int body, const RowContext& context, Groups&& groups) {
+  int x = 0;
+  if (context.stream) {
+    const int group = laneCount(context.widest);
+    const int head = pixelsToAlignment(row, 12, 4 * group);
+    if (head >= 0 && head + group <= body) {
+      if (head > 0) groups(context.widest, 0, group, RowStores{RowStores::Part, head});
+      x = groups(context.widest, head, body, RowStores{RowStores::Stream, 0});
+      if (x < body) groups(context.widest, x, x + group, RowStores{RowStores::Part, body - x});
+      return body;
+    }
+  }
+  if (context.widest == Lanes::Avx512) x = groups(Lanes::Avx512, x, body, RowStores{});
+  if (context.widest != Lanes::Sse4) x = groups(Lanes::Avx2, x, body, RowStores{});
+  return groups(Lanes::Sse4, x, body, RowStores{});
+}
+
+template <class M>
+constexpr bool kWholeFloats = M::kFloat && M::In::kChannels == 3 && M::Out::kChannels == 3;
 
 template <class M>
 void inverseTailPixel(const typename M::In& in, const typename M::Out& out, int x) {
@@ -155,21 +296,37 @@ void inverseTailPixel(const typename M::In& in, const typename M::Out& out, int 
 }
 
 template <class M>
-void inverseRow(const typename M::In& in, const typename M::Out& out, int width, bool useAvx2) {
+void inverseRow(const typename M::In& in, const typename M::Out& out, int width, const RowContext& context) {
   const int body = bodyEnd(width, M::kBlock);
   int x = 0;
-  if (useAvx2) x = avx2::inverseGroups<Avx, M>(in, out, x, body);
-  x = sse41::inverseGroups<Sse, M>(in, out, x, body);
+  if constexpr (kWholeFloats<M>) {
+    x = floatBody(out.pixel(0), body, context, [&](Lanes lanes, int from, int end, RowStores how) {
+      if (lanes == Lanes::Avx512) return avx512::inverseGroups<Avx512, M>(in, out, from, end, how);
+      if (lanes == Lanes::Avx2) return avx2::inverseGroups<Avx, M>(in, out, from, end, how);
+      return sse41::inverseGroups<Sse, M>(in, out, from, end, how);
+    });
+  } else {
+    if (context.widest != Lanes::Sse4) x = avx2::inverseGroups<Avx, M>(in, out, x, body);
+    x = sse41::inverseGroups<Sse, M>(in, out, x, body);
+  }
   for (; x < width; ++x) inverseTailPixel<M>(in, out, x);
 }
 
 // Float forward conversion: one formula for every pixel, so the vector
 // groups and the last pixels agree whatever the width.
 template <int Ch>
-void forwardFloatRow(const Packed<float, Ch>& in, const Packed<float, Ch>& out, int width, bool useAvx2) {
+void forwardFloatRow(const Packed<float, Ch>& in, const Packed<float, Ch>& out, int width, const RowContext& context) {
   int x = 0;
-  if (useAvx2) x = avx2::forwardFloatGroups<Avx>(in, out, x, width);
-  x = sse41::forwardFloatGroups<Sse>(in, out, x, width);
+  if constexpr (Ch == 3) {
+    x = floatBody(out.pixel(0), width, context, [&](Lanes lanes, int from, int end, RowStores how) {
+      if (lanes == Lanes::Avx512) return avx512::forwardFloatGroups<Avx512>(in, out, from, end, how);
+      if (lanes == Lanes::Avx2) return avx2::forwardFloatGroups<Avx>(in, out, from, end, how);
+      return sse41::forwardFloatGroups<Sse>(in, out, from, end, how);
+    });
+  } else {
+    if (context.widest != Lanes::Sse4) x = avx2::forwardFloatGroups<Avx>(in, out, x, width);
+    x = sse41::forwardFloatGroups<Sse>(in, out, x, width);
+  }
   for (; x < width; ++x) {
     const HlsF v = forwardFloat(fromBits<float>(in.at(x, 0)), fromBits<float>(in.at(x, 1)),
                                 fromBits<float>(in.at(x, 2)));
@@ -181,10 +338,16 @@ void forwardFloatRow(const Packed<float, Ch>& in, const Packed<float, Ch>& out, 
 
 // ---- drivers ----
 
+// Rows share the widest lanes; float frames of three-float pixels larger
+// than the cache stream their output.
 template <class M, class Row>
 void walk(const typename M::In& in, const typename M::Out& out, ImageSize size, Row row) {
-  const bool useAvx2 = hasAvx2();
-  plainWalk(size.height, [&](int y) { row(in.rowAt(y), out.rowAt(y), size.width, useAvx2); });
+  RowContext context;
+  context.widest = widestLanes();
+  if constexpr (kWholeFloats<M>)
+    context.stream = context.widest != Lanes::Sse4 && streamsBeyondCache(int64_t(size.width) * size.height * 24);
+  plainWalk(size.height, [&](int y) { row(in.rowAt(y), out.rowAt(y), size.width, context); });
+  if (context.stream) StreamStores::fence();
 }
 
 // The RGB families count steps in whole samples: the byte step shifted
@@ -236,9 +399,9 @@ Status rgbMember(const T* src, int srcStep, T* dst, int dstStep, ImageSize size)
   using M = Member<Body, Tail, Block, Packed<T, Ch>, Packed<T, Ch>, 0, false>;
   const Packed<T, Ch> in{bytes(src), wholeSamples<T>(srcStep)}, out{bytes(dst), wholeSamples<T>(dstStep)};
   if constexpr (Forward)
-    walk<M>(in, out, size, [](const auto& i, const auto& o, int w, bool a) { forwardRow<M>(i, o, w, a); });
+    walk<M>(in, out, size, [](const auto& i, const auto& o, int w, const RowContext& c) { forwardRow<M>(i, o, w, c); });
   else
-    walk<M>(in, out, size, [](const auto& i, const auto& o, int w, bool a) { inverseRow<M>(i, o, w, a); });
+    walk<M>(in, out, size, [](const auto& i, const auto& o, int w, const RowContext& c) { inverseRow<M>(i, o, w, c); });
   return StatusOk;
 }
 
@@ -246,9 +409,10 @@ template <int Ch>
 Status rgbToHlsFloat(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
   if (!src || !dst) return StatusNullPointerError;
   if (badSize(size)) return StatusSizeError;
+  using M = Member<RgbToHls8C3, RgbToHls8C3, 1, Packed<float, Ch>, Packed<float, Ch>, 0, false>;
   const Packed<float, Ch> in{bytes(src), wholeSamples<float>(srcStep)}, out{bytes(dst), wholeSamples<float>(dstStep)};
-  const bool useAvx2 = hasAvx2();
-  for (int y = 0; y < size.height; ++y) forwardFloatRow<Ch>(in.rowAt(y), out.rowAt(y), size.width, useAvx2);
+  walk<M>(in, out, size,
+          [](const auto& i, const auto& o, int w, const RowContext& c) { forwardFloatRow<Ch>(i, o, w, c); });
   return StatusOk;
 }
 
@@ -266,9 +430,9 @@ Status bgrMember(S src, int srcStep, D dst, int dstStep, ImageSize size) {
   const auto in = sideOf<typename M::In>(src, srcStep);
   const auto out = sideOf<typename M::Out>(dst, dstStep);
   if constexpr (Forward)
-    walk<M>(in, out, size, [](const auto& i, const auto& o, int w, bool a) { forwardRow<M>(i, o, w, a); });
+    walk<M>(in, out, size, [](const auto& i, const auto& o, int w, const RowContext& c) { forwardRow<M>(i, o, w, c); });
   else
-    walk<M>(in, out, size, [](const auto& i, const auto& o, int w, bool a) { inverseRow<M>(i, o, w, a); });
+    walk<M>(in, out, size, [](const auto& i, const auto& o, int w, const RowContext& c) { inverseRow<M>(i, o, w, c); });
   return StatusOk;
 }
 

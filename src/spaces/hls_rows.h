@@ -13,6 +13,7 @@
 #include "frame/image_layout.h"
 #include "frame/lane_shuffle.h"
 #include "frame/simd.h"
+#include "spaces/float_lanes.h"
 #include "spaces/hls_formulas.h"
 
 namespace zel::hls {
@@ -49,6 +50,11 @@ struct Packed {
   int step;
   Packed rowAt(int y) const { return {zel::rowAt(base, step, y), step}; }
   T* pixel(int x) const { return reinterpret_cast<T*>(base) + x * Ch; }
+  // The source lines of `Pixels` pixels from x, some way ahead.
+  template <int Pixels>
+  void readAhead(int x) const {
+    lanes::readAhead<Pixels * Ch * int(sizeof(T))>(pixel(x));
+  }
   template <int N>
   void load(int x, __m128i* lanes) const {
     Group::template load<N>(pixel(x), lanes);
@@ -96,6 +102,10 @@ struct Planar {
     return r;
   }
   T* sample(int p, int x) const { return reinterpret_cast<T*>(base[p]) + x; }
+  template <int Pixels>
+  void readAhead(int x) const {
+    for (int p = 0; p < Planes; ++p) lanes::readAhead<Pixels * int(sizeof(T))>(sample(p, x));
+  }
   template <int N>
   void load(int x, __m128i* lanes) const {
     for (int p = 0; p < N; ++p) {

@@ -10,8 +10,8 @@ namespace zel::spaces::lab {
 
 // S, D as in forwardPixel and inversePixel (lab_formulas.h).
 template <typename S, typename D, bool Bgr>
-int forwardBlocks(Lanes lanes, const S* src, D* dst, int n);
+int forwardBlocks(Lanes lanes, const S* src, D* dst, int n, RowStores how);
 template <typename S, typename D, bool Bgr>
-int inverseBlocks(Lanes lanes, const S* src, D* dst, int n);
+int inverseBlocks(Lanes lanes, const S* src, D* dst, int n, RowStores how);
 
 }  // namespace zel::spaces::lab

@@ -15,54 +15,57 @@ namespace zel::spaces::luv {
 #include "spaces/both_widths.inc"
 
 template <bool Bgr>
-int forwardTableBlocks(Lanes lanes, const uint8_t* src, uint8_t* dst, int n) {
-  return lanes == Lanes::Avx2 ? avx2::forwardTableBlocks<lanes::F8, Bgr>(src, dst, n)
+int forwardTableBlocks(Lanes lanes, const uint8_t* src, uint8_t* dst, int n, RowStores) {
+  return lanes != Lanes::Sse4 ? avx2::forwardTableBlocks<lanes::F8, Bgr>(src, dst, n)
                               : sse::forwardTableBlocks<lanes::F4, Bgr>(src, dst, n);
 }
 template <int Stride, bool Bgr>
-int forward32fBlocks(Lanes lanes, const float* src, float* dst, int n) {
-  return lanes == Lanes::Avx2 ? avx2::forward32fBlocks<lanes::F8, Stride, Bgr>(src, dst, n)
-                              : sse::forward32fBlocks<lanes::F4, Stride, Bgr>(src, dst, n);
+int forward32fBlocks(Lanes lanes, const float* src, float* dst, int n, RowStores how) {
+  if constexpr (Stride == 3)
+    if (lanes == Lanes::Avx512) return avx512::forward32fBlocks<lanes::F16, 3, Bgr>(src, dst, n, how);
+  return lanes != Lanes::Sse4 ? avx2::forward32fBlocks<lanes::F8, Stride, Bgr>(src, dst, n, how)
+                              : sse::forward32fBlocks<lanes::F4, Stride, Bgr>(src, dst, n, how);
 }
 template <int Stride, typename T>
-int forward16Blocks(Lanes lanes, const T* src, T* dst, int n) {
-  return lanes == Lanes::Avx2 ? avx2::forward16Blocks<lanes::F8, Stride, T>(src, dst, n)
+int forward16Blocks(Lanes lanes, const T* src, T* dst, int n, RowStores) {
+  return lanes != Lanes::Sse4 ? avx2::forward16Blocks<lanes::F8, Stride, T>(src, dst, n)
                               : sse::forward16Blocks<lanes::F4, Stride, T>(src, dst, n);
 }
 template <int Stride, bool Bgr>
-int inverse8uBlocks(Lanes lanes, const uint8_t* src, uint8_t* dst, int n) {
-  return lanes == Lanes::Avx2 ? avx2::inverse8uBlocks<lanes::F8, Stride, Bgr>(src, dst, n)
+int inverse8uBlocks(Lanes lanes, const uint8_t* src, uint8_t* dst, int n, RowStores) {
+  return lanes != Lanes::Sse4 ? avx2::inverse8uBlocks<lanes::F8, Stride, Bgr>(src, dst, n)
                               : sse::inverse8uBlocks<lanes::F4, Stride, Bgr>(src, dst, n);
 }
 template <int Stride, typename T>
-int inverse16Blocks(Lanes lanes, const T* src, T* dst, int n) {
-  return lanes == Lanes::Avx2 ? avx2::inverse16Blocks<lanes::F8, Stride, T>(src, dst, n)
+int inverse16Blocks(Lanes lanes, const T* src, T* dst, int n, RowStores) {
+  return lanes != Lanes::Sse4 ? avx2::inverse16Blocks<lanes::F8, Stride, T>(src, dst, n)
                               : sse::inverse16Blocks<lanes::F4, Stride, T>(src, dst, n);
 }
 template <bool Bgr>
-int inverse32fBlocks(Lanes lanes, const float* src, float* dst, int n) {
-  return lanes == Lanes::Avx2 ? avx2::inverse32fBlocks<lanes::F8, Bgr>(src, dst, n)
-                              : sse::inverse32fBlocks<lanes::F4, Bgr>(src, dst, n);
+int inverse32fBlocks(Lanes lanes, const float* src, float* dst, int n, RowStores how) {
+  if (lanes == Lanes::Avx512) return avx512::inverse32fBlocks<lanes::F16, Bgr>(src, dst, n, how);
+  return lanes != Lanes::Sse4 ? avx2::inverse32fBlocks<lanes::F8, Bgr>(src, dst, n, how)
+                              : sse::inverse32fBlocks<lanes::F4, Bgr>(src, dst, n, how);
 }
 
-template int forwardTableBlocks<false>(Lanes, const uint8_t*, uint8_t*, int);
-template int forwardTableBlocks<true>(Lanes, const uint8_t*, uint8_t*, int);
-template int forward32fBlocks<3, false>(Lanes, const float*, float*, int);
-template int forward32fBlocks<4, false>(Lanes, const float*, float*, int);
-template int forward32fBlocks<3, true>(Lanes, const float*, float*, int);
-template int forward16Blocks<3, uint16_t>(Lanes, const uint16_t*, uint16_t*, int);
-template int forward16Blocks<4, uint16_t>(Lanes, const uint16_t*, uint16_t*, int);
-template int forward16Blocks<3, int16_t>(Lanes, const int16_t*, int16_t*, int);
-template int forward16Blocks<4, int16_t>(Lanes, const int16_t*, int16_t*, int);
-template int inverse8uBlocks<3, false>(Lanes, const uint8_t*, uint8_t*, int);
-template int inverse8uBlocks<3, true>(Lanes, const uint8_t*, uint8_t*, int);
-template int inverse8uBlocks<4, false>(Lanes, const uint8_t*, uint8_t*, int);
-template int inverse16Blocks<3, uint16_t>(Lanes, const uint16_t*, uint16_t*, int);
-template int inverse16Blocks<4, uint16_t>(Lanes, const uint16_t*, uint16_t*, int);
-template int inverse16Blocks<3, int16_t>(Lanes, const int16_t*, int16_t*, int);
-template int inverse16Blocks<4, int16_t>(Lanes, const int16_t*, int16_t*, int);
-template int inverse32fBlocks<false>(Lanes, const float*, float*, int);
-template int inverse32fBlocks<true>(Lanes, const float*, float*, int);
+template int forwardTableBlocks<false>(Lanes, const uint8_t*, uint8_t*, int, RowStores);
+template int forwardTableBlocks<true>(Lanes, const uint8_t*, uint8_t*, int, RowStores);
+template int forward32fBlocks<3, false>(Lanes, const float*, float*, int, RowStores);
+template int forward32fBlocks<4, false>(Lanes, const float*, float*, int, RowStores);
+template int forward32fBlocks<3, true>(Lanes, const float*, float*, int, RowStores);
+template int forward16Blocks<3, uint16_t>(Lanes, const uint16_t*, uint16_t*, int, RowStores);
+template int forward16Blocks<4, uint16_t>(Lanes, const uint16_t*, uint16_t*, int, RowStores);
+template int forward16Blocks<3, int16_t>(Lanes, const int16_t*, int16_t*, int, RowStores);
+template int forward16Blocks<4, int16_t>(Lanes, const int16_t*, int16_t*, int, RowStores);
+template int inverse8uBlocks<3, false>(Lanes, const uint8_t*, uint8_t*, int, RowStores);
+template int inverse8uBlocks<3, true>(Lanes, const uint8_t*, uint8_t*, int, RowStores);
+template int inverse8uBlocks<4, false>(Lanes, const uint8_t*, uint8_t*, int, RowStores);
+template int inverse16Blocks<3, uint16_t>(Lanes, const uint16_t*, uint16_t*, int, RowStores);
+template int inverse16Blocks<4, uint16_t>(Lanes, const uint16_t*, uint16_t*, int, RowStores);
+template int inverse16Blocks<3, int16_t>(Lanes, const int16_t*, int16_t*, int, RowStores);
+template int inverse16Blocks<4, int16_t>(Lanes, const int16_t*, int16_t*, int, RowStores);
+template int inverse32fBlocks<false>(Lanes, const float*, float*, int, RowStores);
+template int inverse32fBlocks<true>(Lanes, const float*, float*, int, RowStores);
 
 namespace {
 
@@ -71,47 +74,62 @@ constexpr int kBlock = 4;
 
 template <bool Bgr>
 Status forwardTable(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
-  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Bytes, [](const uint8_t* s, uint8_t* d, int w) {
-    splitRow<3, 3>(s, d, w, kBlock, forwardTableBlocks<Bgr>, forwardTablePixel<Bgr, Zone::Tail>);
-  });
+  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Bytes,
+                      [](const uint8_t* s, uint8_t* d, int w, const RowContext& c) {
+                        splitRow<3, 3>(s, d, w, kBlock, c, forwardTableBlocks<Bgr>, forwardTablePixel<Bgr, Zone::Tail>);
+                      });
 }
 
+// Float frames of three-float pixels larger than the cache stream their
+// output.
 template <int Stride, bool Bgr>
 Status forwardFloat(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
-  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Bytes, [](const float* s, float* d, int w) {
-    splitRow<Stride, Stride>(s, d, w, kBlock, forward32fBlocks<Stride, Bgr>, forward32fPixel<Bgr, Zone::Tail>);
-  });
+  constexpr Streaming kStream = Stride == 3 ? Streaming::BeyondCache : Streaming::Never;
+  return convertImage<kStream>(
+      src, srcStep, dst, dstStep, size, StepUnit::Bytes,
+      [](const float* s, float* d, int w, const RowContext& c) {
+        splitRow<Stride, Stride>(s, d, w, kBlock, c, forward32fBlocks<Stride, Bgr>, forward32fPixel<Bgr, Zone::Tail>);
+      },
+      4 * Stride, 4 * Stride);
 }
 
 // The tail of 16u AC4 truncates where the others round.
 template <int Stride, typename T>
 Status forwardWide(const T* src, int srcStep, T* dst, int dstStep, ImageSize size) {
   constexpr bool truncating = Stride == 4 && std::is_same_v<T, uint16_t>;
-  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Samples, [](const T* s, T* d, int w) {
-    splitRow<Stride, Stride>(s, d, w, kBlock, forward16Blocks<Stride, T>, forward16Pixel<T, Zone::Tail, truncating>);
-  });
+  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Samples,
+                      [](const T* s, T* d, int w, const RowContext& c) {
+                        splitRow<Stride, Stride>(s, d, w, kBlock, c, forward16Blocks<Stride, T>,
+                                                 forward16Pixel<T, Zone::Tail, truncating>);
+                      });
 }
 
 template <int Stride, bool Bgr>
 Status inverse8u(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
-  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Bytes, [](const uint8_t* s, uint8_t* d, int w) {
-    splitRow<Stride, Stride>(s, d, w, kBlock, inverse8uBlocks<Stride, Bgr>,
-                             inverse8uPixel<Bgr, Stride == 4, Zone::Tail>);
-  });
+  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Bytes,
+                      [](const uint8_t* s, uint8_t* d, int w, const RowContext& c) {
+                        splitRow<Stride, Stride>(s, d, w, kBlock, c, inverse8uBlocks<Stride, Bgr>,
+                                                 inverse8uPixel<Bgr, Stride == 4, Zone::Tail>);
+                      });
 }
 
 template <int Stride, typename T>
 Status inverseWide(const T* src, int srcStep, T* dst, int dstStep, ImageSize size) {
-  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Samples, [](const T* s, T* d, int w) {
-    splitRow<Stride, Stride>(s, d, w, kBlock, inverse16Blocks<Stride, T>, inverse16Pixel<T, Zone::Tail>);
-  });
+  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Samples,
+                      [](const T* s, T* d, int w, const RowContext& c) {
+                        splitRow<Stride, Stride>(s, d, w, kBlock, c, inverse16Blocks<Stride, T>,
+                                                 inverse16Pixel<T, Zone::Tail>);
+                      });
 }
 
 template <bool Bgr>
 Status inverseFloat(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
-  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Bytes, [](const float* s, float* d, int w) {
-    splitRow<3, 3>(s, d, w, kBlock, inverse32fBlocks<Bgr>, inverse32fPixel<Bgr, Zone::Tail>);
-  });
+  return convertImage<Streaming::BeyondCache>(
+      src, srcStep, dst, dstStep, size, StepUnit::Bytes,
+      [](const float* s, float* d, int w, const RowContext& c) {
+        splitRow<3, 3>(s, d, w, kBlock, c, inverse32fBlocks<Bgr>, inverse32fPixel<Bgr, Zone::Tail>);
+      },
+      12, 12);
 }
 
 }  // namespace
@@ -120,6 +138,7 @@ Status inverseFloat(const float* src, int srcStep, float* dst, int dstStep, Imag
 
 using namespace zel::spaces::luv;
 using zel::spaces::convertImage;
+using zel::spaces::RowContext;
 using zel::spaces::StepUnit;
 
 ZEL_PUBLIC Status zeliRGBToLUV_8u_C3R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
@@ -130,8 +149,9 @@ ZEL_PUBLIC Status zeliBGRToLUV_8u_C3R(const uint8_t* src, int srcStep, uint8_t* 
 }
 // The power form: one pixel at a time, no vector form.
 ZEL_PUBLIC Status zeliRGBToLUV_8u_AC4R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
-  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Bytes, [](const uint8_t* s, uint8_t* d, int w) {
-    for (int x = 0; x < w; ++x) forwardPowerPixel(s + 4 * x, d + 4 * x);
+  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Bytes,
+                      [](const uint8_t* s, uint8_t* d, int w, const RowContext&) {
+                        for (int x = 0; x < w; ++x) forwardPowerPixel(s + 4 * x, d + 4 * x);
   });
 }
 ZEL_PUBLIC Status zeliRGBToLUV_16u_C3R(const uint16_t* src, int srcStep, uint16_t* dst, int dstStep,
@@ -192,7 +212,8 @@ ZEL_PUBLIC Status zeliLUVToBGR_32f_C3R(const float* src, int srcStep, float* dst
 }
 // No block form; the only float member that counts its steps in samples.
 ZEL_PUBLIC Status zeliLUVToRGB_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size) {
-  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Samples, [](const float* s, float* d, int w) {
-    for (int x = 0; x < w; ++x) inverse32fPixel<false, Zone::Tail>(s + 4 * x, d + 4 * x);
+  return convertImage(src, srcStep, dst, dstStep, size, StepUnit::Samples,
+                      [](const float* s, float* d, int w, const RowContext&) {
+                        for (int x = 0; x < w; ++x) inverse32fPixel<false, Zone::Tail>(s + 4 * x, d + 4 * x);
   });
 }

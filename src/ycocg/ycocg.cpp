@@ -10,6 +10,10 @@ namespace zel::ycocg {
 namespace {
 
 bool anyNull(const void* image, const void* planes) { return !image || !planes; }
+
+VectorTier widestTier() {
+  return hasAvx512() ? VectorTier::Avx512 : (hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41);
+}
 bool badSize(ImageSize size) { return size.width < 1 || size.height < 1; }
 
 // Rows of 32-bit planes go through the vector body with non-temporal
@@ -25,16 +29,16 @@ bool streamable(const A* interleaved, B* const* planes, int width) {
 template <class Op, typename Src, int Ch, bool StreamRule>
 void forwardDriver(const Src* src, int srcStep, typename Op::Plane* const* dst, int dstStep, ImageSize size) {
   using Plane = typename Op::Plane;
-  const bool avx2 = hasAvx2();
+  const VectorTier tier = widestTier();
   bool streamed = false;
   plainWalk(size.height, [&](int y) {
     const Src* s = rowAt(src, srcStep, y);
     Plane* rows[3] = {rowAt(dst[0], dstStep, y), rowAt(dst[1], dstStep, y), rowAt(dst[2], dstStep, y)};
     if (StreamRule && streamable(s, rows, size.width)) {
-      forwardRow<Op, Src, Ch, true>(s, rows, size.width, avx2);
+      forwardRow<Op, Src, Ch, true>(s, rows, size.width, tier);
       streamed = true;
     } else {
-      forwardRow<Op, Src, Ch, false>(s, rows, size.width, avx2);
+      forwardRow<Op, Src, Ch, false>(s, rows, size.width, tier);
     }
   });
   if (streamed) _mm_sfence();
@@ -44,16 +48,16 @@ template <class Op, typename Dst, int Ch, bool StreamRule>
 void inverseDriver(const typename Op::Plane* const* src, int srcStep, Dst* dst, int dstStep, ImageSize size,
                    Dst alpha) {
   using Plane = typename Op::Plane;
-  const bool avx2 = hasAvx2();
+  const VectorTier tier = widestTier();
   bool streamed = false;
   plainWalk(size.height, [&](int y) {
     const Plane* rows[3] = {rowAt(src[0], srcStep, y), rowAt(src[1], srcStep, y), rowAt(src[2], srcStep, y)};
     Dst* d = rowAt(dst, dstStep, y);
     if (StreamRule && streamable(d, rows, size.width)) {
-      inverseRow<Op, Dst, Ch, true>(rows, d, size.width, alpha, avx2);
+      inverseRow<Op, Dst, Ch, true>(rows, d, size.width, alpha, tier);
       streamed = true;
     } else {
-      inverseRow<Op, Dst, Ch, false>(rows, d, size.width, alpha, avx2);
+      inverseRow<Op, Dst, Ch, false>(rows, d, size.width, alpha, tier);
     }
   });
   if (streamed) _mm_sfence();

@@ -1,5 +1,6 @@
-// YCoCg row kernels: blocks of 16 pixels (AVX2) or 8 pixels in 16-bit lanes
-// (32-bit lanes where the arithmetic needs them), then single pixels. Each
+// YCoCg row kernels: blocks of 32 pixels (512-bit tier), 16 pixels (AVX2)
+// or 8 pixels in 16-bit lanes (32-bit lanes where the arithmetic needs
+// them), then single pixels. Each
 // transform is a small struct with its vector block, written once for both
 // widths, and the scalar formulas of its body and tail; the row templates
 // are shared by every member.
@@ -261,6 +262,16 @@ struct BytePlanesBack {
 
 // ---- rows ----
 
+// Reading ahead: the source lines of a block some way further on are asked
+// for now, so that memory keeps pace on large frames. A prefetch is a hint
+// that neither faults nor changes a byte, so it may point past the row.
+constexpr int kReadAhead = 8192;
+template <int Bytes>
+ZEL_INLINE void readAhead(const void* p) {
+  const char* at = static_cast<const char*>(p) + kReadAhead;
+  for (int b = 0; b < Bytes; b += 64) _mm_prefetch(at + b, _MM_HINT_T0);
+}
+
 template <class U, bool Stream, typename Plane, class V>
 ZEL_INLINE void putPlane(Plane* p, V v) {
   if constexpr (sizeof(Plane) == 1)
@@ -279,6 +290,7 @@ ZEL_INLINE int forwardBlocks(const Src* src, typename Op::Plane* const* out, int
   constexpr int kWide = sizeof(typename Op::Plane) == 4 ? 2 : 1;  // vectors a plane
   for (; x + U::kPixels <= end; x += U::kPixels) {
     V e[3];
+    readAhead<U::kPixels * Ch * int(sizeof(Src))>(src + x * Ch);
     Interleaved<U, int(sizeof(Src)), Ch>::load(src + x * Ch, e);
     V res[3][2];
     Op::template block<U>(e, res);
@@ -288,8 +300,12 @@ ZEL_INLINE int forwardBlocks(const Src* src, typename Op::Plane* const* out, int
   return x;
 }
 template <class Op, typename Src, int Ch, bool Stream>
-ZEL_AVX2 __attribute__((flatten)) int forwardBlocksAvx(const Src* src, typename Op::Plane* const* out, int end) {
-  return forwardBlocks<Avx, Op, Src, Ch, Stream>(src, out, 0, end);
+ZEL_AVX2 __attribute__((flatten)) int forwardBlocksAvx(const Src* src, typename Op::Plane* const* out, int x, int end) {
+  return forwardBlocks<Avx, Op, Src, Ch, Stream>(src, out, x, end);
+}
+template <class Op, typename Src, int Ch, bool Stream>
+ZEL_AVX512 __attribute__((flatten)) int forwardBlocksAvx512(const Src* src, typename Op::Plane* const* out, int end) {
+  return forwardBlocks<Avx512, Op, Src, Ch, Stream>(src, out, 0, end);
 }
 
 // The byte-plane forward in byte lanes, 2 * U::kPixels pixels a block.
@@ -310,6 +326,7 @@ ZEL_INLINE int bytePlaneBlocks(const uint8_t* src, uint8_t* const* out, int x, i
   const V one = U::set8(1), all = U::ones();
   for (; x + kStep <= end; x += kStep) {
     V e[3];
+    readAhead<3 * kStep>(src + 3 * x);
     ByteTriples<U>::load(src + 3 * x, e);
     const V r = e[0], g = e[1], b = e[2];
     const V up = U::averageU8(r, b);
@@ -320,21 +337,27 @@ ZEL_INLINE int bytePlaneBlocks(const uint8_t* src, uint8_t* const* out, int x, i
   }
   return x;
 }
-ZEL_AVX2 __attribute__((flatten)) inline int bytePlaneBlocksAvx(const uint8_t* src, uint8_t* const* out, int end) {
-  return bytePlaneBlocks<Avx>(src, out, 0, end);
+ZEL_AVX2 __attribute__((flatten)) inline int bytePlaneBlocksAvx(const uint8_t* src, uint8_t* const* out, int x,
+                                                                 int end) {
+  return bytePlaneBlocks<Avx>(src, out, x, end);
+}
+ZEL_AVX512 __attribute__((flatten)) inline int bytePlaneBlocksAvx512(const uint8_t* src, uint8_t* const* out, int end) {
+  return bytePlaneBlocks<Avx512>(src, out, 0, end);
 }
 
 // Interleaved B, G, R (and an unused fourth element) to three planes.
 // Pixels below width & ~3 take the body formula, the rest the tail.
 template <class Op, typename Src, int Ch, bool Stream>
-void forwardRow(const Src* src, typename Op::Plane* const* out, int width, bool avx2) {
+void forwardRow(const Src* src, typename Op::Plane* const* out, int width, VectorTier tier) {
   const int blocks = width & ~7, body = width & ~3;
   int x = 0;
   if constexpr (std::is_same_v<Op, BytePlanes>) {
-    if (avx2) x = bytePlaneBlocksAvx(src, out, width);
+    if (tier == VectorTier::Avx512) x = bytePlaneBlocksAvx512(src, out, width);
+    if (tier != VectorTier::Sse41) x = bytePlaneBlocksAvx(src, out, x, width);
     x = bytePlaneBlocks<Sse>(src, out, x, width);
-  } else if (avx2) {
-    x = forwardBlocksAvx<Op, Src, Ch, Stream>(src, out, blocks);
+  } else {
+    if (tier == VectorTier::Avx512) x = forwardBlocksAvx512<Op, Src, Ch, Stream>(src, out, blocks);
+    if (tier != VectorTier::Sse41) x = forwardBlocksAvx<Op, Src, Ch, Stream>(src, out, x, blocks);
   }
   x = forwardBlocks<Sse, Op, Src, Ch, Stream>(src, out, x, blocks);
   auto write = [&](int at, const auto& v) {
@@ -352,25 +375,34 @@ ZEL_INLINE int inverseBlocks(const typename Op::Plane* const* in, Dst* dst, int 
   const V alphaLanes = U::set16(alpha);
   for (; x + U::kPixels <= end; x += U::kPixels) {
     V e[4];
+    for (int p = 0; p < 3; ++p) readAhead<U::kPixels * int(sizeof(typename Op::Plane))>(in[p] + x);
     Op::template block<U>(in, x, e);
     e[3] = alphaLanes;
+    if constexpr (!Stream) readAhead<U::kPixels * Ch * int(sizeof(Dst))>(dst + x * Ch);  // lines to be written
     Interleaved<U, int(sizeof(Dst)), Ch>::template store<Stream>(dst + x * Ch, e);
   }
   return x;
 }
 template <class Op, typename Dst, int Ch, bool Stream>
-ZEL_AVX2 __attribute__((flatten)) int inverseBlocksAvx(const typename Op::Plane* const* in, Dst* dst, int end,
+ZEL_AVX2 __attribute__((flatten)) int inverseBlocksAvx(const typename Op::Plane* const* in, Dst* dst, int x, int end,
                                                        Dst alpha) {
-  return inverseBlocks<Avx, Op, Dst, Ch, Stream>(in, dst, 0, end, alpha);
+  return inverseBlocks<Avx, Op, Dst, Ch, Stream>(in, dst, x, end, alpha);
+}
+template <class Op, typename Dst, int Ch, bool Stream>
+ZEL_AVX512 __attribute__((flatten)) int inverseBlocksAvx512(const typename Op::Plane* const* in, Dst* dst, int end,
+                                                            Dst alpha) {
+  return inverseBlocks<Avx512, Op, Dst, Ch, Stream>(in, dst, 0, end, alpha);
 }
 
 // Three planes to interleaved elements; a fourth element takes `alpha`.
 // Byte destinations clamp to 0..255 after the 16-bit sums.
 template <class Op, typename Dst, int Ch, bool Stream>
-void inverseRow(const typename Op::Plane* const* in, Dst* dst, int width, Dst alpha, bool avx2) {
+void inverseRow(const typename Op::Plane* const* in, Dst* dst, int width, Dst alpha, VectorTier tier) {
   constexpr bool kBytes = std::is_same_v<Dst, uint8_t>;
   const int blocks = width & ~7;
-  int x = avx2 ? inverseBlocksAvx<Op, Dst, Ch, Stream>(in, dst, blocks, alpha) : 0;
+  int x = 0;
+  if (tier == VectorTier::Avx512) x = inverseBlocksAvx512<Op, Dst, Ch, Stream>(in, dst, blocks, alpha);
+  if (tier != VectorTier::Sse41) x = inverseBlocksAvx<Op, Dst, Ch, Stream>(in, dst, x, blocks, alpha);
   x = inverseBlocks<Sse, Op, Dst, Ch, Stream>(in, dst, x, blocks, alpha);
   for (; x < width; ++x) {
     const Bgr<int16_t> v = Op::pixel(in[0][x], in[1][x], in[2][x]);

@@ -1,10 +1,12 @@
-// The vector operations of the YCoCg kernels at two widths:
-//   Sse  one 128-bit register, 8 pixels in 16-bit lanes;
-//   Avx  one 256-bit register, 16 pixels (lane 0 pixels 0..7, lane 1
-//        pixels 8..15), chosen at run time.
+// The vector operations of the YCoCg kernels at three widths:
+//   Sse     one 128-bit register, 8 pixels in 16-bit lanes;
+//   Avx     one 256-bit register, 16 pixels (lane 0 pixels 0..7, lane 1
+//           pixels 8..15), chosen at run time;
+//   Avx512  one 512-bit register, 32 pixels, four such lanes.
 // Lane arithmetic works within a 128-bit lane, so one kernel template gives
-// the same bits at both widths. Avx kernels are instantiated only inside a
-// ZEL_AVX2 function marked `flatten`, which pulls every operation in.
+// the same bits at every width. Avx and Avx512 kernels are instantiated
+// only inside a ZEL_AVX2 or ZEL_AVX512 function marked `flatten`, which
+// pulls every operation in.
 #pragma once
 
 #include <immintrin.h>
@@ -17,6 +19,9 @@
 // 256-bit values only pass between helpers the flattened AVX2 kernels
 // inline; none crosses a real call.
 #pragma GCC diagnostic ignored "-Wpsabi"
+// The 512-bit intrinsics start some results from an undefined vector, which
+// the compiler then reports as maybe uninitialised; nothing reads one.
+#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
 
 namespace zel::ycocg {
 
@@ -38,6 +43,15 @@ struct Sse {
   template <class G, bool Stream>
   static void put(uint8_t* p, int i, V v) {
     G::template put<Stream>(p, i, v);
+  }
+  // Every chunk of the group at p, and back.
+  template <class G>
+  static void getGroup(const uint8_t* p, V* chunks) {
+    for (int i = 0; i < G::kChunks; ++i) chunks[i] = chunk<G>(p, i);
+  }
+  template <class G, bool Stream>
+  static void putGroup(uint8_t* p, const V* chunks) {
+    for (int i = 0; i < G::kChunks; ++i) put<G, Stream>(p, i, chunks[i]);
   }
   static V mask(const ByteMask& m) { return maskOf(m); }
 
@@ -115,6 +129,14 @@ struct Avx {
     G::template put<Stream>(p, i, _mm256_castsi256_si128(v));
     G::template put<Stream>(p + G::kBytes, i, _mm256_extracti128_si256(v, 1));
   }
+  template <class G>
+  ZEL_AVX2 static void getGroup(const uint8_t* p, V* chunks) {
+    for (int i = 0; i < G::kChunks; ++i) chunks[i] = chunk<G>(p, i);
+  }
+  template <class G, bool Stream>
+  ZEL_AVX2 static void putGroup(uint8_t* p, const V* chunks) {
+    for (int i = 0; i < G::kChunks; ++i) put<G, Stream>(p, i, chunks[i]);
+  }
   ZEL_AVX2 static V mask(const ByteMask& m) { return _mm256_broadcastsi128_si256(maskOf(m)); }
 
   ZEL_AVX2 static V set16(int v) { return _mm256_set1_epi16(static_cast<int16_t>(v)); }
@@ -161,6 +183,156 @@ struct Avx {
     const V low = _mm256_set1_epi32(0xFFFF);
     const V packed = _mm256_packus_epi32(_mm256_and_si256(lo, low), _mm256_and_si256(hi, low));
     return _mm256_permute4x64_epi64(packed, 0xD8);
+  }
+};
+
+// The 512-bit tier: one register, 32 pixels (lane k pixels 8k..8k+7), the
+// same lane arithmetic. Byte layouts move whole groups with dword permutes
+// over the exact bytes of the four groups; others go lane by lane.
+struct Avx512 {
+  using V = __m512i;
+  static constexpr int kPixels = 32;
+
+  ZEL_AVX512 static V load(const void* p) { return _mm512_loadu_si512(p); }
+  ZEL_AVX512 static void store(void* p, V v) { _mm512_storeu_si512(p, v); }
+  // Rows are 16-byte aligned only: four 16-byte non-temporal stores.
+  ZEL_AVX512 static void stream(void* p, V v) {
+    auto* b = static_cast<uint8_t*>(p);
+    storeStream128(b, _mm512_castsi512_si128(v));
+    storeStream128(b + 16, _mm512_extracti32x4_epi32(v, 1));
+    storeStream128(b + 32, _mm512_extracti32x4_epi32(v, 2));
+    storeStream128(b + 48, _mm512_extracti32x4_epi32(v, 3));
+  }
+  ZEL_AVX512 static V loadBytes(const uint8_t* p) { return _mm512_cvtepu8_epi16(load256(p)); }
+  ZEL_AVX512 static void storeBytes(uint8_t* p, V v) {
+    const V packed = _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7), _mm512_packus_epi16(v, v));
+    store256(p, _mm512_castsi512_si256(packed));
+  }
+  ZEL_AVX512 static __m128i lane(V v, int k) {
+    switch (k) {
+      case 0: return _mm512_castsi512_si128(v);
+      case 1: return _mm512_extracti32x4_epi32(v, 1);
+      case 2: return _mm512_extracti32x4_epi32(v, 2);
+      default: return _mm512_extracti32x4_epi32(v, 3);
+    }
+  }
+  // Lane k takes chunk i of group k.
+  template <class G>
+  ZEL_AVX512 static V chunk(const uint8_t* p, int i) {
+    V v = _mm512_castsi128_si512(G::chunk(p, i));
+    v = _mm512_inserti32x4(v, G::chunk(p + G::kBytes, i), 1);
+    v = _mm512_inserti32x4(v, G::chunk(p + 2 * G::kBytes, i), 2);
+    return _mm512_inserti32x4(v, G::chunk(p + 3 * G::kBytes, i), 3);
+  }
+  template <class G, bool Stream>
+  ZEL_AVX512 static void put(uint8_t* p, int i, V v) {
+    for (int k = 0; k < 4; ++k) G::template put<Stream>(p + k * G::kBytes, i, lane(v, k));
+  }
+  // Dword d of the four groups' bytes for chunk i of lane k (four dwords a
+  // lane): byte groups of two chunks, whose dwords lie in two registers.
+  template <class G>
+  static constexpr bool kByteGroups = G::kChunks == 2 && G::kBytes % 8 == 0 && G::kBytes <= 32;
+  template <class G>
+  struct GroupOrder {
+    int32_t chunk[2][16];  // dword of the groups for lane dword j of chunk i
+    int32_t out[2][16];    // and back: chunk dword (chunk 1 from 16) of group dword d
+    static constexpr GroupOrder make() {
+      GroupOrder m{};
+      constexpr int words = G::kBytes / 4;  // dwords a group
+      for (int i = 0; i < 2; ++i)
+        for (int j = 0; j < 16; ++j) {
+          const int k = j / 4, w = 4 * i + j % 4;
+          m.chunk[i][j] = w < words ? k * words + w : 0;
+        }
+      for (int o = 0; o < 2; ++o)
+        for (int j = 0; j < 16; ++j) {
+          const int d = 16 * o + j, k = d / words, r = d % words;
+          m.out[o][j] = k < 4 ? (r < 4 ? 4 * k + r : 16 + 4 * k + r - 4) : 0;
+        }
+      return m;
+    }
+  };
+  template <class G>
+  static constexpr GroupOrder<G> kGroupOrder = GroupOrder<G>::make();
+  template <class G>
+  ZEL_AVX512 static __mmask16 chunkDwords(int i) {
+    // Dwords of a lane that chunk i fills (the rest read as zero).
+    const int filled = G::kBytes / 4 - 4 * i < 4 ? G::kBytes / 4 - 4 * i : 4;
+    return __mmask16(((1u << filled) - 1) * 0x1111u);
+  }
+  template <class G>
+  ZEL_AVX512 static void getGroup(const uint8_t* p, V* chunks) {
+    if constexpr (kByteGroups<G>) {
+      constexpr int words = G::kBytes;  // dwords of the four groups
+      const V a = _mm512_loadu_si512(p);
+      const V b = words == 32 ? _mm512_loadu_si512(p + 64)
+                              : _mm512_castsi256_si512(_mm256_loadu_si256(reinterpret_cast<const __m256i*>(p + 64)));
+      for (int i = 0; i < 2; ++i)
+        chunks[i] =
+            _mm512_maskz_permutex2var_epi32(chunkDwords<G>(i), a, _mm512_loadu_si512(kGroupOrder<G>.chunk[i]), b);
+    } else {
+      for (int i = 0; i < G::kChunks; ++i) chunks[i] = chunk<G>(p, i);
+    }
+  }
+  template <class G, bool Stream>
+  ZEL_AVX512 static void putGroup(uint8_t* p, const V* chunks) {
+    if constexpr (kByteGroups<G> && !Stream) {
+      constexpr int words = G::kBytes;
+      const V first = _mm512_permutex2var_epi32(chunks[0], _mm512_loadu_si512(kGroupOrder<G>.out[0]), chunks[1]);
+      const V second = _mm512_permutex2var_epi32(chunks[0], _mm512_loadu_si512(kGroupOrder<G>.out[1]), chunks[1]);
+      _mm512_storeu_si512(p, first);
+      if constexpr (words == 32) _mm512_storeu_si512(p + 64, second);
+      else _mm256_storeu_si256(reinterpret_cast<__m256i*>(p + 64), _mm512_castsi512_si256(second));
+    } else {
+      for (int i = 0; i < G::kChunks; ++i) put<G, Stream>(p, i, chunks[i]);
+    }
+  }
+  ZEL_AVX512 static V mask(const ByteMask& m) { return _mm512_broadcast_i32x4(maskOf(m)); }
+
+  ZEL_AVX512 static V set16(int v) { return _mm512_set1_epi16(static_cast<int16_t>(v)); }
+  ZEL_AVX512 static V set32(int32_t v) { return _mm512_set1_epi32(v); }
+  ZEL_AVX512 static V ones() { return _mm512_set1_epi32(-1); }
+  ZEL_AVX512 static V add16(V a, V b) { return _mm512_add_epi16(a, b); }
+  ZEL_AVX512 static V sub16(V a, V b) { return _mm512_sub_epi16(a, b); }
+  ZEL_AVX512 static V addSatS16(V a, V b) { return _mm512_adds_epi16(a, b); }
+  template <int N>
+  ZEL_AVX512 static V sra16(V a) {
+    return _mm512_srai_epi16(a, N);
+  }
+  ZEL_AVX512 static V add32(V a, V b) { return _mm512_add_epi32(a, b); }
+  ZEL_AVX512 static V sub32(V a, V b) { return _mm512_sub_epi32(a, b); }
+  template <int N>
+  ZEL_AVX512 static V sra32(V a) {
+    return _mm512_srai_epi32(a, N);
+  }
+  ZEL_AVX512 static V and_(V a, V b) { return _mm512_and_si512(a, b); }
+  ZEL_AVX512 static V or_(V a, V b) { return _mm512_or_si512(a, b); }
+  ZEL_AVX512 static V xor_(V a, V b) { return _mm512_xor_si512(a, b); }
+  ZEL_AVX512 static V shuffle8(V a, V m) { return _mm512_shuffle_epi8(a, m); }
+  template <int Imm>
+  ZEL_AVX512 static V blend16(V a, V b) {
+    return _mm512_mask_blend_epi16(__mmask32(uint32_t(Imm & 0xFF) * 0x01010101u), a, b);
+  }
+  ZEL_AVX512 static V packU8(V a, V b) { return _mm512_packus_epi16(a, b); }
+  ZEL_AVX512 static V set8(int v) { return _mm512_set1_epi8(static_cast<int8_t>(v)); }
+  ZEL_AVX512 static V sub8(V a, V b) { return _mm512_sub_epi8(a, b); }
+  ZEL_AVX512 static V addSatU8(V a, V b) { return _mm512_adds_epu8(a, b); }
+  ZEL_AVX512 static V averageU8(V a, V b) { return _mm512_avg_epu8(a, b); }
+  ZEL_AVX512 static V blend8(V a, V b, V m) { return _mm512_mask_blend_epi8(_mm512_movepi8_mask(m), a, b); }
+  ZEL_AVX512 static V unpackLo8(V a, V b) { return _mm512_unpacklo_epi8(a, b); }
+  ZEL_AVX512 static V unpackHi8(V a, V b) { return _mm512_unpackhi_epi8(a, b); }
+  ZEL_AVX512 static V unpackLo16(V a, V b) { return _mm512_unpacklo_epi16(a, b); }
+  ZEL_AVX512 static V unpackHi16(V a, V b) { return _mm512_unpackhi_epi16(a, b); }
+  ZEL_AVX512 static V unpackLo32(V a, V b) { return _mm512_unpacklo_epi32(a, b); }
+  ZEL_AVX512 static V unpackHi32(V a, V b) { return _mm512_unpackhi_epi32(a, b); }
+  ZEL_AVX512 static V unpackLo64(V a, V b) { return _mm512_unpacklo_epi64(a, b); }
+  ZEL_AVX512 static V unpackHi64(V a, V b) { return _mm512_unpackhi_epi64(a, b); }
+  ZEL_AVX512 static V widenLo(V v) { return _mm512_cvtepi16_epi32(_mm512_castsi512_si256(v)); }
+  ZEL_AVX512 static V widenHi(V v) { return _mm512_cvtepi16_epi32(_mm512_extracti64x4_epi64(v, 1)); }
+  ZEL_AVX512 static V narrowLow(V lo, V hi) {
+    const V low = _mm512_set1_epi32(0xFFFF);
+    const V packed = _mm512_packus_epi32(_mm512_and_si512(lo, low), _mm512_and_si512(hi, low));
+    return _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7), packed);
   }
 };
 
@@ -282,7 +454,7 @@ struct Interleaved {
   ZEL_INLINE static void load(const void* src, V* lanes) {
     const uint8_t* p = static_cast<const uint8_t*>(src);
     V raw[G::kChunks];
-    for (int i = 0; i < G::kChunks; ++i) raw[i] = U::template chunk<G>(p, i);
+    U::template getGroup<G>(p, raw);
     if constexpr (E == 2 && Ch == 3) {
       lanes[0] = collectWords<0>(raw);
       lanes[1] = collectWords<1>(raw);
@@ -326,13 +498,13 @@ struct Interleaved {
     uint8_t* p = static_cast<uint8_t*>(dst);
     if constexpr (E == 1 && Ch == 3) {
       const V first = U::packU8(lanes[0], lanes[1]), second = U::packU8(lanes[2], lanes[2]);
-      U::template put<G, Stream>(p, 0, mergePacked<0>(first, second));
-      U::template put<G, Stream>(p, 1, mergePacked<1>(first, second));
+      const V chunks[2] = {mergePacked<0>(first, second), mergePacked<1>(first, second)};
+      U::template putGroup<G, Stream>(p, chunks);
     } else if constexpr (E == 1 && Ch == 4) {
       const V evens = U::packU8(lanes[0], lanes[2]), odds = U::packU8(lanes[1], lanes[3]);
       const V x = U::unpackLo8(evens, odds), y = U::unpackHi8(evens, odds);
-      U::template put<G, Stream>(p, 0, U::unpackLo16(x, y));
-      U::template put<G, Stream>(p, 1, U::unpackHi16(x, y));
+      const V chunks[2] = {U::unpackLo16(x, y), U::unpackHi16(x, y)};
+      U::template putGroup<G, Stream>(p, chunks);
     } else if constexpr (E == 2 && Ch == 3) {
       const V spread[3] = {spreadWords<0>(lanes), spreadWords<1>(lanes), spreadWords<2>(lanes)};
       U::template put<G, Stream>(p, 0, mergeWords<0>(spread));

@@ -61,15 +61,37 @@ TEST(BgrToHls, BlocksAndTailAtEveryWidth) {
   checkMember<BgrToHls8, uint8_t>("P3", planesToPlanes(zeliBGRToHLS_8u_P3R), {true, 3, true, 3, 2, false});
 }
 
+void expectedFloat(const ChannelImage<float>& src, int x, int y, bool, float* out) {
+  const HlsF v = forwardFloat(src.get(x, y, 0), src.get(x, y, 1), src.get(x, y, 2));
+  out[0] = v.h, out[1] = v.l, out[2] = v.s;
+}
+
 TEST(RgbToHls, FloatPixelsByTheFloatFormula) {
   // One form for every pixel: no blocks.
   for (int ch : {3, 4})
     checkEveryWidth<float>("32f", packed(ch == 3 ? zeliRGBToHLS_32f_C3R : zeliRGBToHLS_32f_AC4R),
-                           {false, ch, false, ch, 0, false}, 1, false,
-                           [](const ChannelImage<float>& src, int x, int y, bool, float* out) {
-                             const HlsF v = forwardFloat(src.get(x, y, 0), src.get(x, y, 1), src.get(x, y, 2));
-                             out[0] = v.h, out[1] = v.l, out[2] = v.s;
-                           });
+                           {false, ch, false, ch, 0, false}, 1, false, expectedFloat);
+}
+
+TEST(RgbToHls, ByteGroupsOfEveryTier) {
+  // 8-pixel blocks taken 8 or 16 at a time, or 4 and 4: the same recipe.
+  atEveryTier([&] {
+    checkEveryWidth<uint8_t>("8u C3", packed(zeliRGBToHLS_8u_C3R), {false, 3, false, 3, 0, false}, 8, false,
+                             [](const ChannelImage<uint8_t>& src, int x, int y, bool body, uint8_t* out) {
+                               expectedForward<RgbToHls8C3, uint8_t>(src, x, y, 0, body, out);
+                             },
+                             {129, 150, 203});
+  });
+}
+
+TEST(RgbToHls, FloatGroupsOfEveryTierAndStreamedRows) {
+  // Groups of 4, 8 and 16 pixels, widths past a few 16-pixel groups, and
+  // rows streamed past the cache from their first aligned pixel.
+  const Shape c3{false, 3, false, 3, 0, false};
+  atEveryTier([&] {
+    checkEveryWidth<float>("32f C3", packed(zeliRGBToHLS_32f_C3R), c3, 1, false, expectedFloat, {129, 150, 203});
+    checkStreamedFrames<float>("32f C3", packed(zeliRGBToHLS_32f_C3R), c3, 1, false, expectedFloat);
+  });
 }
 
 // ---- the formulas against the colour model ----

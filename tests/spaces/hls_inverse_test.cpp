@@ -62,6 +62,20 @@ TEST(HlsToRgb, BlocksAndTailAtEveryWidth) {
   checkMember<HlsToRgbFloatBody, HlsToRgbFloatTail, 4, float>("32f AC4", packed(zeliHLSToRGB_32f_AC4R), ac4);
 }
 
+TEST(HlsToRgb, FloatGroupsOfEveryTierAndStreamedRows) {
+  // The block recipe in groups of 4, 8 and 16 pixels (widths past a few
+  // 16-pixel groups), the tail recipe in the last width & 3 pixels; rows
+  // streamed past the cache keep both.
+  const Shape c3{false, 3, false, 3, 0, false};
+  auto expect = [](const ChannelImage<float>& src, int x, int y, bool body, float* out) {
+    expectedInverse<HlsToRgbFloatBody, HlsToRgbFloatTail, float>(src, x, y, 0, body, out);
+  };
+  atEveryTier([&] {
+    checkEveryWidth<float>("32f C3", packed(zeliHLSToRGB_32f_C3R), c3, 4, true, expect, {129, 150, 203});
+    checkStreamedFrames<float>("32f C3", packed(zeliHLSToRGB_32f_C3R), c3, 4, true, expect);
+  });
+}
+
 TEST(HlsToBgr, BlocksAndTailAtEveryWidth) {
   using B = HlsToBgr8Body;
   using T = HlsToBgr8Tail;

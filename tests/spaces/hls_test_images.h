@@ -12,8 +12,11 @@
 #include <gtest/gtest.h>
 #include <memory>
 #include <random>
+#include <string>
 #include <vector>
 
+#include "core/zelcore.h"
+#include "frame/simd.h"
 #include "support/test_image.h"
 #include "zelcc/zelcc.h"
 
@@ -182,42 +185,91 @@ inline Call<uint8_t> planesToPlanes(Status (*fn)(const uint8_t* const*, int, uin
 }
 
 
-// Every width from 1 to 70 at aligned and odd placements: `expect` gives
-// the three colour channels of a pixel in destination memory order, by the
-// block formula below the body end and the tail formula past it. A fourth
-// channel is copied or keeps its value; nothing outside the rows changes.
+// One frame: `expect` gives the three colour channels of a pixel in
+// destination memory order, by the block formula below the body end and
+// the tail formula past it. A fourth channel is copied or keeps its value;
+// nothing outside the rows changes.
 template <typename T, typename Expect>
-void checkEveryWidth(const char* name, Call<T> call, Shape shape, int block, bool hlsSource, Expect expect) {
+void checkFrame(Call<T> call, Shape shape, int block, bool hlsSource, Expect expect, int width, int height,
+                Layout src, Layout dst, const std::string& where) {
+  // Byte rows take odd paddings; wider samples whole ones, as their steps
+  // count whole samples.
+  auto padOf = [](int pad) { return sizeof(T) == 1 ? pad + 1 : pad * int(sizeof(T)) / 2; };
+  ChannelImage<T> in(shape.srcPlanar, shape.srcChannels, width, height, src.offset, padOf(src.pad));
+  ChannelImage<T> out(shape.dstPlanar, shape.dstChannels, width, height, dst.offset, padOf(dst.pad));
+  if (hlsSource) fillHls(in, uint32_t(width * 31 + src.offset));
+  else fillColours(in, uint32_t(width * 31 + src.offset));
+  fillColours(out, uint32_t(width * 17 + 1));
+  const std::vector<T> alphaBefore = fourthChannel(out);
+  ASSERT_EQ(call(in, out, ImageSize{width, height}), StatusOk);
+  const int bodyEnd = width & ~(block - 1);
+  for (int y = 0; y < height; ++y)
+    for (int x = 0; x < width; ++x) {
+      T want[3];
+      expect(in, x, y, x < bodyEnd, want);
+      for (int c = 0; c < 3; ++c)
+        ASSERT_EQ(bits(out.get(x, y, c)), bits(want[c]))
+            << "channel " << c << " of pixel " << x << ", row " << y << ", " << where
+            << (x < bodyEnd ? " (block)" : " (tail)");
+      if (shape.dstChannels == 4)
+        ASSERT_EQ(bits(out.get(x, y, 3)), bits(shape.copyAlpha ? in.get(x, y, 3) : alphaBefore[y * width + x]))
+            << "fourth channel of pixel " << x << ", " << where;
+    }
+  ASSERT_TRUE(out.guardsIntact()) << where;
+}
+
+// Every width from 1 to 70 (and `more`) at aligned and odd placements.
+template <typename T, typename Expect>
+void checkEveryWidth(const char* name, Call<T> call, Shape shape, int block, bool hlsSource, Expect expect,
+                     std::initializer_list<int> more = {}) {
   SCOPED_TRACE(name);
   const Layout layouts[] = {{0, 0}, {1, 6}, {3, 2}, {2, 10}, {16, 4}};
-  for (int width = 1; width <= 70; ++width)
+  std::vector<int> widths;
+  for (int width = 1; width <= 70; ++width) widths.push_back(width);
+  widths.insert(widths.end(), more.begin(), more.end());
+  for (int width : widths)
     for (const Layout& l : layouts) {
-      const int height = 2;
-      // Byte rows take odd paddings; wider samples whole ones, as their
-      // steps count whole samples.
-      const int pad = sizeof(T) == 1 ? l.pad + 1 : l.pad * int(sizeof(T)) / 2;
-      ChannelImage<T> src(shape.srcPlanar, shape.srcChannels, width, height, l.offset, pad);
-      ChannelImage<T> dst(shape.dstPlanar, shape.dstChannels, width, height, l.offset + 5, pad);
-      if (hlsSource) fillHls(src, uint32_t(width * 31 + l.offset));
-      else fillColours(src, uint32_t(width * 31 + l.offset));
-      fillColours(dst, uint32_t(width * 17 + 1));
-      const std::vector<T> alphaBefore = fourthChannel(dst);
-      ASSERT_EQ(call(src, dst, ImageSize{width, height}), StatusOk);
-      const int bodyEnd = width & ~(block - 1);
-      for (int y = 0; y < height; ++y)
-        for (int x = 0; x < width; ++x) {
-          T want[3];
-          expect(src, x, y, x < bodyEnd, want);
-          for (int c = 0; c < 3; ++c)
-            ASSERT_EQ(bits(dst.get(x, y, c)), bits(want[c]))
-                << "channel " << c << " of pixel " << x << ", width " << width << ", offset " << l.offset
-                << (x < bodyEnd ? " (block)" : " (tail)");
-          if (shape.dstChannels == 4)
-            ASSERT_EQ(bits(dst.get(x, y, 3)), bits(shape.copyAlpha ? src.get(x, y, 3) : alphaBefore[y * width + x]))
-                << "fourth channel of pixel " << x << ", width " << width;
-        }
-      ASSERT_TRUE(dst.guardsIntact()) << width;
+      checkFrame<T>(call, shape, block, hlsSource, expect, width, 2, l, Layout{l.offset + 5, l.pad},
+                    "width " + std::to_string(width) + ", offset " + std::to_string(l.offset));
+      if (::testing::Test::HasFatalFailure()) return;
     }
+}
+
+// Frames of more than a mebibyte with the cache said to be one, so that a
+// member that streams does: destinations at float offsets from a 64-byte
+// boundary (every row of an odd width starts elsewhere) and one off the
+// float grid.
+template <typename T, typename Expect>
+void checkStreamedFrames(const char* name, Call<T> call, Shape shape, int block, bool hlsSource, Expect expect) {
+  SCOPED_TRACE(name);
+  zelTestOverrideCacheSize(0, 1 << 20);
+  for (int width : {45, 203}) {
+    const int height = (1 << 20) / (width * 24) + 2;
+    for (int offset : {0, 4, 20, 36, 52, 2}) {
+      checkFrame<T>(call, shape, block, hlsSource, expect, width, height, Layout{8, 0}, Layout{offset, 0},
+                    "width " + std::to_string(width) + ", streamed to offset " + std::to_string(offset));
+      if (::testing::Test::HasFatalFailure()) break;
+    }
+  }
+  zelTestOverrideCacheSize(-1, 0);
+}
+
+// Runs `check` once at every vector tier the processor has, up to the cap
+// in force (a run held to the 256-bit tier stays there).
+template <typename Check>
+void atEveryTier(Check&& check) {
+  const VectorTier before = vectorTierCap();
+  std::vector<VectorTier> tiers;
+  if (hasAvx512()) tiers.push_back(VectorTier::Avx512);
+  if (hasAvx2()) tiers.push_back(VectorTier::Avx2);
+  tiers.push_back(VectorTier::Sse41);
+  for (VectorTier tier : tiers) {
+    SCOPED_TRACE("tier " + std::to_string(int(tier)));
+    setVectorTierCap(tier);
+    check();
+    if (::testing::Test::HasFatalFailure()) break;
+  }
+  setVectorTierCap(before);
 }
 
 }  // namespace zel::test

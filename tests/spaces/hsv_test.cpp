@@ -164,16 +164,24 @@ TEST(HsvMembers, FollowTheirFormulasInEveryZone) {
   const auto inverse8 = levelsPixel<uint8_t, hsvToRgb8u>;
   const auto inverse16 = levelsPixel<uint16_t, hsvToRgb16u>;
   zel::test::expectMembers<uint8_t, uint8_t>({
-      M8("RGBToHSV_8u_C3", zeliRGBToHSV_8u_C3R).zones(4, rgbToHsvBlocks8u<3>, forwardBody, forwardTail).samples(tiedByte),
+      M8("RGBToHSV_8u_C3", zeliRGBToHSV_8u_C3R)
+          .zones(4, rgbToHsvBlocks8u<3>, forwardBody, forwardTail)
+          .samples(tiedByte)
+          .lanes16(),
       M8("RGBToHSV_8u_AC4", zeliRGBToHSV_8u_AC4R)
           .stride(4)
           .zones(4, rgbToHsvBlocks8u<4>, forwardBody, forwardTail)
-          .samples(tiedByte),
-      M8("HSVToRGB_8u_C3", zeliHSVToRGB_8u_C3R).zones(4, hsvToRgbBlocks<3, uint8_t>, inverse8, inverse8).samples(hsvByte),
+          .samples(tiedByte)
+          .lanes16(),
+      M8("HSVToRGB_8u_C3", zeliHSVToRGB_8u_C3R)
+          .zones(4, hsvToRgbBlocks<3, uint8_t>, inverse8, inverse8)
+          .samples(hsvByte)
+          .lanes16(),
       M8("HSVToRGB_8u_AC4", zeliHSVToRGB_8u_AC4R)
           .stride(4)
           .zones(4, hsvToRgbBlocks<4, uint8_t>, inverse8, inverse8)
-          .samples(hsvByte),
+          .samples(hsvByte)
+          .lanes16(),
   });
   zel::test::expectMembers<uint16_t, uint16_t>({
       M16("RGBToHSV_16u_C3", zeliRGBToHSV_16u_C3R)

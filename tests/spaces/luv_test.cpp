@@ -273,15 +273,20 @@ TEST(LuvMembers, FollowTheirFormulasInEveryZone) {
       inverseWide<int16_t, 4>("LUVToRGB_16s_AC4", zeliLUVToRGB_16s_AC4R),
   });
   zel::test::expectMembers<float, float>({
-      forwardFloat<3, false>("RGBToLUV_32f_C3", zeliRGBToLUV_32f_C3R),
+      // Three-float members: 16-lane bodies, streamed beyond the cache.
+      forwardFloat<3, false>("RGBToLUV_32f_C3", zeliRGBToLUV_32f_C3R).lanes16().streamed(),
       forwardFloat<4, false>("RGBToLUV_32f_AC4", zeliRGBToLUV_32f_AC4R),
-      forwardFloat<3, true>("BGRToLUV_32f_C3", zeliBGRToLUV_32f_C3R),
+      forwardFloat<3, true>("BGRToLUV_32f_C3", zeliBGRToLUV_32f_C3R).lanes16().streamed(),
       M32("LUVToRGB_32f_C3", zeliLUVToRGB_32f_C3R)
           .zones(4, inverse32fBlocks<false>, inverse32fPixel<false, Zone::Body>, inverse32fPixel<false, Zone::Tail>)
-          .samples(luvFloat),
+          .samples(luvFloat)
+          .lanes16()
+          .streamed(),
       M32("LUVToBGR_32f_C3", zeliLUVToBGR_32f_C3R)
           .zones(4, inverse32fBlocks<true>, inverse32fPixel<true, Zone::Body>, inverse32fPixel<true, Zone::Tail>)
-          .samples(luvFloat),
+          .samples(luvFloat)
+          .lanes16()
+          .streamed(),
       M32("LUVToRGB_32f_AC4", zeliLUVToRGB_32f_AC4R)
           .stride(4)
           .oneFormula(inverse32fPixel<false, Zone::Tail>)

@@ -11,6 +11,7 @@
 #include <string>
 #include <vector>
 
+#include "core/zelcore.h"
 #include "spaces/space_frame.h"
 #include "support/test_image.h"
 #include "zelcc/zelcc.h"
@@ -18,6 +19,7 @@
 namespace zel::test {
 
 using spaces::Lanes;
+using spaces::RowStores;
 using spaces::StepUnit;
 
 // One export: its formulas by zone, its vector body, how it counts steps
@@ -25,7 +27,7 @@ using spaces::StepUnit;
 template <typename S, typename D>
 struct Member {
   using Export = Status (*)(const S*, int, D*, int, ImageSize);
-  using Blocks = int (*)(Lanes, const S*, D*, int);
+  using Blocks = int (*)(Lanes, const S*, D*, int, RowStores);
   using Pixel = std::function<void(const S* in, D* out)>;  // writes the 3 samples of a pixel
   std::string name;
   Export fn = nullptr;
@@ -37,6 +39,8 @@ struct Member {
   Pixel body, tail;
   StepUnit unit = StepUnit::Bytes;
   std::function<S(std::mt19937&)> sample;  // random bits (or 0..1 floats) when empty
+  int widest = 8;        // lanes of the widest body (16 with a 512-bit one)
+  bool streams = false;  // float rows stream their body beyond the cache
 
   Member(std::string n, Export f) : name(std::move(n)), fn(f) {}
   Member& stride(int s) { srcStride = dstStride = s; return *this; }
@@ -50,6 +54,14 @@ struct Member {
   }
   Member& stepsInSamples() {
     unit = StepUnit::Samples;
+    return *this;
+  }
+  Member& lanes16() {
+    widest = 16;
+    return *this;
+  }
+  Member& streamed() {
+    streams = true;
     return *this;
   }
   Member& samples(std::function<S(std::mt19937&)> g) {
@@ -130,71 +142,150 @@ void expectSameRows(const Member<S, D>& m, const std::vector<D>& want, const Tes
       }
 }
 
-// Widths 1..70 at several alignments and paddings: every pixel as its zone's
-// formula says, nothing outside the rows written, the source unchanged.
+// One frame through the export: every pixel as its zone's formula says,
+// nothing outside the rows written, the source unchanged.
 template <typename S, typename D>
-void expectExportFollowsFormulas(const Member<S, D>& m, uint32_t seed = 1) {
+void expectFrameFollowsFormulas(const Member<S, D>& m, int width, int height, int srcOffset, int dstOffset, int pad,
+                                uint32_t seed, const std::string& where) {
   // A member counting steps in samples needs whole-sample padding.
   const int padUnit = m.unit == StepUnit::Samples ? int(sizeof(S) > sizeof(D) ? sizeof(S) : sizeof(D)) : 1;
+  TestImage<S> src(width * m.srcStride, height, srcOffset, pad * padUnit + padUnit);
+  TestImage<D> dst(width * m.dstStride, height, dstOffset, pad * padUnit);
+  fillSource(src, m, seed);
+  {
+    std::mt19937 rng{uint32_t(width) + 5};
+    for (int y = 0; y < height; ++y)
+      for (int i = 0; i < width * m.dstStride; ++i) dst.set(i, y, D(rng()));
+  }
+  std::vector<S> srcCopy;
+  for (int y = 0; y < height; ++y)
+    for (int i = 0; i < width * m.srcStride; ++i) srcCopy.push_back(src.get(i, y));
+  const std::vector<D> want = expectedRows(m, src, dst, width);
+  ASSERT_EQ(m.fn(src.data(), src.step(), dst.data(), dst.step(), ImageSize{width, height}), StatusOk) << where;
+  expectSameRows(m, want, dst, width, where);
+  EXPECT_TRUE(dst.guardsIntact()) << m.name << " " << where << ": a byte outside the rows changed";
+  for (int y = 0; y < height; ++y)
+    for (int i = 0; i < width * m.srcStride; ++i)
+      ASSERT_TRUE(sameBits(src.get(i, y), srcCopy[size_t(y) * width * m.srcStride + i]))
+          << m.name << ": source written";
+}
+
+// Widths 1..70 at several alignments and paddings.
+template <typename S, typename D>
+void expectExportFollowsFormulas(const Member<S, D>& m, uint32_t seed = 1) {
   for (int width = 1; width <= 70; ++width)
     for (int variant = 0; variant < 2; ++variant) {
       const int srcOffset = variant ? 3 : 0, dstOffset = variant ? 1 + int(sizeof(D)) : 0;
-      const int pad = variant ? 3 * padUnit : 0;
-      const int height = 3;
-      TestImage<S> src(width * m.srcStride, height, srcOffset, pad + padUnit);
-      TestImage<D> dst(width * m.dstStride, height, dstOffset, pad);
-      fillSource(src, m, seed + uint32_t(width) * 977u + uint32_t(variant));
-      {
-        std::mt19937 rng{uint32_t(width) + 5};
-        for (int y = 0; y < height; ++y)
-          for (int i = 0; i < width * m.dstStride; ++i) dst.set(i, y, D(rng()));
-      }
-      std::vector<S> srcCopy;
-      for (int y = 0; y < height; ++y)
-        for (int i = 0; i < width * m.srcStride; ++i) srcCopy.push_back(src.get(i, y));
-      const std::vector<D> want = expectedRows(m, src, dst, width);
-      const std::string where = "width " + std::to_string(width) + (variant ? " misaligned" : "");
-      ASSERT_EQ(m.fn(src.data(), src.step(), dst.data(), dst.step(), ImageSize{width, height}), StatusOk) << where;
-      expectSameRows(m, want, dst, width, where);
-      EXPECT_TRUE(dst.guardsIntact()) << m.name << " " << where << ": a byte outside the rows changed";
-      for (int y = 0; y < height; ++y)
-        for (int i = 0; i < width * m.srcStride; ++i)
-          ASSERT_TRUE(sameBits(src.get(i, y), srcCopy[size_t(y) * width * m.srcStride + i])) << m.name << ": source written";
+      expectFrameFollowsFormulas(m, width, 3, srcOffset, dstOffset, variant ? 3 : 0,
+                                 seed + uint32_t(width) * 977u + uint32_t(variant),
+                                 "width " + std::to_string(width) + (variant ? " misaligned" : ""));
       if (::testing::Test::HasFailure()) return;
     }
 }
 
-// A vector body alone, both lane widths, at odd alignments: each converted
-// pixel equals the body formula, and nothing past the converted pixels moves.
+// The vector tiers a test can take on this processor, widest first.
+inline std::vector<VectorTier> availableTiers() {
+  std::vector<VectorTier> tiers;
+  if (hasAvx512()) tiers.push_back(VectorTier::Avx512);
+  if (hasAvx2()) tiers.push_back(VectorTier::Avx2);
+  tiers.push_back(VectorTier::Sse41);
+  return tiers;
+}
+
+// Sets the tier cap for one scope, and the cache size the streaming
+// decision reads (a small one makes a modest frame stream).
+class TierScope {
+ public:
+  explicit TierScope(VectorTier tier) : before_(vectorTierCap()) { setVectorTierCap(tier); }
+  ~TierScope() { setVectorTierCap(before_); }
+
+ private:
+  VectorTier before_;
+};
+class CacheScope {
+ public:
+  explicit CacheScope(int bytes) { zelTestOverrideCacheSize(0, bytes); }
+  ~CacheScope() { zelTestOverrideCacheSize(-1, 0); }
+};
+
+// A member that streams: frames of more than a mebibyte with the cache
+// said to be one, at every tier, with destinations at every float offset
+// from a 64-byte boundary (and one off the float grid, which cannot
+// stream): the heads before the first aligned pixel, the streamed blocks
+// and the rest of each row all follow the formulas.
+template <typename S, typename D>
+void expectStreamedFramesFollowFormulas(const Member<S, D>& m) {
+  const CacheScope cache(1 << 20);
+  for (VectorTier tier : availableTiers()) {
+    const TierScope scope(tier);
+    for (int width : {45, 203}) {
+      const int pixelBytes = m.srcStride * int(sizeof(S)) + m.dstStride * int(sizeof(D));
+      const int height = (1 << 20) / (width * pixelBytes) + 2;
+      for (int dstOffset : {0, 4, 20, 36, 52, 2}) {
+        const std::string where = "tier " + std::to_string(int(tier)) + " width " + std::to_string(width) +
+                                  " offset " + std::to_string(dstOffset) + " streamed";
+        expectFrameFollowsFormulas(m, width, height, 8, dstOffset, 0, uint32_t(width + dstOffset), where);
+        if (::testing::Test::HasFailure()) return;
+      }
+    }
+  }
+}
+
+// A vector body alone, every lane width, at odd alignments: each converted
+// pixel equals the body formula, and nothing past the converted pixels
+// moves. Streaming bodies also store a streamed run (the destination
+// aligned) and a head of each length.
+template <typename S, typename D>
+void expectBlocksRun(const Member<S, D>& m, Lanes lanes, int n, int dstOffset, RowStores how, int expectDone,
+                     uint32_t seed, const std::string& where) {
+  TestImage<S> src(n * m.srcStride, 1, 1 + n % 7, 0);
+  TestImage<D> dst(n * m.dstStride, 1, dstOffset, 0);
+  fillSource(src, m, seed);
+  std::mt19937 rng{uint32_t(n)};
+  for (int i = 0; i < n * m.dstStride; ++i) dst.set(i, 0, D(rng()));
+  std::vector<D> want(size_t(n) * m.dstStride);
+  for (int i = 0; i < int(want.size()); ++i) want[i] = dst.get(i, 0);
+  const int done = m.blocks(lanes, src.data(), dst.data(), n, how);
+  ASSERT_EQ(done, expectDone) << m.name << " " << where;
+  const int written = how.kind == RowStores::Part ? how.keep : done;
+  for (int x = 0; x < written; ++x) {
+    S in[8];
+    for (int c = 0; c < m.srcStride; ++c) in[c] = src.get(x * m.srcStride + c, 0);
+    m.body(in, &want[size_t(x) * m.dstStride]);
+  }
+  for (int i = 0; i < n * m.dstStride; ++i)
+    if (!sameBits(want[i], dst.get(i, 0))) {
+      ADD_FAILURE() << m.name << " " << where << ": pixel " << i / m.dstStride << " sample " << i % m.dstStride
+                    << " is " << +dst.get(i, 0) << ", body formula gives " << +want[i];
+      return;
+    }
+  ASSERT_TRUE(dst.guardsIntact()) << m.name << " " << where;
+}
+
 template <typename S, typename D>
 void expectBlocksFollowBody(const Member<S, D>& m, uint32_t seed = 7) {
-  for (Lanes lanes : {Lanes::Sse4, Lanes::Avx2}) {
+  for (Lanes lanes : {Lanes::Sse4, Lanes::Avx2, Lanes::Avx512}) {
     if (lanes == Lanes::Avx2 && !hasAvx2()) continue;
-    const int laneCount = lanes == Lanes::Avx2 ? 8 : 4;
-    for (int n = 1; n <= 70; ++n) {
-      TestImage<S> src(n * m.srcStride, 1, 1 + n % 7, 0);
-      TestImage<D> dst(n * m.dstStride, 1, 3 + n % 5, 0);
-      fillSource(src, m, seed + uint32_t(n) * 31u);
-      std::mt19937 rng{uint32_t(n)};
-      for (int i = 0; i < n * m.dstStride; ++i) dst.set(i, 0, D(rng()));
-      std::vector<D> want(size_t(n) * m.dstStride);
-      for (int i = 0; i < int(want.size()); ++i) want[i] = dst.get(i, 0);
-      const int done = m.blocks(lanes, src.data(), dst.data(), n);
-      ASSERT_EQ(done, n / laneCount * laneCount) << m.name;
-      for (int x = 0; x < done; ++x) {
-        S in[8];
-        for (int c = 0; c < m.srcStride; ++c) in[c] = src.get(x * m.srcStride + c, 0);
-        m.body(in, &want[size_t(x) * m.dstStride]);
-      }
-      const std::string where = std::string(lanes == Lanes::Avx2 ? "AVX2" : "SSE4.1") + " n " + std::to_string(n);
-      for (int i = 0; i < n * m.dstStride; ++i)
-        if (!sameBits(want[i], dst.get(i, 0))) {
-          ADD_FAILURE() << m.name << " " << where << ": pixel " << i / m.dstStride << " sample " << i % m.dstStride
-                        << " is " << +dst.get(i, 0) << ", body formula gives " << +want[i];
-          return;
-        }
-      ASSERT_TRUE(dst.guardsIntact()) << m.name << " " << where;
+    if (lanes == Lanes::Avx512 && (!hasAvx512() || m.widest < 16)) continue;
+    const int count = spaces::laneCount(lanes);
+    const std::string tier = lanes == Lanes::Avx512 ? "512-bit" : (lanes == Lanes::Avx2 ? "AVX2" : "SSE4.1");
+    std::vector<int> widths;
+    for (int n = 1; n <= 70; ++n) widths.push_back(n);
+    for (int n : {129, 150, 203}) widths.push_back(n);
+    for (int n : widths) {
+      expectBlocksRun(m, lanes, n, 3 + n % 5, RowStores{}, n / count * count, seed + uint32_t(n) * 31u,
+                      tier + " n " + std::to_string(n));
+      if (::testing::Test::HasFailure()) return;
     }
+    if (!m.streams) continue;
+    for (int n : {count, 3 * count + 5}) {
+      expectBlocksRun(m, lanes, n, 0, RowStores{RowStores::Stream, 0}, n / count * count, seed + uint32_t(n),
+                      tier + " streamed n " + std::to_string(n));
+    }
+    for (int keep = 1; keep < count; ++keep)
+      expectBlocksRun(m, lanes, count, 4 * keep + 4, RowStores{RowStores::Part, keep}, count, seed + uint32_t(keep),
+                      tier + " part of " + std::to_string(keep));
+    if (::testing::Test::HasFailure()) return;
   }
 }
 
@@ -204,6 +295,7 @@ void expectMembers(const std::vector<Member<S, D>>& members) {
   for (const Member<S, D>& m : members) {
     expectExportFollowsFormulas(m);
     if (m.blocks) expectBlocksFollowBody(m);
+    if (m.streams) expectStreamedFramesFollowFormulas(m);
   }
 }
 

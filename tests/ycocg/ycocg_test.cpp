@@ -249,39 +249,59 @@ TEST(YCoCgRoundTrip, ShortSamplesAtTheExtremes) {
   EXPECT_EQ(p16[1][8], -1) << "the same difference wrapped";
 }
 
-// The 128-bit blocks alone and the 256-bit blocks give the same rows (the
-// members above run the wider ones where the processor has them).
+// The 128-bit blocks alone and the 256-bit and 512-bit blocks give the same
+// rows (the members above run the widest the processor has), over widths
+// 1..70 and a few past several 32-pixel blocks.
+using zel::VectorTier;
+std::vector<VectorTier> widerTiers() {
+  std::vector<VectorTier> tiers{VectorTier::Avx2};
+  if (zel::hasAvx512()) tiers.push_back(VectorTier::Avx512);
+  return tiers;
+}
+std::vector<int> blockWidths() {
+  std::vector<int> widths;
+  for (int width = 1; width <= 70; ++width) widths.push_back(width);
+  for (int width : {129, 150, 203}) widths.push_back(width);
+  return widths;
+}
+
 template <class Op, typename Src, int Ch>
 void forwardWidthsAgree() {
   using Plane = typename Op::Plane;
   std::mt19937 rng(3);
-  for (int width = 1; width <= 70; ++width) {
+  for (int width : blockWidths()) {
     std::vector<Src> src(size_t(width) * Ch + 1);
     for (auto& v : src) v = sample<Src>(rng);
     std::vector<Plane> narrow(3 * width), wide(3 * width);
     Plane* const n[3] = {&narrow[0], &narrow[width], &narrow[2 * width]};
     Plane* const w[3] = {&wide[0], &wide[width], &wide[2 * width]};
-    zel::ycocg::forwardRow<Op, Src, Ch, false>(src.data() + 1, n, width, false);
-    zel::ycocg::forwardRow<Op, Src, Ch, false>(src.data() + 1, w, width, true);
-    ASSERT_EQ(narrow, wide) << "width " << width;
+    zel::ycocg::forwardRow<Op, Src, Ch, false>(src.data() + 1, n, width, VectorTier::Sse41);
+    for (VectorTier tier : widerTiers()) {
+      std::fill(wide.begin(), wide.end(), Plane(0x5a));
+      zel::ycocg::forwardRow<Op, Src, Ch, false>(src.data() + 1, w, width, tier);
+      ASSERT_EQ(narrow, wide) << "width " << width << " tier " << int(tier);
+    }
   }
 }
 template <class Op, typename Dst, int Ch>
 void inverseWidthsAgree() {
   using Plane = typename Op::Plane;
   std::mt19937 rng(4);
-  for (int width = 1; width <= 70; ++width) {
+  for (int width : blockWidths()) {
     std::vector<Plane> planes(3 * width + 1);
     for (auto& v : planes) v = sample<Plane>(rng);
     const Plane* const in[3] = {&planes[1], &planes[1 + width], &planes[1 + 2 * width]};
     std::vector<Dst> narrow(size_t(width) * Ch), wide(narrow.size());
-    zel::ycocg::inverseRow<Op, Dst, Ch, false>(in, narrow.data(), width, Dst(0x5A), false);
-    zel::ycocg::inverseRow<Op, Dst, Ch, false>(in, wide.data(), width, Dst(0x5A), true);
-    ASSERT_EQ(narrow, wide) << "width " << width;
+    zel::ycocg::inverseRow<Op, Dst, Ch, false>(in, narrow.data(), width, Dst(0x5A), VectorTier::Sse41);
+    for (VectorTier tier : widerTiers()) {
+      std::fill(wide.begin(), wide.end(), Dst(0x33));
+      zel::ycocg::inverseRow<Op, Dst, Ch, false>(in, wide.data(), width, Dst(0x5A), tier);
+      ASSERT_EQ(narrow, wide) << "width " << width << " tier " << int(tier);
+    }
   }
 }
 
-TEST(YCoCgBlocks, BothVectorWidthsAgree) {
+TEST(YCoCgBlocks, EveryVectorWidthAgrees) {
   if (!zel::hasAvx2()) GTEST_SKIP() << "no 256-bit blocks on this processor";
   using namespace zel::ycocg;
   forwardWidthsAgree<PlainBytes, uint8_t, 3>();
