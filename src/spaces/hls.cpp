@@ -63,7 +63,7 @@ struct Sse {
   static I lowBits(I v, int max) { return _mm_and_si128(v, _mm_set1_epi32(max)); }
   static I join(const __m128i* parts) { return parts[0]; }
   static __m128i part(I v, int) { return v; }
-  // Whole vectors of three-float pixels: only with eight lanes.
+  // Whole vectors of three-float pixels: only with eight or sixteen lanes.
   static constexpr bool kWholeFloat3 = false;
   static void getFloat3(const RowStores&, const float*, F*) {}
   static void putFloat3(const RowStores&, float*, const F*) {}
