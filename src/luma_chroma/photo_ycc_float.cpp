@@ -13,6 +13,9 @@
 
 namespace zel::lc {
 
+// The kernels of every tier, the 512-bit ones among them.
+ZEL_TIER512_BEGIN
+
 namespace {
 
 inline __m128i mask(const Shuffle16& m) { return load128(m.b); }
@@ -149,8 +152,12 @@ struct Read16 {
   ZEL_AVX512 ZEL_INLINE FloatTrio<Ps16> get16(int x) const {
     const uint16_t* s = p + Channels * x;
     const __m512i a = _mm512_loadu_si512(s);
-    // Three channels: the block's last 16 words alone.
-    const __m512i b = Channels == 3 ? _mm512_maskz_loadu_epi16(0xffffu, s + 32) : _mm512_loadu_si512(s + 32);
+    // Three channels: the block's last 16 words alone, by a plain 256-bit
+    // load (with a masked 512-bit load and store, whose unused halves reach
+    // into the next block or past the row, whole calls ran at a third of
+    // the speed now and then); the permutes never read the upper half.
+    const __m256i* tail = reinterpret_cast<const __m256i*>(s + 32);
+    const __m512i b = Channels == 3 ? _mm512_castsi256_si512(_mm256_loadu_si256(tail)) : _mm512_loadu_si512(s + 32);
     return {channel16(a, b, 0), channel16(a, b, 1), channel16(a, b, 2)};
   }
   ZEL_AVX512 ZEL_INLINE static __m512 channel16(__m512i a, __m512i b, int c) {
@@ -225,7 +232,7 @@ struct Write16 {
     uint16_t* d = p + Channels * x;
     if constexpr (Channels == 3) {
       _mm512_storeu_si512(d, out0);
-      _mm512_mask_storeu_epi16(d + 32, 0xffffu, out1);
+      _mm256_storeu_si256(reinterpret_cast<__m256i*>(d + 32), _mm512_castsi512_si256(out1));  // plain, as the load
     } else {
       _mm512_mask_storeu_epi16(d, 0x77777777u, out0);
       _mm512_mask_storeu_epi16(d + 32, 0x77777777u, out1);
@@ -544,6 +551,8 @@ void yccRow32f(const float* src, float* dst, int width, Form form, VectorTier ti
 }
 
 }  // namespace
+
+ZEL_TIER512_END
 
 template <int Channels, bool Signed>
 void rgbToYcc16Row(const uint16_t* src, uint16_t* dst, int width, VectorTier tier) {
