@@ -136,11 +136,18 @@ int main(int argc, char** argv) {
     })->Unit(benchmark::kMillisecond);
     std::vector<zel::bench::Peer> peers = zel::bench::peersOf(name);
     // Every export is also set against a copy of the bytes it writes.
-    size_t outBytes = 0;
-    for (Workspace::Buffer& b : ws->buffers())
-      if (b.isDestination) outBytes += size_t(b.geometry.rowBytes) * b.geometry.rows;
-    if (std::none_of(peers.begin(), peers.end(), [](const zel::bench::Peer& p) { return p.label.rfind("memcpy", 0) == 0; }))
+    size_t outBytes = 0, inBytes = 0;
+    for (Workspace::Buffer& b : ws->buffers()) {
+      const size_t bytes = size_t(b.geometry.rowBytes) * b.geometry.rows;
+      if (b.isDestination) outBytes += bytes;
+      else if (b.isSource) inBytes += bytes;
+    }
+    if (std::none_of(peers.begin(), peers.end(), [](const zel::bench::Peer& p) { return p.label.rfind("memcpy", 0) == 0; })) {
       peers.push_back(zel::bench::memcpyPeer(outBytes));
+      // A conversion that reads twice what it writes or more is also set
+      // against a copy of what it reads.
+      if (inBytes >= 2 * outBytes) peers.push_back(zel::bench::memcpyPeer(inBytes, "memcpy of the input bytes"));
+    }
     if (zel::bench::streamsItsOutput(name)) peers.push_back(zel::bench::streamingMemcpyPeer(outBytes));
     for (zel::bench::Peer& peer : peers) {
       const std::string id = name + " | " + peer.label;

@@ -548,10 +548,10 @@ const std::map<std::string, PeerFactory>& table() {
 
 }  // namespace
 
-Peer memcpyPeer(size_t bytes) {
+Peer memcpyPeer(size_t bytes, const char* label) {
   auto src = std::make_shared<std::vector<uint8_t>>(frameBytes(bytes));
   auto dst = std::make_shared<std::vector<uint8_t>>(bytes);
-  return {"memcpy of the output bytes", [src, dst] { std::memcpy(dst->data(), src->data(), dst->size()); }};
+  return {label, [src, dst] { std::memcpy(dst->data(), src->data(), dst->size()); }};
 }
 
 Peer streamingMemcpyPeer(size_t bytes) {

@@ -18,8 +18,9 @@ struct Peer {
 
 // The peers of one export (none when no other library does the same).
 std::vector<Peer> peersOf(const std::string& exportName);
-// A copy of `bytes` bytes: the floor any conversion writing them pays.
-Peer memcpyPeer(size_t bytes);
+// A copy of `bytes` bytes: the floor any conversion writing them pays (or,
+// for a conversion that reads more than it writes, reading them).
+Peer memcpyPeer(size_t bytes, const char* label = "memcpy of the output bytes");
 // The same copy with streaming stores, the floor of the exports whose large
 // frames stream their output past the cache.
 Peer streamingMemcpyPeer(size_t bytes);
