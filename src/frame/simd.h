@@ -23,6 +23,19 @@
 // The same for a lambda, written after its parameter list.
 #define ZEL_LAMBDA_INLINE __attribute__((always_inline))
 
+// GCC takes the undefined upper lanes that many 512-bit intrinsics start
+// from for uninitialised values; code of the 512-bit tier sits between these
+// two marks, which silence that false warning (other compilers need not).
+#if defined(__GNUC__) && !defined(__clang__)
+#define ZEL_TIER512_BEGIN                                                                     \
+  _Pragma("GCC diagnostic push") _Pragma("GCC diagnostic ignored \"-Wuninitialized\"") \
+      _Pragma("GCC diagnostic ignored \"-Wmaybe-uninitialized\"")
+#define ZEL_TIER512_END _Pragma("GCC diagnostic pop")
+#else
+#define ZEL_TIER512_BEGIN
+#define ZEL_TIER512_END
+#endif
+
 namespace zel {
 
 // The widest tier the kernels may take: what the processor has, lowered by

@@ -136,14 +136,6 @@ struct Avx {
   ZEL_AVX2 static V packS32(V lo, V hi) { return _mm256_packs_epi32(lo, hi); }
 };
 
-// GCC 12 takes the undefined upper lanes that many 512-bit intrinsics start
-// from for uninitialised values; the code of the 512-bit tier sits between
-// these two marks, which silence that false warning.
-#define ZEL_TIER512_BEGIN \
-  _Pragma("GCC diagnostic push") _Pragma("GCC diagnostic ignored \"-Wuninitialized\"") \
-      _Pragma("GCC diagnostic ignored \"-Wmaybe-uninitialized\"")
-#define ZEL_TIER512_END _Pragma("GCC diagnostic pop")
-
 ZEL_TIER512_BEGIN
 
 // Moves of the 512-bit tier across lanes.

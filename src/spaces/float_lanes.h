@@ -23,7 +23,9 @@
 // The 512-bit intrinsics start some results from an undefined vector,
 // which the compiler then reports as maybe uninitialised; nothing here
 // reads such a value.
+#if defined(__GNUC__) && !defined(__clang__)
 #pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
+#endif
 
 #define ZEL_LANE inline __attribute__((always_inline))
 #define ZEL_LANE_AVX2 ZEL_AVX2 inline __attribute__((always_inline))

@@ -21,7 +21,9 @@
 #pragma GCC diagnostic ignored "-Wpsabi"
 // The 512-bit intrinsics start some results from an undefined vector, which
 // the compiler then reports as maybe uninitialised; nothing reads one.
+#if defined(__GNUC__) && !defined(__clang__)
 #pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
+#endif
 
 namespace zel::ycocg {
 
