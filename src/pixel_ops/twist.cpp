@@ -361,7 +361,7 @@ void row(const T* const src[3], T* const dst[3], int width, const Matrix& m, Vec
   const Columns c(m);
   int x = 0;
   if constexpr (std::is_same_v<T, float> && K == C3) {
-    row32fC3(src[0], dst[0], width, m, false, tier >= VectorTier::Avx2);
+    row32fC3(src[0], dst[0], width, m, false, tier);
     return;
   } else if constexpr (std::is_same_v<T, float>) {
     for (; x + 4 <= width; x += 4) {
@@ -458,7 +458,7 @@ inline void pixel32fC3(const float* src, float* dst, int64_t x, const Matrix& m)
 
 // Pixels from x on, a pixel at a time, until dst + 3 * x lies on an
 // `align`-byte boundary (never past `pixels`). Whole floats reach every
-// 32-byte boundary within eight pixels.
+// 64-byte boundary within sixteen pixels.
 inline int64_t alignPixels(const float* src, float* dst, int64_t x, int64_t pixels, const Matrix& m, unsigned align) {
   while (x < pixels && (reinterpret_cast<uintptr_t>(dst + x * 3) & (align - 1)) != 0) pixel32fC3(src, dst, x++, m);
   return x;
@@ -521,14 +521,17 @@ ZEL_AVX2 int64_t wide32fC3(const float* src, float* dst, int64_t x, int64_t pixe
 
 }  // namespace
 
-void row32fC3(const float* src, float* dst, int64_t pixels, const Matrix& m, bool stream, bool wide) {
+void row32fC3(const float* src, float* dst, int64_t pixels, const Matrix& m, bool stream, VectorTier tier) {
   const Columns c(m);
   // Streaming needs whole floats; the first pixels then go one by one until
   // the stores are aligned, and every block store is a whole aligned one.
   const bool streamed = stream && (reinterpret_cast<uintptr_t>(dst) & 3) == 0;
   int64_t x = 0;
-  if (streamed) x = alignPixels(src, dst, x, pixels, m, wide ? 32 : 16);
-  if (wide) x = streamed ? wide32fC3<true>(src, dst, x, pixels, m) : wide32fC3<false>(src, dst, x, pixels, m);
+  if (streamed) x = alignPixels(src, dst, x, pixels, m, tier >= VectorTier::Avx512 ? 64 : tier >= VectorTier::Avx2 ? 32 : 16);
+  if (tier >= VectorTier::Avx512)
+    x = streamed ? blocks32fC3<true>(src, dst, x, pixels, m) : blocks32fC3<false>(src, dst, x, pixels, m);
+  if (tier >= VectorTier::Avx2)
+    x = streamed ? wide32fC3<true>(src, dst, x, pixels, m) : wide32fC3<false>(src, dst, x, pixels, m);
   for (; x + 4 <= pixels; x += 4) {
     const float* s = src + x * 3;
     if (streamed) prefetchAhead(s);
@@ -582,7 +585,7 @@ template <typename T, int K>
 __attribute__((noinline)) void walk(const T* const* srcPlanes, int srcStep, T* const* dstPlanes, int dstStep,
                                     ImageSize size, const Matrix& m) {
   const int planes = K == Planar ? 3 : 1;
-  const VectorTier tier = std::is_same_v<T, float> ? (hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41) : integerTier();
+  const VectorTier tier = std::is_same_v<T, float> ? floatTier() : integerTier();
   plainWalk(size.height, [&](int y) {
     const T* s[3];
     T* d[3];
@@ -675,13 +678,14 @@ ZEL_PUBLIC Status zeliColorTwist_32f_C3R(const float* src, int srcStep, float* d
   if (size.width < 1 || size.height < 1) return StatusSizeError;
   if (srcStep < 1 || dstStep < 1) return StatusStepError;
   const Matrix m = matrix3(twist);
-  const bool stream = streamsC3(size.width, size.height), wide = zel::hasAvx2();
+  const bool stream = streamsC3(size.width, size.height);
+  const zel::VectorTier tier = floatTier();
   if (mergesC3(srcStep, dstStep, size.width)) {
-    row32fC3(src, dst, int64_t(size.width) * size.height, m, stream, wide);
+    row32fC3(src, dst, int64_t(size.width) * size.height, m, stream, tier);
     return StatusOk;
   }
   plainWalk(size.height,
-            [&](int y) { row32fC3(rowAt(src, srcStep, y), rowAt(dst, dstStep, y), size.width, m, stream, wide); });
+            [&](int y) { row32fC3(rowAt(src, srcStep, y), rowAt(dst, dstStep, y), size.width, m, stream, tier); });
   return StatusOk;
 }
 ZEL_PUBLIC Status zeliColorTwist_32f_AC4R(const float* src, int srcStep, float* dst, int dstStep, ImageSize size,

@@ -48,11 +48,23 @@ inline VectorTier integerTier() {
   return hasAvx512Vbmi() ? VectorTier::Avx512 : hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41;
 }
 
+// The widest tier the float blocks take on this processor.
+inline VectorTier floatTier() {
+  return hasAvx512() ? VectorTier::Avx512 : hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41;
+}
+
 // Three-channel floats over `pixels` pixels; `stream` writes the blocks
 // with non-temporal stores (where the destination holds whole floats) and
-// ends with a store fence; `wide` takes blocks of eight pixels (the caller
-// having checked for AVX2).
-void row32fC3(const float* src, float* dst, int64_t pixels, const Matrix& m, bool stream, bool wide);
+// ends with a store fence. Blocks of four pixels, eight from the AVX2 tier
+// and sixteen from the 512-bit one (`tier` as the caller found the
+// processor).
+void row32fC3(const float* src, float* dst, int64_t pixels, const Matrix& m, bool stream, VectorTier tier);
+
+// Three-channel floats, sixteen pixels a block from pixel x while whole
+// blocks remain; returns where the blocks stop. `Stream`: dst + 3 * x lies
+// on a 64-byte boundary and every store is a whole non-temporal line.
+template <bool Stream>
+ZEL_AVX512 int64_t blocks32fC3(const float* src, float* dst, int64_t x, int64_t pixels, const Matrix& m);
 // Four-channel floats over `pixels` pixels.
 void row32fC4(const float* src, float* dst, int64_t pixels, const Matrix& m);
 

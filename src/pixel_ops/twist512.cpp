@@ -10,11 +10,7 @@
 #include "frame/simd.h"
 #include "pixel_ops/twist.h"
 
-// The compiler's own 512-bit conversions start from an undefined register,
-// which some of its versions take for an uninitialised read.
-#if defined(__GNUC__) && !defined(__clang__)
-#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
-#endif
+ZEL_TIER512_BEGIN
 
 namespace zel::twist {
 
@@ -194,7 +190,66 @@ ZEL_AVX512_VBMI ZEL_INLINE int blocks(const T* const (&s)[3], T* const (&d)[3], 
   return x;
 }
 
+// Three-channel floats are computed where they lie, sixteen pixels (48
+// samples, three registers) a block. Output sample L of register j belongs
+// to pixel (16j + L) / 3 and channel (16j + L) % 3; a two-register permute
+// brings that pixel's first, second and third sample to lane L, and a
+// permute of the whole matrix brings the weights of that channel there.
+// Every lane then runs the three-channel float formula as it is written.
+struct FloatC3Tables {
+  // pick[j][k]: sample k of each lane's pixel, counted from register
+  // first[j][k] of the block (the permute reads it and the next one).
+  alignas(64) int32_t pick[3][3][16];
+  int first[3][3];
+  // weight[j][col]: where column col of each lane's matrix row sits in the
+  // 4 by 4 matrix read as sixteen floats.
+  alignas(64) int32_t weight[3][4][16];
+  constexpr FloatC3Tables() : pick{}, first{}, weight{} {
+    for (int j = 0; j < 3; ++j) {
+      for (int k = 0; k < 3; ++k) {
+        const int lowest = 3 * ((16 * j) / 3) + k;
+        first[j][k] = lowest / 16 < 1 ? lowest / 16 : 1;
+        for (int l = 0; l < 16; ++l) pick[j][k][l] = 3 * ((16 * j + l) / 3) + k - 16 * first[j][k];
+      }
+      for (int col = 0; col < 4; ++col)
+        for (int l = 0; l < 16; ++l) weight[j][col][l] = 4 * ((16 * j + l) % 3) + col;
+    }
+  }
+};
+constexpr FloatC3Tables kFloatC3{};
+
 }  // namespace
+
+template <bool Stream>
+ZEL_AVX512 int64_t blocks32fC3(const float* src, float* dst, int64_t x, int64_t pixels, const Matrix& m) {
+  const __m512 all = _mm512_loadu_ps(&m.t[0][0]);
+  __m512 w[3][4];
+  __m512i pick[3][3];
+  for (int j = 0; j < 3; ++j) {
+    for (int col = 0; col < 4; ++col) w[j][col] = _mm512_permutexvar_ps(_mm512_load_si512(kFloatC3.weight[j][col]), all);
+    for (int k = 0; k < 3; ++k) pick[j][k] = _mm512_load_si512(kFloatC3.pick[j][k]);
+  }
+  for (; x + 16 <= pixels; x += 16) {
+    const float* s = src + x * 3;
+    // The whole block is read before any of it is written (in place too).
+    const __m512 in[3] = {_mm512_loadu_ps(s), _mm512_loadu_ps(s + 16), _mm512_loadu_ps(s + 32)};
+    float* d = dst + x * 3;
+    for (int j = 0; j < 3; ++j) {
+      __m512 v[3];
+      for (int k = 0; k < 3; ++k) {
+        const int f = kFloatC3.first[j][k];
+        v[k] = _mm512_permutex2var_ps(in[f], pick[j][k], in[f + 1]);
+      }
+      const __m512 o = _mm512_add_ps(_mm512_add_ps(w[j][3], _mm512_mul_ps(v[0], w[j][0])),
+                                     _mm512_add_ps(_mm512_mul_ps(v[2], w[j][2]), _mm512_mul_ps(v[1], w[j][1])));
+      if constexpr (Stream) _mm512_stream_ps(d + 16 * j, o);
+      else _mm512_storeu_ps(d + 16 * j, o);
+    }
+  }
+  return x;
+}
+template int64_t blocks32fC3<true>(const float*, float*, int64_t, int64_t, const Matrix&);
+template int64_t blocks32fC3<false>(const float*, float*, int64_t, int64_t, const Matrix&);
 
 template <typename T, int K>
 ZEL_AVX512_VBMI int blocks512(const T* const src[3], T* const dst[3], int width, const Matrix& m) {
@@ -217,3 +272,5 @@ ZEL_TWIST_BLOCKS512(int16_t)
 #undef ZEL_TWIST_BLOCKS512
 
 }  // namespace zel::twist
+
+ZEL_TIER512_END

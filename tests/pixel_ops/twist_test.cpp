@@ -246,15 +246,15 @@ TEST(TwistKernels, FloatRunsMatchTheFormula) {
       const Matrix m = randomMatrix(rng, 2.0f, 1.0f);
       TestImage<float> src(pixels * 4, 1, offset);
       src.fillRandom(rng(), -1, 2);
-      // Three channels, with and without streaming stores, four and eight
-      // pixels a block, the destination at every 4-byte place of a 32-byte
-      // block (the first pixels go one by one to a boundary).
-      for (int dstOffset : {0, 4, 8, 12, 16, 20, 28})
-        for (bool wide : {false, true}) {
-          if (wide && !zel::hasAvx2()) continue;
+      // Three channels, with and without streaming stores, in every tier's
+      // blocks, the destination at 4-byte places of a 64-byte line (the
+      // first pixels go one by one to a boundary).
+      for (int dstOffset : {0, 4, 8, 12, 16, 20, 28, 36, 44, 52, 60})
+        for (VectorTier tier : {VectorTier::Sse41, VectorTier::Avx2, VectorTier::Avx512}) {
+          if (tier > floatTier()) continue;
           for (bool stream : {false, true}) {
             TestImage<float> dst(pixels * 3, 1, dstOffset);
-            row32fC3(src.data(), dst.data(), pixels, m, stream, wide);
+            row32fC3(src.data(), dst.data(), pixels, m, stream, tier);
             for (int x = 0; x < pixels * 3; ++x) {
               const float* p = src.data() + (x / 3) * 3;
               const float got = dst.get(x, 0), want = output(m, x % 3, p[0], p[1], p[2]);
