@@ -1,8 +1,8 @@
 // Lane types for the float kernels of the colour-space families: F4/I4 are
-// four float or int32 lanes of SSE4.1, F8/I8 eight lanes of AVX2. A kernel
-// body is written once as a template over the lane type and instantiated
-// for both; every operation has the same meaning per lane in both widths, so
-// the two give the same bits.
+// four float or int32 lanes of SSE4.1, F8/I8 eight lanes of AVX2 and F16/I16
+// sixteen lanes of the 512-bit tier. A kernel body is written once as a
+// template over the lane type and instantiated for each; every operation has
+// the same meaning per lane at every width, so all give the same bits.
 //
 // Pixel input and output go through byte shuffles: four pixels of a C3 or
 // AC4 row (8, 16 or 32 bits a sample) become three vectors of int32 or float
@@ -19,13 +19,6 @@
 
 #include "frame/simd.h"
 #include "spaces/row_stores.h"
-
-// The 512-bit intrinsics start some results from an undefined vector,
-// which the compiler then reports as maybe uninitialised; nothing here
-// reads such a value.
-#if defined(__GNUC__) && !defined(__clang__)
-#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
-#endif
 
 #define ZEL_LANE inline __attribute__((always_inline))
 #define ZEL_LANE_AVX2 ZEL_AVX2 inline __attribute__((always_inline))
@@ -44,6 +37,79 @@ ZEL_LANE void readAhead(const void* p) {
   for (int b = 0; b < Bytes; b += 64) _mm_prefetch(at + b, _MM_HINT_T0);
 }
 
+// Pairs k and k + 1 of a table of float pairs in one register, one 64-bit
+// read each: the (c, w) gathers of every width are made of these.
+ZEL_LANE __m128 pairsAt(const float (*table)[2], const int32_t* at, int k) {
+  return _mm_loadh_pi(_mm_castpd_ps(_mm_load_sd(reinterpret_cast<const double*>(table[at[k]]))),
+                      reinterpret_cast<const __m64*>(table[at[k + 1]]));
+}
+
+// The operations of one form at every width, written once and stamped for
+// each: F and I are the float and int32 lane types, ON the width's
+// always-inline marker, MM the prefix of its intrinsics (_mm, _mm256,
+// _mm512) and BITS its register width. The width's approxRcp comes first.
+//   vmin, vmax        MINPS / MAXPS: the second operand when the comparison
+//                     fails (the wider forms keep that rule);
+//   refinedRcp        one Newton step on ApproxRcp, 2r - x r r;
+//   multiplyAddPairs  sums of the products of 16-bit pairs (PMADDWD);
+//   clampToByte/Word  SaturateU8 (also after SaturateS16, which it absorbs)
+//                     and SaturateU16;
+//   samplesAsFloat    raw samples of type T as floats: integers converted,
+//                     float bits as they are.
+#define ZEL_LANE_ARITHMETIC(F, I, ON, MM, BITS)                                 \
+  ON F operator+(F a, F b) { return {MM##_add_ps(a.v, b.v)}; }                  \
+  ON F operator-(F a, F b) { return {MM##_sub_ps(a.v, b.v)}; }                  \
+  ON F operator*(F a, F b) { return {MM##_mul_ps(a.v, b.v)}; }                  \
+  ON F operator/(F a, F b) { return {MM##_div_ps(a.v, b.v)}; }                  \
+  ON F vmin(F a, F b) { return {MM##_min_ps(a.v, b.v)}; }                       \
+  ON F vmax(F a, F b) { return {MM##_max_ps(a.v, b.v)}; }                       \
+  ON F refinedRcp(F x) {                                                        \
+    const F r = approxRcp(x);                                                   \
+    return (r + r) - ((x * r) * r);                                             \
+  }                                                                             \
+  ON I roundEven(F a) { return {MM##_cvtps_epi32(a.v)}; }                       \
+  ON I truncate(F a) { return {MM##_cvttps_epi32(a.v)}; }                       \
+  ON F toFloat(I a) { return {MM##_cvtepi32_ps(a.v)}; }                         \
+  ON F asFloat(I a) { return {MM##_castsi##BITS##_ps(a.v)}; }                   \
+  ON I asInt(F a) { return {MM##_castps_si##BITS(a.v)}; }                       \
+  ON I operator+(I a, I b) { return {MM##_add_epi32(a.v, b.v)}; }               \
+  ON I operator-(I a, I b) { return {MM##_sub_epi32(a.v, b.v)}; }               \
+  ON I operator|(I a, I b) { return {MM##_or_si##BITS(a.v, b.v)}; }             \
+  ON I operator&(I a, I b) { return {MM##_and_si##BITS(a.v, b.v)}; }            \
+  ON I operator^(I a, I b) { return {MM##_xor_si##BITS(a.v, b.v)}; }            \
+  template <int N>                                                              \
+  ON I shiftRightArith(I a) {                                                   \
+    return {MM##_srai_epi32(a.v, N)};                                           \
+  }                                                                             \
+  template <int N>                                                              \
+  ON I shiftLeft(I a) {                                                         \
+    return {MM##_slli_epi32(a.v, N)};                                           \
+  }                                                                             \
+  ON I imin(I a, I b) { return {MM##_min_epi32(a.v, b.v)}; }                    \
+  ON I imax(I a, I b) { return {MM##_max_epi32(a.v, b.v)}; }                    \
+  ON I multiplyAddPairs(I a, I b) { return {MM##_madd_epi16(a.v, b.v)}; }       \
+  ON I clampToByte(I x) { return imax(imin(x, I::splat(255)), I::splat(0)); }   \
+  ON I clampToWord(I x) { return imax(imin(x, I::splat(65535)), I::splat(0)); } \
+  template <typename T>                                                         \
+  ON F samplesAsFloat(I raw) {                                                  \
+    return sizeof(T) == 4 ? asFloat(raw) : toFloat(raw);                        \
+  }
+
+// The widths whose comparisons give all-ones lanes (4 and 8): masks are
+// float vectors, combined and applied bit by bit.
+//   select      a where the mask is set, else b;
+//   clearWhere  the value where the mask is clear, zero where it is set.
+#define ZEL_LANE_ALL_ONES_MASKS(F, I, ON, MM, BITS)                               \
+  ON F approxRcp(F a) { return {MM##_rcp_ps(a.v)}; }                              \
+  ON F vabs(F a) { return {MM##_andnot_ps(MM##_set1_ps(-0.0f), a.v)}; }           \
+  ON F maskOr(F a, F b) { return {MM##_or_ps(a.v, b.v)}; }                        \
+  ON F maskAnd(F a, F b) { return {MM##_and_ps(a.v, b.v)}; }                      \
+  ON F select(F mask, F a, F b) { return {MM##_blendv_ps(b.v, a.v, mask.v)}; }    \
+  ON F clearWhere(F mask, F a) { return {MM##_andnot_ps(mask.v, a.v)}; }          \
+  ON I ieq(I a, I b) { return {MM##_cmpeq_epi32(a.v, b.v)}; }                     \
+  ON I iselect(I mask, I a, I b) { return {MM##_blendv_epi8(b.v, a.v, mask.v)}; } \
+  ON I iselect(F mask, I a, I b) { return iselect(I{MM##_castps_si##BITS(mask.v)}, a, b); }
+
 // ---------------------------------------------------------------- 4 lanes
 
 struct I4 {
@@ -59,66 +125,19 @@ struct F4 {
   static ZEL_LANE F4 splat(float x) { return {_mm_set1_ps(x)}; }
 };
 
-ZEL_LANE F4 operator+(F4 a, F4 b) { return {_mm_add_ps(a.v, b.v)}; }
-ZEL_LANE F4 operator-(F4 a, F4 b) { return {_mm_sub_ps(a.v, b.v)}; }
-ZEL_LANE F4 operator*(F4 a, F4 b) { return {_mm_mul_ps(a.v, b.v)}; }
-ZEL_LANE F4 operator/(F4 a, F4 b) { return {_mm_div_ps(a.v, b.v)}; }
-// MINPS / MAXPS: the second operand when the comparison fails.
-ZEL_LANE F4 vmin(F4 a, F4 b) { return {_mm_min_ps(a.v, b.v)}; }
-ZEL_LANE F4 vmax(F4 a, F4 b) { return {_mm_max_ps(a.v, b.v)}; }
-ZEL_LANE F4 approxRcp(F4 a) { return {_mm_rcp_ps(a.v)}; }
-ZEL_LANE F4 refinedRcp(F4 x) {
-  const __m128 r = _mm_rcp_ps(x.v);
-  return {_mm_sub_ps(_mm_add_ps(r, r), _mm_mul_ps(_mm_mul_ps(x.v, r), r))};
-}
-ZEL_LANE F4 vabs(F4 a) { return {_mm_andnot_ps(_mm_set1_ps(-0.0f), a.v)}; }
-// Comparisons give all-ones lanes where true.
+ZEL_LANE_ALL_ONES_MASKS(F4, I4, ZEL_LANE, _mm, 128)
 ZEL_LANE F4 eq(F4 a, F4 b) { return {_mm_cmpeq_ps(a.v, b.v)}; }
 ZEL_LANE F4 lt(F4 a, F4 b) { return {_mm_cmplt_ps(a.v, b.v)}; }
 ZEL_LANE F4 le(F4 a, F4 b) { return {_mm_cmple_ps(a.v, b.v)}; }
 ZEL_LANE F4 gt(F4 a, F4 b) { return {_mm_cmpgt_ps(a.v, b.v)}; }
 ZEL_LANE F4 ge(F4 a, F4 b) { return {_mm_cmpge_ps(a.v, b.v)}; }
-ZEL_LANE F4 maskOr(F4 a, F4 b) { return {_mm_or_ps(a.v, b.v)}; }
-ZEL_LANE F4 maskAnd(F4 a, F4 b) { return {_mm_and_ps(a.v, b.v)}; }
-// a where the mask is set, else b.
-ZEL_LANE F4 select(F4 mask, F4 a, F4 b) { return {_mm_blendv_ps(b.v, a.v, mask.v)}; }
-// The value where the mask is clear, zero where it is set.
-ZEL_LANE F4 clearWhere(F4 mask, F4 a) { return {_mm_andnot_ps(mask.v, a.v)}; }
-ZEL_LANE I4 roundEven(F4 a) { return {_mm_cvtps_epi32(a.v)}; }
-ZEL_LANE I4 truncate(F4 a) { return {_mm_cvttps_epi32(a.v)}; }
-ZEL_LANE F4 toFloat(I4 a) { return {_mm_cvtepi32_ps(a.v)}; }
-ZEL_LANE F4 asFloat(I4 a) { return {_mm_castsi128_ps(a.v)}; }
-ZEL_LANE I4 asInt(F4 a) { return {_mm_castps_si128(a.v)}; }
-
-ZEL_LANE I4 operator+(I4 a, I4 b) { return {_mm_add_epi32(a.v, b.v)}; }
-ZEL_LANE I4 operator-(I4 a, I4 b) { return {_mm_sub_epi32(a.v, b.v)}; }
-ZEL_LANE I4 operator|(I4 a, I4 b) { return {_mm_or_si128(a.v, b.v)}; }
-ZEL_LANE I4 operator&(I4 a, I4 b) { return {_mm_and_si128(a.v, b.v)}; }
-ZEL_LANE I4 operator^(I4 a, I4 b) { return {_mm_xor_si128(a.v, b.v)}; }
-template <int N>
-ZEL_LANE I4 shiftRightArith(I4 a) {
-  return {_mm_srai_epi32(a.v, N)};
-}
-template <int N>
-ZEL_LANE I4 shiftLeft(I4 a) {
-  return {_mm_slli_epi32(a.v, N)};
-}
-ZEL_LANE I4 imin(I4 a, I4 b) { return {_mm_min_epi32(a.v, b.v)}; }
-ZEL_LANE I4 imax(I4 a, I4 b) { return {_mm_max_epi32(a.v, b.v)}; }
-ZEL_LANE I4 ieq(I4 a, I4 b) { return {_mm_cmpeq_epi32(a.v, b.v)}; }
-ZEL_LANE I4 iselect(I4 mask, I4 a, I4 b) { return {_mm_blendv_epi8(b.v, a.v, mask.v)}; }
-ZEL_LANE I4 iselect(F4 mask, I4 a, I4 b) { return iselect(asInt(mask), a, b); }
-// Sums of the products of 16-bit pairs (PMADDWD).
-ZEL_LANE I4 multiplyAddPairs(I4 a, I4 b) { return {_mm_madd_epi16(a.v, b.v)}; }
+ZEL_LANE_ARITHMETIC(F4, I4, ZEL_LANE, _mm, 128)
 
 // Four (c, w) pairs of a table of float pairs, one 64-bit read per lane.
 ZEL_LANE void gatherPairs(const float (*table)[2], I4 index, F4& c, F4& w) {
   alignas(16) int32_t at[4];
   _mm_store_si128(reinterpret_cast<__m128i*>(at), index.v);
-  const __m128 p01 = _mm_loadh_pi(_mm_castpd_ps(_mm_load_sd(reinterpret_cast<const double*>(table[at[0]]))),
-                                  reinterpret_cast<const __m64*>(table[at[1]]));
-  const __m128 p23 = _mm_loadh_pi(_mm_castpd_ps(_mm_load_sd(reinterpret_cast<const double*>(table[at[2]]))),
-                                  reinterpret_cast<const __m64*>(table[at[3]]));
+  const __m128 p01 = pairsAt(table, at, 0), p23 = pairsAt(table, at, 2);
   c.v = _mm_shuffle_ps(p01, p23, _MM_SHUFFLE(2, 0, 2, 0));
   w.v = _mm_shuffle_ps(p01, p23, _MM_SHUFFLE(3, 1, 3, 1));
 }
@@ -224,11 +243,7 @@ template <int Stride, bool Bias16, typename T>
 ZEL_LANE void loadPixels(const T* p, F4& c0, F4& c1, F4& c2) {
   I4 r0, r1, r2;
   loadRaw<Stride, Bias16>(p, r0, r1, r2);
-  if constexpr (sizeof(T) == 4) {
-    c0 = asFloat(r0), c1 = asFloat(r1), c2 = asFloat(r2);
-  } else {
-    c0 = toFloat(r0), c1 = toFloat(r1), c2 = toFloat(r2);
-  }
+  c0 = samplesAsFloat<T>(r0), c1 = samplesAsFloat<T>(r1), c2 = samplesAsFloat<T>(r2);
 }
 
 // Stores the low bytes of each int32 lane as the sample (8 or 16 bits, or
@@ -298,62 +313,21 @@ struct F8 {
   static ZEL_LANE_AVX2 F8 splat(float x) { return {_mm256_set1_ps(x)}; }
 };
 
-ZEL_LANE_AVX2 F8 operator+(F8 a, F8 b) { return {_mm256_add_ps(a.v, b.v)}; }
-ZEL_LANE_AVX2 F8 operator-(F8 a, F8 b) { return {_mm256_sub_ps(a.v, b.v)}; }
-ZEL_LANE_AVX2 F8 operator*(F8 a, F8 b) { return {_mm256_mul_ps(a.v, b.v)}; }
-ZEL_LANE_AVX2 F8 operator/(F8 a, F8 b) { return {_mm256_div_ps(a.v, b.v)}; }
-ZEL_LANE_AVX2 F8 vmin(F8 a, F8 b) { return {_mm256_min_ps(a.v, b.v)}; }
-ZEL_LANE_AVX2 F8 vmax(F8 a, F8 b) { return {_mm256_max_ps(a.v, b.v)}; }
-ZEL_LANE_AVX2 F8 approxRcp(F8 a) { return {_mm256_rcp_ps(a.v)}; }
-ZEL_LANE_AVX2 F8 refinedRcp(F8 x) {
-  const __m256 r = _mm256_rcp_ps(x.v);
-  return {_mm256_sub_ps(_mm256_add_ps(r, r), _mm256_mul_ps(_mm256_mul_ps(x.v, r), r))};
-}
-ZEL_LANE_AVX2 F8 vabs(F8 a) { return {_mm256_andnot_ps(_mm256_set1_ps(-0.0f), a.v)}; }
+ZEL_LANE_ALL_ONES_MASKS(F8, I8, ZEL_LANE_AVX2, _mm256, 256)
 ZEL_LANE_AVX2 F8 eq(F8 a, F8 b) { return {_mm256_cmp_ps(a.v, b.v, _CMP_EQ_OQ)}; }
 ZEL_LANE_AVX2 F8 lt(F8 a, F8 b) { return {_mm256_cmp_ps(a.v, b.v, _CMP_LT_OS)}; }
 ZEL_LANE_AVX2 F8 le(F8 a, F8 b) { return {_mm256_cmp_ps(a.v, b.v, _CMP_LE_OS)}; }
 ZEL_LANE_AVX2 F8 gt(F8 a, F8 b) { return {_mm256_cmp_ps(a.v, b.v, _CMP_GT_OS)}; }
 ZEL_LANE_AVX2 F8 ge(F8 a, F8 b) { return {_mm256_cmp_ps(a.v, b.v, _CMP_GE_OS)}; }
-ZEL_LANE_AVX2 F8 maskOr(F8 a, F8 b) { return {_mm256_or_ps(a.v, b.v)}; }
-ZEL_LANE_AVX2 F8 maskAnd(F8 a, F8 b) { return {_mm256_and_ps(a.v, b.v)}; }
-ZEL_LANE_AVX2 F8 select(F8 mask, F8 a, F8 b) { return {_mm256_blendv_ps(b.v, a.v, mask.v)}; }
-ZEL_LANE_AVX2 F8 clearWhere(F8 mask, F8 a) { return {_mm256_andnot_ps(mask.v, a.v)}; }
-ZEL_LANE_AVX2 I8 roundEven(F8 a) { return {_mm256_cvtps_epi32(a.v)}; }
-ZEL_LANE_AVX2 I8 truncate(F8 a) { return {_mm256_cvttps_epi32(a.v)}; }
-ZEL_LANE_AVX2 F8 toFloat(I8 a) { return {_mm256_cvtepi32_ps(a.v)}; }
-ZEL_LANE_AVX2 F8 asFloat(I8 a) { return {_mm256_castsi256_ps(a.v)}; }
-ZEL_LANE_AVX2 I8 asInt(F8 a) { return {_mm256_castps_si256(a.v)}; }
-
-ZEL_LANE_AVX2 I8 operator+(I8 a, I8 b) { return {_mm256_add_epi32(a.v, b.v)}; }
-ZEL_LANE_AVX2 I8 operator-(I8 a, I8 b) { return {_mm256_sub_epi32(a.v, b.v)}; }
-ZEL_LANE_AVX2 I8 operator|(I8 a, I8 b) { return {_mm256_or_si256(a.v, b.v)}; }
-ZEL_LANE_AVX2 I8 operator&(I8 a, I8 b) { return {_mm256_and_si256(a.v, b.v)}; }
-ZEL_LANE_AVX2 I8 operator^(I8 a, I8 b) { return {_mm256_xor_si256(a.v, b.v)}; }
-template <int N>
-ZEL_LANE_AVX2 I8 shiftRightArith(I8 a) {
-  return {_mm256_srai_epi32(a.v, N)};
-}
-template <int N>
-ZEL_LANE_AVX2 I8 shiftLeft(I8 a) {
-  return {_mm256_slli_epi32(a.v, N)};
-}
-ZEL_LANE_AVX2 I8 imin(I8 a, I8 b) { return {_mm256_min_epi32(a.v, b.v)}; }
-ZEL_LANE_AVX2 I8 imax(I8 a, I8 b) { return {_mm256_max_epi32(a.v, b.v)}; }
-ZEL_LANE_AVX2 I8 ieq(I8 a, I8 b) { return {_mm256_cmpeq_epi32(a.v, b.v)}; }
-ZEL_LANE_AVX2 I8 iselect(I8 mask, I8 a, I8 b) { return {_mm256_blendv_epi8(b.v, a.v, mask.v)}; }
-ZEL_LANE_AVX2 I8 iselect(F8 mask, I8 a, I8 b) { return iselect(asInt(mask), a, b); }
-ZEL_LANE_AVX2 I8 multiplyAddPairs(I8 a, I8 b) { return {_mm256_madd_epi16(a.v, b.v)}; }
+ZEL_LANE_ARITHMETIC(F8, I8, ZEL_LANE_AVX2, _mm256, 256)
 
 // Eight pairs, each one 64-bit read: cheaper than two gathers of floats.
 ZEL_LANE_AVX2 void gatherPairs(const float (*table)[2], I8 index, F8& c, F8& w) {
   alignas(32) int32_t at[8];
   _mm256_store_si256(reinterpret_cast<__m256i*>(at), index.v);
-  auto pair = [&](int k) { return _mm_castpd_ps(_mm_load_sd(reinterpret_cast<const double*>(table[at[k]]))); };
-  auto high = [&](__m128 lo, int k) { return _mm_loadh_pi(lo, reinterpret_cast<const __m64*>(table[at[k]])); };
   // [c0 w0 c1 w1 | c4 w4 c5 w5] and [c2 w2 c3 w3 | c6 w6 c7 w7].
-  const __m256 a = _mm256_insertf128_ps(_mm256_castps128_ps256(high(pair(0), 1)), high(pair(4), 5), 1);
-  const __m256 b = _mm256_insertf128_ps(_mm256_castps128_ps256(high(pair(2), 3)), high(pair(6), 7), 1);
+  const __m256 a = _mm256_insertf128_ps(_mm256_castps128_ps256(pairsAt(table, at, 0)), pairsAt(table, at, 4), 1);
+  const __m256 b = _mm256_insertf128_ps(_mm256_castps128_ps256(pairsAt(table, at, 2)), pairsAt(table, at, 6), 1);
   c.v = _mm256_shuffle_ps(a, b, _MM_SHUFFLE(2, 0, 2, 0));
   w.v = _mm256_shuffle_ps(a, b, _MM_SHUFFLE(3, 1, 3, 1));
 }
@@ -378,6 +352,14 @@ ZEL_LANE_AVX2 void loadBytes3(const uint8_t* p, I8& c0, I8& c1, I8& c2) {
                                                  -1, -1, 5, -1, -1, -1, 8, -1, -1, -1, 11, -1, -1, -1));
 }
 
+// Twelve bytes at the start of each 128-bit half back to 24 bytes, written
+// exactly.
+ZEL_LANE_AVX2 void storeLanesAsBytes3(uint8_t* p, __m256i v) {
+  const __m128i lo = _mm256_castsi256_si128(v), hi = _mm256_extracti128_si256(v, 1);
+  _mm_storeu_si128(reinterpret_cast<__m128i*>(p), _mm_or_si128(lo, _mm_slli_si128(hi, 12)));
+  _mm_storel_epi64(reinterpret_cast<__m128i*>(p + 16), _mm_srli_si128(hi, 4));
+}
+
 // The low byte of each lane back to its place; 24 bytes written.
 ZEL_LANE_AVX2 void storeBytes3(uint8_t* p, I8 c0, I8 c1, I8 c2) {
   const __m256i v = _mm256_or_si256(
@@ -389,9 +371,7 @@ ZEL_LANE_AVX2 void storeBytes3(uint8_t* p, I8 c0, I8 c1, I8 c2) {
                                                                  -1, -1, -1))),
       _mm256_shuffle_epi8(c2.v, _mm256_setr_epi8(-1, -1, 0, -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1, -1, -1, 0,
                                                  -1, -1, 4, -1, -1, 8, -1, -1, 12, -1, -1, -1, -1)));
-  const __m128i lo = _mm256_castsi256_si128(v), hi = _mm256_extracti128_si256(v, 1);
-  _mm_storeu_si128(reinterpret_cast<__m128i*>(p), _mm_or_si128(lo, _mm_slli_si128(hi, 12)));
-  _mm_storel_epi64(reinterpret_cast<__m128i*>(p + 16), _mm_srli_si128(hi, 4));
+  storeLanesAsBytes3(p, v);
 }
 
 template <int Stride, bool Bias16, typename T>
@@ -439,11 +419,7 @@ ZEL_LANE_AVX2 void loadPixels(const T* p, F8& c0, F8& c1, F8& c2) {
   }
   I8 r0, r1, r2;
   loadRaw<Stride, Bias16>(p, r0, r1, r2);
-  if constexpr (sizeof(T) == 4) {
-    c0 = asFloat(r0), c1 = asFloat(r1), c2 = asFloat(r2);
-  } else {
-    c0 = toFloat(r0), c1 = toFloat(r1), c2 = toFloat(r2);
-  }
+  c0 = samplesAsFloat<T>(r0), c1 = samplesAsFloat<T>(r1), c2 = samplesAsFloat<T>(r2);
 }
 
 template <int Stride, bool Bias16, typename T>
@@ -507,18 +483,6 @@ ZEL_LANE_AVX2 void getPixels(const spaces::RowStores& how, const T* p, F8& c0, F
 // three bytes pack with saturation and take one shuffle; other shapes clamp
 // and store the low bytes.
 template <int Stride>
-ZEL_LANE void storeClampedBytes(uint8_t* p, I4 c0, I4 c1, I4 c2);
-template <int Stride>
-ZEL_LANE_AVX2 void storeClampedBytes(uint8_t* p, I8 c0, I8 c1, I8 c2);
-
-// Integer results clamped to the range of a sample: SaturateU8 (also after
-// SaturateS16, which it absorbs) and SaturateU16.
-ZEL_LANE I4 clampToByte(I4 x) { return imax(imin(x, I4::splat(255)), I4::splat(0)); }
-ZEL_LANE I4 clampToWord(I4 x) { return imax(imin(x, I4::splat(65535)), I4::splat(0)); }
-ZEL_LANE_AVX2 I8 clampToByte(I8 x) { return imax(imin(x, I8::splat(255)), I8::splat(0)); }
-ZEL_LANE_AVX2 I8 clampToWord(I8 x) { return imax(imin(x, I8::splat(65535)), I8::splat(0)); }
-
-template <int Stride>
 ZEL_LANE void storeClampedBytes(uint8_t* p, I4 c0, I4 c1, I4 c2) {
   storeRaw<Stride, false>(p, clampToByte(c0), clampToByte(c1), clampToByte(c2));
 }
@@ -528,15 +492,15 @@ ZEL_LANE_AVX2 void storeClampedBytes(uint8_t* p, I8 c0, I8 c1, I8 c2) {
     // Per half: c0 of four pixels, c1, c2, c2 again, as saturated bytes.
     const __m256i words01 = _mm256_packs_epi32(c0.v, c1.v), words22 = _mm256_packs_epi32(c2.v, c2.v);
     const __m256i bytes = _mm256_packus_epi16(words01, words22);
-    const __m256i v = _mm256_shuffle_epi8(bytes, _mm256_setr_epi8(0, 4, 8, 1, 5, 9, 2, 6, 10, 3, 7, 11, -1, -1, -1, -1, 0,
-                                                                  4, 8, 1, 5, 9, 2, 6, 10, 3, 7, 11, -1, -1, -1, -1));
-    const __m128i lo = _mm256_castsi256_si128(v), hi = _mm256_extracti128_si256(v, 1);
-    _mm_storeu_si128(reinterpret_cast<__m128i*>(p), _mm_or_si128(lo, _mm_slli_si128(hi, 12)));
-    _mm_storel_epi64(reinterpret_cast<__m128i*>(p + 16), _mm_srli_si128(hi, 4));
+    storeLanesAsBytes3(p, _mm256_shuffle_epi8(bytes, _mm256_setr_epi8(0, 4, 8, 1, 5, 9, 2, 6, 10, 3, 7, 11, -1, -1, -1,
+                                                                      -1, 0, 4, 8, 1, 5, 9, 2, 6, 10, 3, 7, 11, -1, -1,
+                                                                      -1, -1)));
   } else {
     storeRaw<Stride, false>(p, clampToByte(c0), clampToByte(c1), clampToByte(c2));
   }
 }
+
+ZEL_TIER512_BEGIN
 
 // ---------------------------------------------------------------- 16 lanes
 //
@@ -562,22 +526,10 @@ struct F16 {
   static ZEL_LANE_AVX512 F16 splat(float x) { return {_mm512_set1_ps(x)}; }
 };
 
-ZEL_LANE_AVX512 F16 operator+(F16 a, F16 b) { return {_mm512_add_ps(a.v, b.v)}; }
-ZEL_LANE_AVX512 F16 operator-(F16 a, F16 b) { return {_mm512_sub_ps(a.v, b.v)}; }
-ZEL_LANE_AVX512 F16 operator*(F16 a, F16 b) { return {_mm512_mul_ps(a.v, b.v)}; }
-ZEL_LANE_AVX512 F16 operator/(F16 a, F16 b) { return {_mm512_div_ps(a.v, b.v)}; }
-// VMINPS / VMAXPS keep the legacy rule: the second operand when the
-// comparison fails.
-ZEL_LANE_AVX512 F16 vmin(F16 a, F16 b) { return {_mm512_min_ps(a.v, b.v)}; }
-ZEL_LANE_AVX512 F16 vmax(F16 a, F16 b) { return {_mm512_max_ps(a.v, b.v)}; }
 ZEL_LANE_AVX512 F16 approxRcp(F16 a) {
   const __m256 lo = _mm256_rcp_ps(_mm512_castps512_ps256(a.v));
   const __m256 hi = _mm256_rcp_ps(_mm512_extractf32x8_ps(a.v, 1));
   return {_mm512_insertf32x8(_mm512_castps256_ps512(lo), hi, 1)};
-}
-ZEL_LANE_AVX512 F16 refinedRcp(F16 x) {
-  const F16 r = approxRcp(x);
-  return (r + r) - ((x * r) * r);
 }
 ZEL_LANE_AVX512 F16 vabs(F16 a) { return {_mm512_abs_ps(a.v)}; }
 ZEL_LANE_AVX512 M16 eq(F16 a, F16 b) { return {_mm512_cmp_ps_mask(a.v, b.v, _CMP_EQ_OQ)}; }
@@ -593,45 +545,20 @@ ZEL_LANE_AVX512 F16 maskAnd(M16 m, F16 a) { return {_mm512_maskz_mov_ps(m.k, a.v
 ZEL_LANE_AVX512 F16 select(M16 m, F16 a, F16 b) { return {_mm512_mask_blend_ps(m.k, b.v, a.v)}; }
 ZEL_LANE_AVX512 F16 clearWhere(M16 m, F16 a) { return {_mm512_maskz_mov_ps(__mmask16(~m.k), a.v)}; }
 ZEL_LANE_AVX512 M16 clearWhere(M16 m, M16 a) { return {__mmask16(a.k & ~m.k)}; }
-ZEL_LANE_AVX512 I16 roundEven(F16 a) { return {_mm512_cvtps_epi32(a.v)}; }
-ZEL_LANE_AVX512 I16 truncate(F16 a) { return {_mm512_cvttps_epi32(a.v)}; }
-ZEL_LANE_AVX512 F16 toFloat(I16 a) { return {_mm512_cvtepi32_ps(a.v)}; }
-ZEL_LANE_AVX512 F16 asFloat(I16 a) { return {_mm512_castsi512_ps(a.v)}; }
-ZEL_LANE_AVX512 I16 asInt(F16 a) { return {_mm512_castps_si512(a.v)}; }
-
-ZEL_LANE_AVX512 I16 operator+(I16 a, I16 b) { return {_mm512_add_epi32(a.v, b.v)}; }
-ZEL_LANE_AVX512 I16 operator-(I16 a, I16 b) { return {_mm512_sub_epi32(a.v, b.v)}; }
-ZEL_LANE_AVX512 I16 operator|(I16 a, I16 b) { return {_mm512_or_si512(a.v, b.v)}; }
-ZEL_LANE_AVX512 I16 operator&(I16 a, I16 b) { return {_mm512_and_si512(a.v, b.v)}; }
-ZEL_LANE_AVX512 I16 operator^(I16 a, I16 b) { return {_mm512_xor_si512(a.v, b.v)}; }
-template <int N>
-ZEL_LANE_AVX512 I16 shiftRightArith(I16 a) {
-  return {_mm512_srai_epi32(a.v, N)};
-}
-template <int N>
-ZEL_LANE_AVX512 I16 shiftLeft(I16 a) {
-  return {_mm512_slli_epi32(a.v, N)};
-}
-ZEL_LANE_AVX512 I16 imin(I16 a, I16 b) { return {_mm512_min_epi32(a.v, b.v)}; }
-ZEL_LANE_AVX512 I16 imax(I16 a, I16 b) { return {_mm512_max_epi32(a.v, b.v)}; }
 ZEL_LANE_AVX512 M16 ieq(I16 a, I16 b) { return {_mm512_cmpeq_epi32_mask(a.v, b.v)}; }
 ZEL_LANE_AVX512 I16 iselect(M16 m, I16 a, I16 b) { return {_mm512_mask_blend_epi32(m.k, b.v, a.v)}; }
-ZEL_LANE_AVX512 I16 multiplyAddPairs(I16 a, I16 b) { return {_mm512_madd_epi16(a.v, b.v)}; }
-ZEL_LANE_AVX512 I16 clampToByte(I16 x) { return imax(imin(x, I16::splat(255)), I16::splat(0)); }
-ZEL_LANE_AVX512 I16 clampToWord(I16 x) { return imax(imin(x, I16::splat(65535)), I16::splat(0)); }
+ZEL_LANE_ARITHMETIC(F16, I16, ZEL_LANE_AVX512, _mm512, 512)
 
 // Sixteen (c, w) pairs, each one 64-bit read, as the narrower forms.
 ZEL_LANE_AVX512 void gatherPairs(const float (*table)[2], I16 index, F16& c, F16& w) {
   alignas(64) int32_t at[16];
   _mm512_store_si512(at, index.v);
-  auto pair = [&](int k) { return _mm_castpd_ps(_mm_load_sd(reinterpret_cast<const double*>(table[at[k]]))); };
-  auto high = [&](__m128 lo, int k) { return _mm_loadh_pi(lo, reinterpret_cast<const __m64*>(table[at[k]])); };
   // Quarters [c0 w0 c1 w1 | c4 w4 c5 w5 | c8 .. | c12 ..] and the same
   // from pixels 2, 3, 6, 7, ...
-  __m512 a = _mm512_castps128_ps512(high(pair(0), 1)), b = _mm512_castps128_ps512(high(pair(2), 3));
-  a = _mm512_insertf32x4(a, high(pair(4), 5), 1), b = _mm512_insertf32x4(b, high(pair(6), 7), 1);
-  a = _mm512_insertf32x4(a, high(pair(8), 9), 2), b = _mm512_insertf32x4(b, high(pair(10), 11), 2);
-  a = _mm512_insertf32x4(a, high(pair(12), 13), 3), b = _mm512_insertf32x4(b, high(pair(14), 15), 3);
+  __m512 a = _mm512_castps128_ps512(pairsAt(table, at, 0)), b = _mm512_castps128_ps512(pairsAt(table, at, 2));
+  a = _mm512_insertf32x4(a, pairsAt(table, at, 4), 1), b = _mm512_insertf32x4(b, pairsAt(table, at, 6), 1);
+  a = _mm512_insertf32x4(a, pairsAt(table, at, 8), 2), b = _mm512_insertf32x4(b, pairsAt(table, at, 10), 2);
+  a = _mm512_insertf32x4(a, pairsAt(table, at, 12), 3), b = _mm512_insertf32x4(b, pairsAt(table, at, 14), 3);
   c.v = _mm512_shuffle_ps(a, b, _MM_SHUFFLE(2, 0, 2, 0));
   w.v = _mm512_shuffle_ps(a, b, _MM_SHUFFLE(3, 1, 3, 1));
 }
@@ -831,5 +758,7 @@ ZEL_LANE_AVX512 void getPixels(const spaces::RowStores& how, const T* p, F16& c0
   }
   loadPixels<Stride, Bias16>(p, c0, c1, c2);
 }
+
+ZEL_TIER512_END
 
 }  // namespace zel::lanes

@@ -137,6 +137,7 @@ namespace avx2 {
 
 #pragma GCC push_options
 #pragma GCC target("avx2,avx512f,avx512bw,avx512vl,avx512dq")
+ZEL_TIER512_BEGIN
 
 // Sixteen lanes, masks in mask registers; used by the float members with
 // three-float pixels (whole vectors in and out), where the arithmetic
@@ -211,6 +212,7 @@ namespace avx512 {
 #include "spaces/hls_vector.inl"
 }  // namespace avx512
 
+ZEL_TIER512_END
 #pragma GCC pop_options
 
 namespace {

@@ -10,6 +10,7 @@ namespace zel::spaces::hsv {
 #define ZEL_BLOCKS "spaces/hsv_blocks.inc"
 #include "spaces/both_widths.inc"
 
+ZEL_TIER512_BEGIN
 namespace avx512 {
 
 // The inverse of bytes in 16 lanes. p, q and t are formed as in every
@@ -76,6 +77,7 @@ ZEL_AVX512 int hsvToRgbBytes(const uint8_t* s, uint8_t* d, int n) {
 }
 
 }  // namespace avx512
+ZEL_TIER512_END
 
 // Lanes::Avx512 takes the 16-lane bodies of the byte members; the 16-bit
 // inverse stays at 8 lanes.
