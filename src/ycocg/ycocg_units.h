@@ -14,18 +14,26 @@
 #include <cstdint>
 
 #include "frame/lane_shuffle.h"
+#include "frame/lane_units.h"
 #include "frame/simd.h"
 
 // 256-bit values only pass between helpers the flattened AVX2 kernels
 // inline; none crosses a real call.
 #pragma GCC diagnostic ignored "-Wpsabi"
-// The 512-bit intrinsics start some results from an undefined vector, which
-// the compiler then reports as maybe uninitialised; nothing reads one.
-#if defined(__GNUC__) && !defined(__clang__)
-#pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
-#endif
 
 namespace zel::ycocg {
+
+// Every chunk of the group at p, one at a time, and back: the group moves of
+// a unit (ON its target marker) that has no wider ones.
+#define ZEL_YCOCG_GROUP_BY_CHUNKS(ON)                                     \
+  template <class G>                                                      \
+  ON static void getGroup(const uint8_t* p, V* chunks) {                  \
+    for (int i = 0; i < G::kChunks; ++i) chunks[i] = chunk<G>(p, i);      \
+  }                                                                       \
+  template <class G, bool Stream>                                         \
+  ON static void putGroup(uint8_t* p, const V* chunks) {                  \
+    for (int i = 0; i < G::kChunks; ++i) put<G, Stream>(p, i, chunks[i]); \
+  }
 
 struct Sse {
   using V = __m128i;
@@ -46,55 +54,15 @@ struct Sse {
   static void put(uint8_t* p, int i, V v) {
     G::template put<Stream>(p, i, v);
   }
-  // Every chunk of the group at p, and back.
-  template <class G>
-  static void getGroup(const uint8_t* p, V* chunks) {
-    for (int i = 0; i < G::kChunks; ++i) chunks[i] = chunk<G>(p, i);
-  }
-  template <class G, bool Stream>
-  static void putGroup(uint8_t* p, const V* chunks) {
-    for (int i = 0; i < G::kChunks; ++i) put<G, Stream>(p, i, chunks[i]);
-  }
+  ZEL_YCOCG_GROUP_BY_CHUNKS()
   static V mask(const ByteMask& m) { return maskOf(m); }
 
-  static V set16(int v) { return _mm_set1_epi16(static_cast<int16_t>(v)); }
-  static V set32(int32_t v) { return _mm_set1_epi32(v); }
-  static V ones() { return _mm_set1_epi32(-1); }
-  static V add16(V a, V b) { return _mm_add_epi16(a, b); }
-  static V sub16(V a, V b) { return _mm_sub_epi16(a, b); }
-  static V addSatS16(V a, V b) { return _mm_adds_epi16(a, b); }
-  template <int N>
-  static V sra16(V a) {
-    return _mm_srai_epi16(a, N);
-  }
-  static V add32(V a, V b) { return _mm_add_epi32(a, b); }
-  static V sub32(V a, V b) { return _mm_sub_epi32(a, b); }
-  template <int N>
-  static V sra32(V a) {
-    return _mm_srai_epi32(a, N);
-  }
-  static V and_(V a, V b) { return _mm_and_si128(a, b); }
-  static V or_(V a, V b) { return _mm_or_si128(a, b); }
-  static V xor_(V a, V b) { return _mm_xor_si128(a, b); }
-  static V shuffle8(V a, V m) { return _mm_shuffle_epi8(a, m); }
+  ZEL_UNIT_LANE_OPS(, _mm, 128)
   template <int Imm>
   static V blend16(V a, V b) {
     return _mm_blend_epi16(a, b, Imm);
   }
-  static V packU8(V a, V b) { return _mm_packus_epi16(a, b); }
-  static V set8(int v) { return _mm_set1_epi8(static_cast<int8_t>(v)); }
-  static V sub8(V a, V b) { return _mm_sub_epi8(a, b); }
-  static V addSatU8(V a, V b) { return _mm_adds_epu8(a, b); }
-  static V averageU8(V a, V b) { return _mm_avg_epu8(a, b); }
   static V blend8(V a, V b, V m) { return _mm_blendv_epi8(a, b, m); }
-  static V unpackLo8(V a, V b) { return _mm_unpacklo_epi8(a, b); }
-  static V unpackHi8(V a, V b) { return _mm_unpackhi_epi8(a, b); }
-  static V unpackLo16(V a, V b) { return _mm_unpacklo_epi16(a, b); }
-  static V unpackHi16(V a, V b) { return _mm_unpackhi_epi16(a, b); }
-  static V unpackLo32(V a, V b) { return _mm_unpacklo_epi32(a, b); }
-  static V unpackHi32(V a, V b) { return _mm_unpackhi_epi32(a, b); }
-  static V unpackLo64(V a, V b) { return _mm_unpacklo_epi64(a, b); }
-  static V unpackHi64(V a, V b) { return _mm_unpackhi_epi64(a, b); }
   // Signed 16-bit lanes of the first and second half of the pixels to
   // 32-bit lanes; and the low 16 bits of 32-bit lanes back, in order.
   static V widenLo(V v) { return _mm_cvtepi16_epi32(v); }
@@ -131,54 +99,15 @@ struct Avx {
     G::template put<Stream>(p, i, _mm256_castsi256_si128(v));
     G::template put<Stream>(p + G::kBytes, i, _mm256_extracti128_si256(v, 1));
   }
-  template <class G>
-  ZEL_AVX2 static void getGroup(const uint8_t* p, V* chunks) {
-    for (int i = 0; i < G::kChunks; ++i) chunks[i] = chunk<G>(p, i);
-  }
-  template <class G, bool Stream>
-  ZEL_AVX2 static void putGroup(uint8_t* p, const V* chunks) {
-    for (int i = 0; i < G::kChunks; ++i) put<G, Stream>(p, i, chunks[i]);
-  }
+  ZEL_YCOCG_GROUP_BY_CHUNKS(ZEL_AVX2)
   ZEL_AVX2 static V mask(const ByteMask& m) { return _mm256_broadcastsi128_si256(maskOf(m)); }
 
-  ZEL_AVX2 static V set16(int v) { return _mm256_set1_epi16(static_cast<int16_t>(v)); }
-  ZEL_AVX2 static V set32(int32_t v) { return _mm256_set1_epi32(v); }
-  ZEL_AVX2 static V ones() { return _mm256_set1_epi32(-1); }
-  ZEL_AVX2 static V add16(V a, V b) { return _mm256_add_epi16(a, b); }
-  ZEL_AVX2 static V sub16(V a, V b) { return _mm256_sub_epi16(a, b); }
-  ZEL_AVX2 static V addSatS16(V a, V b) { return _mm256_adds_epi16(a, b); }
-  template <int N>
-  ZEL_AVX2 static V sra16(V a) {
-    return _mm256_srai_epi16(a, N);
-  }
-  ZEL_AVX2 static V add32(V a, V b) { return _mm256_add_epi32(a, b); }
-  ZEL_AVX2 static V sub32(V a, V b) { return _mm256_sub_epi32(a, b); }
-  template <int N>
-  ZEL_AVX2 static V sra32(V a) {
-    return _mm256_srai_epi32(a, N);
-  }
-  ZEL_AVX2 static V and_(V a, V b) { return _mm256_and_si256(a, b); }
-  ZEL_AVX2 static V or_(V a, V b) { return _mm256_or_si256(a, b); }
-  ZEL_AVX2 static V xor_(V a, V b) { return _mm256_xor_si256(a, b); }
-  ZEL_AVX2 static V shuffle8(V a, V m) { return _mm256_shuffle_epi8(a, m); }
+  ZEL_UNIT_LANE_OPS(ZEL_AVX2, _mm256, 256)
   template <int Imm>
   ZEL_AVX2 static V blend16(V a, V b) {
     return _mm256_blend_epi16(a, b, Imm);
   }
-  ZEL_AVX2 static V packU8(V a, V b) { return _mm256_packus_epi16(a, b); }
-  ZEL_AVX2 static V set8(int v) { return _mm256_set1_epi8(static_cast<int8_t>(v)); }
-  ZEL_AVX2 static V sub8(V a, V b) { return _mm256_sub_epi8(a, b); }
-  ZEL_AVX2 static V addSatU8(V a, V b) { return _mm256_adds_epu8(a, b); }
-  ZEL_AVX2 static V averageU8(V a, V b) { return _mm256_avg_epu8(a, b); }
   ZEL_AVX2 static V blend8(V a, V b, V m) { return _mm256_blendv_epi8(a, b, m); }
-  ZEL_AVX2 static V unpackLo8(V a, V b) { return _mm256_unpacklo_epi8(a, b); }
-  ZEL_AVX2 static V unpackHi8(V a, V b) { return _mm256_unpackhi_epi8(a, b); }
-  ZEL_AVX2 static V unpackLo16(V a, V b) { return _mm256_unpacklo_epi16(a, b); }
-  ZEL_AVX2 static V unpackHi16(V a, V b) { return _mm256_unpackhi_epi16(a, b); }
-  ZEL_AVX2 static V unpackLo32(V a, V b) { return _mm256_unpacklo_epi32(a, b); }
-  ZEL_AVX2 static V unpackHi32(V a, V b) { return _mm256_unpackhi_epi32(a, b); }
-  ZEL_AVX2 static V unpackLo64(V a, V b) { return _mm256_unpacklo_epi64(a, b); }
-  ZEL_AVX2 static V unpackHi64(V a, V b) { return _mm256_unpackhi_epi64(a, b); }
   ZEL_AVX2 static V widenLo(V v) { return _mm256_cvtepi16_epi32(_mm256_castsi256_si128(v)); }
   ZEL_AVX2 static V widenHi(V v) { return _mm256_cvtepi16_epi32(_mm256_extracti128_si256(v, 1)); }
   ZEL_AVX2 static V narrowLow(V lo, V hi) {
@@ -187,6 +116,8 @@ struct Avx {
     return _mm256_permute4x64_epi64(packed, 0xD8);
   }
 };
+
+ZEL_TIER512_BEGIN
 
 // The 512-bit tier: one register, 32 pixels (lane k pixels 8k..8k+7), the
 // same lane arithmetic. Byte layouts move whole groups with dword permutes
@@ -291,44 +222,12 @@ struct Avx512 {
   }
   ZEL_AVX512 static V mask(const ByteMask& m) { return _mm512_broadcast_i32x4(maskOf(m)); }
 
-  ZEL_AVX512 static V set16(int v) { return _mm512_set1_epi16(static_cast<int16_t>(v)); }
-  ZEL_AVX512 static V set32(int32_t v) { return _mm512_set1_epi32(v); }
-  ZEL_AVX512 static V ones() { return _mm512_set1_epi32(-1); }
-  ZEL_AVX512 static V add16(V a, V b) { return _mm512_add_epi16(a, b); }
-  ZEL_AVX512 static V sub16(V a, V b) { return _mm512_sub_epi16(a, b); }
-  ZEL_AVX512 static V addSatS16(V a, V b) { return _mm512_adds_epi16(a, b); }
-  template <int N>
-  ZEL_AVX512 static V sra16(V a) {
-    return _mm512_srai_epi16(a, N);
-  }
-  ZEL_AVX512 static V add32(V a, V b) { return _mm512_add_epi32(a, b); }
-  ZEL_AVX512 static V sub32(V a, V b) { return _mm512_sub_epi32(a, b); }
-  template <int N>
-  ZEL_AVX512 static V sra32(V a) {
-    return _mm512_srai_epi32(a, N);
-  }
-  ZEL_AVX512 static V and_(V a, V b) { return _mm512_and_si512(a, b); }
-  ZEL_AVX512 static V or_(V a, V b) { return _mm512_or_si512(a, b); }
-  ZEL_AVX512 static V xor_(V a, V b) { return _mm512_xor_si512(a, b); }
-  ZEL_AVX512 static V shuffle8(V a, V m) { return _mm512_shuffle_epi8(a, m); }
+  ZEL_UNIT_LANE_OPS(ZEL_AVX512, _mm512, 512)
   template <int Imm>
   ZEL_AVX512 static V blend16(V a, V b) {
     return _mm512_mask_blend_epi16(__mmask32(uint32_t(Imm & 0xFF) * 0x01010101u), a, b);
   }
-  ZEL_AVX512 static V packU8(V a, V b) { return _mm512_packus_epi16(a, b); }
-  ZEL_AVX512 static V set8(int v) { return _mm512_set1_epi8(static_cast<int8_t>(v)); }
-  ZEL_AVX512 static V sub8(V a, V b) { return _mm512_sub_epi8(a, b); }
-  ZEL_AVX512 static V addSatU8(V a, V b) { return _mm512_adds_epu8(a, b); }
-  ZEL_AVX512 static V averageU8(V a, V b) { return _mm512_avg_epu8(a, b); }
   ZEL_AVX512 static V blend8(V a, V b, V m) { return _mm512_mask_blend_epi8(_mm512_movepi8_mask(m), a, b); }
-  ZEL_AVX512 static V unpackLo8(V a, V b) { return _mm512_unpacklo_epi8(a, b); }
-  ZEL_AVX512 static V unpackHi8(V a, V b) { return _mm512_unpackhi_epi8(a, b); }
-  ZEL_AVX512 static V unpackLo16(V a, V b) { return _mm512_unpacklo_epi16(a, b); }
-  ZEL_AVX512 static V unpackHi16(V a, V b) { return _mm512_unpackhi_epi16(a, b); }
-  ZEL_AVX512 static V unpackLo32(V a, V b) { return _mm512_unpacklo_epi32(a, b); }
-  ZEL_AVX512 static V unpackHi32(V a, V b) { return _mm512_unpackhi_epi32(a, b); }
-  ZEL_AVX512 static V unpackLo64(V a, V b) { return _mm512_unpacklo_epi64(a, b); }
-  ZEL_AVX512 static V unpackHi64(V a, V b) { return _mm512_unpackhi_epi64(a, b); }
   ZEL_AVX512 static V widenLo(V v) { return _mm512_cvtepi16_epi32(_mm512_castsi512_si256(v)); }
   ZEL_AVX512 static V widenHi(V v) { return _mm512_cvtepi16_epi32(_mm512_extracti64x4_epi64(v, 1)); }
   ZEL_AVX512 static V narrowLow(V lo, V hi) {
@@ -337,6 +236,8 @@ struct Avx512 {
     return _mm512_permutexvar_epi64(_mm512_setr_epi64(0, 2, 4, 6, 1, 3, 5, 7), packed);
   }
 };
+
+ZEL_TIER512_END
 
 // ---- interleaved pixels to and from one vector of 16-bit lanes a channel ----
 
