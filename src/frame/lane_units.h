@@ -50,23 +50,15 @@
   ON static V mulLo16(V a, V b) { return MM##_mullo_epi16(a, b); }              \
   ON static V madd16(V a, V b) { return MM##_madd_epi16(a, b); }                \
   template <int N>                                                              \
-  ON static V sra16(V a) {                                                      \
-    return MM##_srai_epi16(a, N);                                               \
-  }                                                                             \
+  ON static V sra16(V a) { return MM##_srai_epi16(a, N); }                      \
   template <int N>                                                              \
-  ON static V srl16(V a) {                                                      \
-    return MM##_srli_epi16(a, N);                                               \
-  }                                                                             \
+  ON static V srl16(V a) { return MM##_srli_epi16(a, N); }                      \
   template <int N>                                                              \
-  ON static V sll16(V a) {                                                      \
-    return MM##_slli_epi16(a, N);                                               \
-  }                                                                             \
+  ON static V sll16(V a) { return MM##_slli_epi16(a, N); }                      \
+  template <int N>                                                              \
+  ON static V sra32(V a) { return MM##_srai_epi32(a, N); }                      \
   ON static V add32(V a, V b) { return MM##_add_epi32(a, b); }                  \
   ON static V sub32(V a, V b) { return MM##_sub_epi32(a, b); }                  \
-  template <int N>                                                              \
-  ON static V sra32(V a) {                                                      \
-    return MM##_srai_epi32(a, N);                                               \
-  }                                                                             \
   ON static V and_(V a, V b) { return MM##_and_si##BITS(a, b); }                \
   ON static V or_(V a, V b) { return MM##_or_si##BITS(a, b); }                  \
   ON static V xor_(V a, V b) { return MM##_xor_si##BITS(a, b); }                \

@@ -294,7 +294,7 @@ ZEL_INLINE Quads<U> quadsOf(const PackedIn<4>& in, int x) {
   for (int k = 0; k < 4; ++k) {
     const V c = QuadOrder<U>::chunk4(in.p + 4 * x, k);
     q.lo[k] = U::template sll16<8>(c);
-    q.hi[k] = M::and_(c, high);
+    q.hi[k] = U::and_(c, high);
     q.pairs[k] = M::pairSums32(U::shuffle8(c, pairs));
   }
   return q;
@@ -381,9 +381,9 @@ ZEL_INLINE int quadPairBlocks(const PackedIn<Stride>& topIn, const PackedIn<Stri
       for (int k = 0; k < 4; ++k) s[k] = r ? U::add16(s[k], q.pairs[k]) : q.pairs[k];
     }
     // s[k]: channel 0 of blocks 2k, 2k + 1, channel 1 of them, channel 2.
-    const V a = M::unpackLo32(s[0], s[1]), b = M::unpackHi32(s[0], s[1]);
-    const V c = M::unpackLo32(s[2], s[3]), d = M::unpackHi32(s[2], s[3]);
-    const V ch0 = M::unpackLo64(a, c), ch1 = M::unpackHi64(a, c), ch2 = M::unpackLo64(b, d);
+    const V a = U::unpackLo32(s[0], s[1]), b = U::unpackHi32(s[0], s[1]);
+    const V c = U::unpackLo32(s[2], s[3]), d = U::unpackHi32(s[2], s[3]);
+    const V ch0 = U::unpackLo64(a, c), ch1 = U::unpackHi64(a, c), ch2 = U::unpackLo64(b, d);
     V c1, c2;
     body.template chromaOf32<U>(Bgr ? ch2 : ch0, ch1, Bgr ? ch0 : ch2, c1, c2);
     V cc = U::packU8(c1, c2);

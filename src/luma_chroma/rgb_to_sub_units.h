@@ -43,11 +43,6 @@ struct More<Sse> {
     __builtin_memcpy(lo, &a, 4);
     __builtin_memcpy(hi, &b, 4);
   }
-  static V and_(V a, V b) { return _mm_and_si128(a, b); }
-  static V unpackLo32(V a, V b) { return _mm_unpacklo_epi32(a, b); }
-  static V unpackHi32(V a, V b) { return _mm_unpackhi_epi32(a, b); }
-  static V unpackLo64(V a, V b) { return _mm_unpacklo_epi64(a, b); }
-  static V unpackHi64(V a, V b) { return _mm_unpackhi_epi64(a, b); }
   // Bytes N.. of the 32 bytes lo, hi (hi after lo).
   template <int N>
   static V alignr(V hi, V lo) { return _mm_alignr_epi8(hi, lo, N); }
@@ -73,11 +68,6 @@ struct More<Avx> {
     More<Sse>::storeQuarters(lo, hi, 0, _mm256_castsi256_si128(v));
     More<Sse>::storeQuarters(lo + unitStride, hi + unitStride, 0, _mm256_extracti128_si256(v, 1));
   }
-  ZEL_AVX2 static V and_(V a, V b) { return _mm256_and_si256(a, b); }
-  ZEL_AVX2 static V unpackLo32(V a, V b) { return _mm256_unpacklo_epi32(a, b); }
-  ZEL_AVX2 static V unpackHi32(V a, V b) { return _mm256_unpackhi_epi32(a, b); }
-  ZEL_AVX2 static V unpackLo64(V a, V b) { return _mm256_unpacklo_epi64(a, b); }
-  ZEL_AVX2 static V unpackHi64(V a, V b) { return _mm256_unpackhi_epi64(a, b); }
   template <int N>
   ZEL_AVX2 static V alignr(V hi, V lo) { return _mm256_alignr_epi8(hi, lo, N); }
 };
@@ -138,11 +128,6 @@ struct More<Avx512> {
     const __m128i units[4] = {_mm512_castsi512_si128(v), lane128<1>(v), lane128<2>(v), lane128<3>(v)};
     for (int k = 0; k < 4; ++k) More<Sse>::storeQuarters(lo + k * unitStride, hi + k * unitStride, 0, units[k]);
   }
-  ZEL_AVX512_VBMI static V and_(V a, V b) { return _mm512_and_si512(a, b); }
-  ZEL_AVX512_VBMI static V unpackLo32(V a, V b) { return _mm512_unpacklo_epi32(a, b); }
-  ZEL_AVX512_VBMI static V unpackHi32(V a, V b) { return _mm512_unpackhi_epi32(a, b); }
-  ZEL_AVX512_VBMI static V unpackLo64(V a, V b) { return _mm512_unpacklo_epi64(a, b); }
-  ZEL_AVX512_VBMI static V unpackHi64(V a, V b) { return _mm512_unpackhi_epi64(a, b); }
   template <int N>
   ZEL_AVX512_VBMI static V alignr(V hi, V lo) { return _mm512_alignr_epi8(hi, lo, N); }
 };

@@ -16,6 +16,7 @@
 
 #include <cstdint>
 
+#include "frame/lane_units.h"
 #include "frame/simd.h"
 
 // Avx values pass between helpers that the flattened AVX2 kernels inline;
@@ -43,45 +44,9 @@ struct Sse {
   static void storeUnits(void* p, int, V v) { store128(p, v); }
   static V shuffleOf(const Shuffle16& s) { return load128(s.b); }
 
-  static V zero() { return _mm_setzero_si128(); }
-  static V set16(int v) { return _mm_set1_epi16(static_cast<int16_t>(v)); }
-  static V set8(int v) { return _mm_set1_epi8(static_cast<int8_t>(v)); }
-  static V add16(V a, V b) { return _mm_add_epi16(a, b); }
-  static V sub16(V a, V b) { return _mm_sub_epi16(a, b); }
-  static V addSatS16(V a, V b) { return _mm_adds_epi16(a, b); }
-  static V addSatU16(V a, V b) { return _mm_adds_epu16(a, b); }
-  static V mulHighS16(V a, V b) { return _mm_mulhi_epi16(a, b); }
-  static V mulHighU16(V a, V b) { return _mm_mulhi_epu16(a, b); }
-  static V mulHighRound(V a, V b) { return _mm_mulhrs_epi16(a, b); }
-  template <int N>
-  static V sra16(V a) { return _mm_srai_epi16(a, N); }
-  template <int N>
-  static V srl16(V a) { return _mm_srli_epi16(a, N); }
-  template <int N>
-  static V sll16(V a) { return _mm_slli_epi16(a, N); }
-  static V or_(V a, V b) { return _mm_or_si128(a, b); }
-  static V xor_(V a, V b) { return _mm_xor_si128(a, b); }
+  ZEL_UNIT_LANE_OPS(, _mm, 128)
   // Bytes of b where the mask byte's top bit is set, else of a.
   static V blend8(V a, V b, V m) { return _mm_blendv_epi8(a, b, m); }
-  static V shuffle8(V a, V m) { return _mm_shuffle_epi8(a, m); }
-  static V unpackLo8(V a, V b) { return _mm_unpacklo_epi8(a, b); }
-  static V unpackHi8(V a, V b) { return _mm_unpackhi_epi8(a, b); }
-  static V unpackLo16(V a, V b) { return _mm_unpacklo_epi16(a, b); }
-  static V unpackHi16(V a, V b) { return _mm_unpackhi_epi16(a, b); }
-  // Signed 16-bit lanes to bytes clamped to 0..255: SaturateU8.
-  static V packU8(V lo, V hi) { return _mm_packus_epi16(lo, hi); }
-  // Signed 16-bit lanes to bytes clamped to -128..127: SaturateS8.
-  static V packS8(V lo, V hi) { return _mm_packs_epi16(lo, hi); }
-  // 32-bit lanes, for exact wide forms: pairs of 16-bit lanes times a pair
-  // of constants summed (pmaddwd), and back to 16 bits with saturation.
-  static V set32(int32_t v) { return _mm_set1_epi32(v); }
-  static V mulLo16(V a, V b) { return _mm_mullo_epi16(a, b); }
-  static V madd16(V a, V b) { return _mm_madd_epi16(a, b); }
-  static V add32(V a, V b) { return _mm_add_epi32(a, b); }
-  static V sub32(V a, V b) { return _mm_sub_epi32(a, b); }
-  template <int N>
-  static V sra32(V a) { return _mm_srai_epi32(a, N); }
-  static V packS32(V lo, V hi) { return _mm_packs_epi32(lo, hi); }
 };
 
 struct Avx {
@@ -100,40 +65,8 @@ struct Avx {
   }
   ZEL_AVX2 static V shuffleOf(const Shuffle16& s) { return _mm256_broadcastsi128_si256(load128(s.b)); }
 
-  ZEL_AVX2 static V zero() { return _mm256_setzero_si256(); }
-  ZEL_AVX2 static V set16(int v) { return _mm256_set1_epi16(static_cast<int16_t>(v)); }
-  ZEL_AVX2 static V set8(int v) { return _mm256_set1_epi8(static_cast<int8_t>(v)); }
-  ZEL_AVX2 static V add16(V a, V b) { return _mm256_add_epi16(a, b); }
-  ZEL_AVX2 static V sub16(V a, V b) { return _mm256_sub_epi16(a, b); }
-  ZEL_AVX2 static V addSatS16(V a, V b) { return _mm256_adds_epi16(a, b); }
-  ZEL_AVX2 static V addSatU16(V a, V b) { return _mm256_adds_epu16(a, b); }
-  ZEL_AVX2 static V mulHighS16(V a, V b) { return _mm256_mulhi_epi16(a, b); }
-  ZEL_AVX2 static V mulHighU16(V a, V b) { return _mm256_mulhi_epu16(a, b); }
-  ZEL_AVX2 static V mulHighRound(V a, V b) { return _mm256_mulhrs_epi16(a, b); }
-  template <int N>
-  ZEL_AVX2 static V sra16(V a) { return _mm256_srai_epi16(a, N); }
-  template <int N>
-  ZEL_AVX2 static V srl16(V a) { return _mm256_srli_epi16(a, N); }
-  template <int N>
-  ZEL_AVX2 static V sll16(V a) { return _mm256_slli_epi16(a, N); }
-  ZEL_AVX2 static V or_(V a, V b) { return _mm256_or_si256(a, b); }
-  ZEL_AVX2 static V xor_(V a, V b) { return _mm256_xor_si256(a, b); }
+  ZEL_UNIT_LANE_OPS(ZEL_AVX2, _mm256, 256)
   ZEL_AVX2 static V blend8(V a, V b, V m) { return _mm256_blendv_epi8(a, b, m); }
-  ZEL_AVX2 static V shuffle8(V a, V m) { return _mm256_shuffle_epi8(a, m); }
-  ZEL_AVX2 static V unpackLo8(V a, V b) { return _mm256_unpacklo_epi8(a, b); }
-  ZEL_AVX2 static V unpackHi8(V a, V b) { return _mm256_unpackhi_epi8(a, b); }
-  ZEL_AVX2 static V unpackLo16(V a, V b) { return _mm256_unpacklo_epi16(a, b); }
-  ZEL_AVX2 static V unpackHi16(V a, V b) { return _mm256_unpackhi_epi16(a, b); }
-  ZEL_AVX2 static V packU8(V lo, V hi) { return _mm256_packus_epi16(lo, hi); }
-  ZEL_AVX2 static V packS8(V lo, V hi) { return _mm256_packs_epi16(lo, hi); }
-  ZEL_AVX2 static V set32(int32_t v) { return _mm256_set1_epi32(v); }
-  ZEL_AVX2 static V mulLo16(V a, V b) { return _mm256_mullo_epi16(a, b); }
-  ZEL_AVX2 static V madd16(V a, V b) { return _mm256_madd_epi16(a, b); }
-  ZEL_AVX2 static V add32(V a, V b) { return _mm256_add_epi32(a, b); }
-  ZEL_AVX2 static V sub32(V a, V b) { return _mm256_sub_epi32(a, b); }
-  template <int N>
-  ZEL_AVX2 static V sra32(V a) { return _mm256_srai_epi32(a, N); }
-  ZEL_AVX2 static V packS32(V lo, V hi) { return _mm256_packs_epi32(lo, hi); }
 };
 
 ZEL_TIER512_BEGIN
@@ -183,40 +116,8 @@ struct Avx512 {
   }
   ZEL_AVX512_VBMI static V shuffleOf(const Shuffle16& s) { return everyLane(load128(s.b)); }
 
-  ZEL_AVX512_VBMI static V zero() { return _mm512_setzero_si512(); }
-  ZEL_AVX512_VBMI static V set16(int v) { return _mm512_set1_epi16(static_cast<int16_t>(v)); }
-  ZEL_AVX512_VBMI static V set8(int v) { return _mm512_set1_epi8(static_cast<int8_t>(v)); }
-  ZEL_AVX512_VBMI static V add16(V a, V b) { return _mm512_add_epi16(a, b); }
-  ZEL_AVX512_VBMI static V sub16(V a, V b) { return _mm512_sub_epi16(a, b); }
-  ZEL_AVX512_VBMI static V addSatS16(V a, V b) { return _mm512_adds_epi16(a, b); }
-  ZEL_AVX512_VBMI static V addSatU16(V a, V b) { return _mm512_adds_epu16(a, b); }
-  ZEL_AVX512_VBMI static V mulHighS16(V a, V b) { return _mm512_mulhi_epi16(a, b); }
-  ZEL_AVX512_VBMI static V mulHighU16(V a, V b) { return _mm512_mulhi_epu16(a, b); }
-  ZEL_AVX512_VBMI static V mulHighRound(V a, V b) { return _mm512_mulhrs_epi16(a, b); }
-  template <int N>
-  ZEL_AVX512_VBMI static V sra16(V a) { return _mm512_srai_epi16(a, N); }
-  template <int N>
-  ZEL_AVX512_VBMI static V srl16(V a) { return _mm512_srli_epi16(a, N); }
-  template <int N>
-  ZEL_AVX512_VBMI static V sll16(V a) { return _mm512_slli_epi16(a, N); }
-  ZEL_AVX512_VBMI static V or_(V a, V b) { return _mm512_or_si512(a, b); }
-  ZEL_AVX512_VBMI static V xor_(V a, V b) { return _mm512_xor_si512(a, b); }
+  ZEL_UNIT_LANE_OPS(ZEL_AVX512_VBMI, _mm512, 512)
   ZEL_AVX512_VBMI static V blend8(V a, V b, V m) { return _mm512_mask_blend_epi8(_mm512_movepi8_mask(m), a, b); }
-  ZEL_AVX512_VBMI static V shuffle8(V a, V m) { return _mm512_shuffle_epi8(a, m); }
-  ZEL_AVX512_VBMI static V unpackLo8(V a, V b) { return _mm512_unpacklo_epi8(a, b); }
-  ZEL_AVX512_VBMI static V unpackHi8(V a, V b) { return _mm512_unpackhi_epi8(a, b); }
-  ZEL_AVX512_VBMI static V unpackLo16(V a, V b) { return _mm512_unpacklo_epi16(a, b); }
-  ZEL_AVX512_VBMI static V unpackHi16(V a, V b) { return _mm512_unpackhi_epi16(a, b); }
-  ZEL_AVX512_VBMI static V packU8(V lo, V hi) { return _mm512_packus_epi16(lo, hi); }
-  ZEL_AVX512_VBMI static V packS8(V lo, V hi) { return _mm512_packs_epi16(lo, hi); }
-  ZEL_AVX512_VBMI static V set32(int32_t v) { return _mm512_set1_epi32(v); }
-  ZEL_AVX512_VBMI static V mulLo16(V a, V b) { return _mm512_mullo_epi16(a, b); }
-  ZEL_AVX512_VBMI static V madd16(V a, V b) { return _mm512_madd_epi16(a, b); }
-  ZEL_AVX512_VBMI static V add32(V a, V b) { return _mm512_add_epi32(a, b); }
-  ZEL_AVX512_VBMI static V sub32(V a, V b) { return _mm512_sub_epi32(a, b); }
-  template <int N>
-  ZEL_AVX512_VBMI static V sra32(V a) { return _mm512_srai_epi32(a, N); }
-  ZEL_AVX512_VBMI static V packS32(V lo, V hi) { return _mm512_packs_epi32(lo, hi); }
 };
 
 ZEL_TIER512_END

@@ -22,7 +22,6 @@ namespace zel::unpack {
 
 // The units, with the few operations the readers add.
 struct SseUnit : lc::Sse {
-  static V and_(V a, V b) { return _mm_and_si128(a, b); }
   static V hadd16(V a, V b) { return _mm_hadd_epi16(a, b); }
   // Chroma bytes: `v` holds a lane's eight Cb bytes, then its eight Cr
   // bytes.
@@ -39,7 +38,6 @@ struct SseUnit : lc::Sse {
 };
 
 struct AvxUnit : lc::Avx {
-  ZEL_AVX2 static V and_(V a, V b) { return _mm256_and_si256(a, b); }
   ZEL_AVX2 static V hadd16(V a, V b) { return _mm256_hadd_epi16(a, b); }
   ZEL_AVX2 static void storeHalves(uint8_t* cb, uint8_t* cr, V v) {
     const V q = _mm256_permute4x64_epi64(v, _MM_SHUFFLE(3, 1, 2, 0));  // Cb of both lanes | Cr of both
