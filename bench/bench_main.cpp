@@ -148,7 +148,7 @@ int main(int argc, char** argv) {
       // against a copy of what it reads.
       if (inBytes >= 2 * outBytes) peers.push_back(zel::bench::memcpyPeer(inBytes, "memcpy of the input bytes"));
     }
-    if (zel::bench::streamsItsOutput(name)) peers.push_back(zel::bench::streamingMemcpyPeer(outBytes));
+    if (d->streams) peers.push_back(zel::bench::streamingMemcpyPeer(outBytes));
     for (zel::bench::Peer& peer : peers) {
       const std::string id = name + " | " + peer.label;
       row.peerLabels.push_back(peer.label);

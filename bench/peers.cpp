@@ -572,19 +572,6 @@ Peer streamingMemcpyPeer(size_t bytes) {
           }};
 }
 
-bool streamsItsOutput(const std::string& exportName) {
-  // The repacking members whose kernels stream aligned destinations of large
-  // frames, and three-channel float members whose frames exceed the cache.
-  static const char* const kStreaming[] = {
-      "zeliYCbCr411ToYCbCr422_8u_P2C2R", "zeliYCbCr411ToYCbCr422_8u_P3C2R", "zeliYCbCr411ToYCrCb422_8u_P3C2R",
-      "zeliYCbCr422ToCbYCr422_8u_C2R",   "zeliYCbCr422ToYCbCr411_8u_C2P2R", "zeliYCbCr422ToYCrCb422_8u_C2R",
-      "zeliYCbCr422ToYCrCb422_8u_P3C2R", "zeliYCrCb420ToCbYCr422_8u_P3C2R", "zeliRGBToYCC_32f_C3R",
-      "zeliYCCToRGB_32f_C3R",            "zeliColorTwist_32f_C3R",          "zeliRGBToXYZ_32f_C3R",
-      "zeliXYZToRGB_32f_C3R",            "zeliRGBToHLS_32f_C3R",            "zeliHLSToRGB_32f_C3R"};
-  return std::any_of(std::begin(kStreaming), std::end(kStreaming),
-                     [&](const char* n) { return exportName == n; });
-}
-
 std::vector<Peer> peersOf(const std::string& exportName) {
   auto it = table().find(exportName);
   std::vector<Peer> out = it == table().end() ? std::vector<Peer>{} : it->second();

@@ -24,8 +24,6 @@ Peer memcpyPeer(size_t bytes, const char* label = "memcpy of the output bytes");
 // The same copy with streaming stores, the floor of the exports whose large
 // frames stream their output past the cache.
 Peer streamingMemcpyPeer(size_t bytes);
-// Whether an export streams its output on a 1920x1080 frame.
-bool streamsItsOutput(const std::string& exportName);
 // Exports that have at least one peer.
 std::vector<std::string> exportsWithPeers();
 

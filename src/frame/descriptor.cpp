@@ -242,6 +242,8 @@ bool parseExtras(const std::string& extras, Descriptor& d, std::string& error) {
       d.oneColumnBytes = true;
     } else if (word == "alphawritten") {
       d.writesAlpha = true;
+    } else if (word == "streams") {
+      d.streams = true;
     } else if (word.rfind("planestested=", 0) == 0) {
       // Only the first N entries of a plane array are tested for null.
       d.testedPlanes = std::atoi(word.c_str() + 13);

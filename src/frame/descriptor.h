@@ -109,6 +109,7 @@ struct Descriptor {
   int roomWidth = 0, roomHeight = 0;  // buffers cover at least this size: members that write past a tiny region
   bool warnsOdd = false;        // may return StatusOddSizeWarning
   bool writesAlpha = false;     // an AC4 destination's fourth channel is written
+  bool streams = false;         // large frames write past the caches (streaming stores)
   bool checksSteps = false;
   int testedPlanes = 0;       // plane entries tested for null per array; 0: all
   bool stepsInSamples = false;  // byte steps are cut down to whole samples

@@ -171,6 +171,7 @@ std::string describeExport(const Descriptor& d) {
   o << "  minimum size  " << d.minWidth << "x" << d.minHeight << "\n";
   o << "  odd sizes     " << (d.warnsOdd ? "may return StatusOddSizeWarning after the work" : "no warning") << "\n";
   if (d.writesAlpha) o << "  alpha         the destination's fourth channel is written\n";
+  if (d.streams) o << "  stores        large frames are written with streaming stores, past the caches\n";
   if (readsMosaic(d)) o << "  run input     a Bayer mosaic of the picture, laid out as the grid argument says\n";
 
   o << "  arguments\n";
