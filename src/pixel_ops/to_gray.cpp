@@ -251,6 +251,8 @@ ZEL_AVX2 int blocks256(const T* src, T* dst, int x, int end, WeightsF w) {
                                           kOrder<T, Channels>[3], kOrder<T, Channels>[4], kOrder<T, Channels>[5],
                                           kOrder<T, Channels>[6], kOrder<T, Channels>[7]);
   for (; x + 8 <= end; x += 8) {
+    if constexpr (std::is_same_v<T, float>)
+      _mm_prefetch(reinterpret_cast<const char*>(src + x * Channels) + kPrefetchBytes, _MM_HINT_T0);
     const Lanes8f c = load8<T, Channels>(src + x * Channels);
     const __m256 s = _mm256_add_ps(_mm256_add_ps(_mm256_mul_ps(c.a, w0), _mm256_mul_ps(c.b, w1)), _mm256_mul_ps(c.d, w2));
     if constexpr (std::is_same_v<T, float>) {
@@ -275,7 +277,8 @@ ZEL_AVX2 int blocks256(const T* src, T* dst, int x, int end, WeightsF w) {
 template <typename T, int Channels>
 inline int wideBlocks(const T* src, T* dst, int end, WeightsF w, VectorTier tier) {
   int x = 0;
-  if (tier >= VectorTier::Avx512) x = blocks512<T, Channels>(src, dst, end, w);
+  if constexpr (!std::is_same_v<T, float> || Channels == 4)
+    if (tier >= VectorTier::Avx512) x = blocks512<T, Channels>(src, dst, end, w);
   if (tier >= VectorTier::Avx2) x = blocks256<T, Channels>(src, dst, x, end, w);
   return x;
 }

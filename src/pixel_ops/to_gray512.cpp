@@ -1,4 +1,6 @@
-// The 512-bit blocks of the colour-to-gray family: sixteen pixels a block.
+// The 512-bit blocks of the colour-to-gray family: sixteen pixels a block
+// (not for three-channel floats, which wait on memory: there the AVX2
+// blocks are as fast).
 // Two-register permutes take each channel out of the interleaved pixels,
 // one lane per pixel; every lane then runs the four-pixel block form of its
 // type in the same order. vpmovdw keeps the low 16 bits of a 16u result,
@@ -28,28 +30,6 @@ template <int K>
 constexpr WordSplit<K> kWordSplit{};
 constexpr __mmask32 kLowWordOfLane = 0x55555555u;
 
-// Three-channel floats: sample ch of pixel k is float 3k + ch of three
-// registers. `pair` picks it from the first two, `last` from the third
-// where it lies there (the lanes of mask `fromLast`).
-struct FloatC3Split {
-  alignas(64) int32_t pair[3][16];
-  alignas(64) int32_t last[3][16];
-  uint16_t fromLast[3];
-  constexpr FloatC3Split() : pair{}, last{}, fromLast{} {
-    for (int ch = 0; ch < 3; ++ch)
-      for (int k = 0; k < 16; ++k) {
-        const int at = 3 * k + ch;
-        if (at < 32) {
-          pair[ch][k] = at;
-        } else {
-          last[ch][k] = at - 32;
-          fromLast[ch] = uint16_t(fromLast[ch] | (1u << k));
-        }
-      }
-  }
-};
-constexpr FloatC3Split kFloatC3{};
-
 // Four-channel floats: a pair of registers holds eight pixels. `ab` puts
 // their first samples in lanes 0..7 and their second in lanes 8..15, `d`
 // their third in lanes 0..7.
@@ -68,6 +48,14 @@ constexpr FloatAC4Split kFloatAC4{};
 
 ZEL_AVX512 ZEL_INLINE __m512i table(const void* p) { return _mm512_load_si512(p); }
 
+// 64 bytes as two 32-byte loads: a source off its 64-byte lines then
+// splits every other load instead of every one.
+ZEL_AVX512 ZEL_INLINE __m512i load512(const void* p) {
+  const auto* b = static_cast<const uint8_t*>(p);
+  return _mm512_inserti64x4(_mm512_castsi256_si512(load256(b)), load256(b + 32), 1);
+}
+ZEL_AVX512 ZEL_INLINE __m512 load512f(const float* p) { return _mm512_castsi512_ps(load512(p)); }
+
 struct Lanes16f {
   __m512 a, b, d;
 };
@@ -75,27 +63,16 @@ struct Lanes16f {
 template <typename T, int K>
 ZEL_AVX512 ZEL_INLINE Lanes16f load16(const T* p) {
   if constexpr (std::is_same_v<T, float>) {
-    if constexpr (K == 3) {
-      const __m512 in0 = _mm512_loadu_ps(p), in1 = _mm512_loadu_ps(p + 16), in2 = _mm512_loadu_ps(p + 32);
-      __m512 v[3];
-      for (int ch = 0; ch < 3; ++ch) {
-        const __m512 front = _mm512_permutex2var_ps(in0, table(kFloatC3.pair[ch]), in1);
-        v[ch] = _mm512_mask_permutexvar_ps(front, __mmask16(kFloatC3.fromLast[ch]), table(kFloatC3.last[ch]), in2);
-      }
-      return {v[0], v[1], v[2]};
-    } else {
-      const __m512 in0 = _mm512_loadu_ps(p), in1 = _mm512_loadu_ps(p + 16), in2 = _mm512_loadu_ps(p + 32),
-                   in3 = _mm512_loadu_ps(p + 48);
-      const __m512i ab = table(kFloatAC4.ab), d = table(kFloatAC4.d);
-      const __m512 ab0 = _mm512_permutex2var_ps(in0, ab, in1), ab1 = _mm512_permutex2var_ps(in2, ab, in3);
-      const __m512 d0 = _mm512_permutex2var_ps(in0, d, in1), d1 = _mm512_permutex2var_ps(in2, d, in3);
-      return {_mm512_shuffle_f32x4(ab0, ab1, _MM_SHUFFLE(1, 0, 1, 0)),
-              _mm512_shuffle_f32x4(ab0, ab1, _MM_SHUFFLE(3, 2, 3, 2)),
-              _mm512_shuffle_f32x4(d0, d1, _MM_SHUFFLE(1, 0, 1, 0))};
-    }
+    static_assert(K == 4, "three-channel floats take the AVX2 blocks");
+    const __m512 in0 = load512f(p), in1 = load512f(p + 16), in2 = load512f(p + 32), in3 = load512f(p + 48);
+    const __m512i ab = table(kFloatAC4.ab), d = table(kFloatAC4.d);
+    const __m512 ab0 = _mm512_permutex2var_ps(in0, ab, in1), ab1 = _mm512_permutex2var_ps(in2, ab, in3);
+    const __m512 d0 = _mm512_permutex2var_ps(in0, d, in1), d1 = _mm512_permutex2var_ps(in2, d, in3);
+    return {_mm512_shuffle_f32x4(ab0, ab1, _MM_SHUFFLE(1, 0, 1, 0)), _mm512_shuffle_f32x4(ab0, ab1, _MM_SHUFFLE(3, 2, 3, 2)),
+            _mm512_shuffle_f32x4(d0, d1, _MM_SHUFFLE(1, 0, 1, 0))};
   } else {
-    __m512i lo = _mm512_loadu_si512(p);
-    __m512i hi = K == 3 ? _mm512_zextsi256_si512(load256(p + 32)) : _mm512_loadu_si512(p + 32);
+    __m512i lo = load512(p);
+    __m512i hi = K == 3 ? _mm512_zextsi256_si512(load256(p + 32)) : load512(p + 32);
     if constexpr (std::is_signed_v<T>) {  // s + 32768 in 16 bits
       lo = _mm512_xor_si512(lo, _mm512_set1_epi16(int16_t(0x8000)));
       hi = _mm512_xor_si512(hi, _mm512_set1_epi16(int16_t(0x8000)));
@@ -114,6 +91,8 @@ ZEL_AVX512 int blocks512(const T* src, T* dst, int end, WeightsF w) {
   const __m512 w0 = _mm512_set1_ps(w.w0), w1 = _mm512_set1_ps(w.w1), w2 = _mm512_set1_ps(w.w2);
   int x = 0;
   for (; x + 16 <= end; x += 16) {
+    if constexpr (std::is_same_v<T, float>)
+      _mm_prefetch(reinterpret_cast<const char*>(src + x * Channels) + kPrefetchBytes, _MM_HINT_T0);
     const Lanes16f c = load16<T, Channels>(src + x * Channels);
     const __m512 s = _mm512_add_ps(_mm512_add_ps(_mm512_mul_ps(c.a, w0), _mm512_mul_ps(c.b, w1)), _mm512_mul_ps(c.d, w2));
     if constexpr (std::is_same_v<T, float>) {
@@ -131,7 +110,6 @@ template int blocks512<uint16_t, 3>(const uint16_t*, uint16_t*, int, WeightsF);
 template int blocks512<uint16_t, 4>(const uint16_t*, uint16_t*, int, WeightsF);
 template int blocks512<int16_t, 3>(const int16_t*, int16_t*, int, WeightsF);
 template int blocks512<int16_t, 4>(const int16_t*, int16_t*, int, WeightsF);
-template int blocks512<float, 3>(const float*, float*, int, WeightsF);
 template int blocks512<float, 4>(const float*, float*, int, WeightsF);
 
 }  // namespace zel::gray
