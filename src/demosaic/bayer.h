@@ -21,19 +21,6 @@ inline constexpr int8_t kCfaColours[4][2][2] = {{{kBlue, kGreen}, {kGreen, kRed}
 inline int cfaColour(int grid, int x, int y) { return kCfaColours[grid][y & 1][x & 1]; }
 inline bool isValidGrid(int grid) { return grid >= 0 && grid <= 3; }
 
-// Samples may sit at any byte address (steps are byte counts), so every
-// scalar access goes through memcpy.
-template <typename T>
-inline T loadSample(const T* p) {
-  T v;
-  std::memcpy(&v, p, sizeof v);
-  return v;
-}
-template <typename T>
-inline void storeSample(T* p, T v) {
-  std::memcpy(p, &v, sizeof v);
-}
-
 // A whole mosaic frame: first sample, byte step, size.
 template <typename T>
 struct CfaFrame {

@@ -4,6 +4,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <cstring>
 #include <type_traits>
 
 namespace zel {
@@ -12,6 +13,19 @@ template <typename T>
 inline T* rowAt(T* base, int step, int y) {
   using Byte = std::conditional_t<std::is_const_v<T>, const uint8_t, uint8_t>;
   return reinterpret_cast<T*>(reinterpret_cast<Byte*>(base) + std::ptrdiff_t(y) * step);
+}
+
+// A sample at any byte address: rows of 16-bit and float samples may start
+// anywhere (steps are byte counts), so scalar accesses go through bytes.
+template <typename T>
+inline T loadSample(const T* p) {
+  T v;
+  std::memcpy(&v, p, sizeof v);
+  return v;
+}
+template <typename T>
+inline void storeSample(T* p, T v) {
+  std::memcpy(p, &v, sizeof v);
 }
 
 inline bool isAligned16(const void* p) { return (reinterpret_cast<uintptr_t>(p) & 15u) == 0; }

@@ -5,6 +5,7 @@
 #include <cstring>
 
 #include "frame/export.h"
+#include "frame/image_layout.h"
 #include "frame/stream_stores.h"
 #include "luma_chroma/photo_ycc_forms.h"
 #include "luma_chroma/photo_ycc_kernels.h"
@@ -102,17 +103,6 @@ ZEL_AVX512 inline __m512i wordPermute(const WordPermute& m) { return _mm512_load
 // the conversion in the default rounding mode, as in narrower lanes.
 ZEL_AVX512 inline __m512 wordsToFloats(__m512i v) { return _mm512_maskz_cvtepi32_ps(__mmask16(~0u), v); }
 ZEL_AVX512 inline __m512i roundEven16(__m512 v) { return _mm512_maskz_cvtps_epi32(__mmask16(~0u), v); }
-
-template <typename T>
-T loadSample(const T* p) {
-  T v;
-  std::memcpy(&v, p, sizeof v);
-  return v;
-}
-template <typename T>
-void storeSample(T* p, T v) {
-  std::memcpy(p, &v, sizeof v);
-}
 
 // 16-bit samples; signed ones are read as sample + 32768 (the top bit
 // flipped), the unsigned range of the body.

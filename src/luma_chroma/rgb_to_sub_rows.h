@@ -20,10 +20,17 @@
 #include "luma_chroma/rgb_to_sub_forms.h"
 #include "luma_chroma/rgb_to_sub_units.h"
 #include "luma_chroma/vector_units.h"
+#include "zelcc/zelcc.h"
 
 namespace zel::lc::sub {
 
 using repack::PairOrder;
+
+// The warning of an odd width (and, where row pairs share their chroma, of
+// an odd height).
+inline Status oddWarning(ImageSize size, bool rows) {
+  return ((size.width & 1) || (rows && (size.height & 1))) ? StatusOddSizeWarning : StatusOk;
+}
 
 // ---- sources: pixels as R, G, B whatever the memory order ----
 

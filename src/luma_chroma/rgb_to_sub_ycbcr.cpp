@@ -12,10 +12,6 @@ namespace zel::lc::sub {
 
 namespace {
 
-Status oddWarning(ImageSize size, bool rows) {
-  return ((size.width & 1) || (rows && (size.height & 1))) ? StatusOddSizeWarning : StatusOk;
-}
-
 // ---- 4:2:0 ----
 
 // Row pairs into planes Y, C1, C2 (C1, C2 swapped by the YCrCb members).

@@ -17,7 +17,15 @@ namespace zel::lc::sub {
 
 namespace {
 
-Status oddWarning420(ImageSize size) { return ((size.width | size.height) & 1) ? StatusOddSizeWarning : StatusOk; }
+// The checks of the members from planes: the arrays (and the step array
+// where there is one), the size, then the planes the arrays hold.
+Status planarChecks(const uint8_t* const src[3], uint8_t* const dst[3], const int* dstSteps, bool withSteps,
+                    ImageSize size) {
+  if (!src || !dst || (withSteps && !dstSteps)) return StatusNullPointerError;
+  if (size.width < 1 || size.height < 1) return StatusSizeError;
+  if (anyPlaneNull(src) || anyPlaneNull(dst)) return StatusNullPointerError;
+  return StatusOk;
+}
 
 // ---- 4:2:0 ----
 
@@ -116,30 +124,22 @@ ZEL_PUBLIC Status zeliBGRToYUV420_8u_AC4P3R(const uint8_t* src, int srcStep, uin
   if (anyPlaneNull(dstPlanes)) return StatusNullPointerError;
   walk420<DifferenceBody<4>, WideDifference420Tail>(PackedRows<4, true>{src, srcStep}, dstPlanes, dstSteps, size,
                                                     size.width & ~15);
-  return oddWarning420(size);
+  return oddWarning(size, true);
 }
 
 ZEL_PUBLIC Status zeliRGBToYUV420_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
                                          const int dstSteps[3], ImageSize size) {
-  if (!srcPlanes || !dstPlanes || !dstSteps) return StatusNullPointerError;
-  if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyPlaneNull(srcPlanes) ||
-      anyPlaneNull(dstPlanes))
-    return StatusNullPointerError;
+  if (const Status bad = planarChecks(srcPlanes, dstPlanes, dstSteps, true, size)) return bad;
   planes420(srcPlanes, srcStep, dstPlanes, dstSteps, size);
-  return oddWarning420(size);
+  return oddWarning(size, true);
 }
 
 ZEL_PUBLIC Status zeliRGBToYUV420_8u_P3(const uint8_t* const srcPlanes[3], uint8_t* const dstPlanes[3],
                                         ImageSize size) {
-  if (!srcPlanes || !dstPlanes) return StatusNullPointerError;
-  if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyPlaneNull(srcPlanes) ||
-      anyPlaneNull(dstPlanes))
-    return StatusNullPointerError;
+  if (const Status bad = planarChecks(srcPlanes, dstPlanes, nullptr, false, size)) return bad;
   const int steps[3] = {size.width, size.width >> 1, size.width >> 1};
   planes420(srcPlanes, size.width, dstPlanes, steps, size);
-  return oddWarning420(size);
+  return oddWarning(size, true);
 }
 
 ZEL_PUBLIC Status zeliRGBToYUV420_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t* const dstPlanes[3],
@@ -149,7 +149,7 @@ ZEL_PUBLIC Status zeliRGBToYUV420_8u_C3P3R(const uint8_t* src, int srcStep, uint
   if (anyPlaneNull(dstPlanes)) return StatusNullPointerError;
   // Aligned planes would take aligned stores; the bytes are the same.
   packed420(src, srcStep, dstPlanes, dstSteps, size);
-  return oddWarning420(size);
+  return oddWarning(size, true);
 }
 
 ZEL_PUBLIC Status zeliRGBToYUV420_8u_C3P3(const uint8_t* src, uint8_t* const dstPlanes[3], ImageSize size) {
@@ -158,7 +158,7 @@ ZEL_PUBLIC Status zeliRGBToYUV420_8u_C3P3(const uint8_t* src, uint8_t* const dst
   if (anyPlaneNull(dstPlanes)) return StatusNullPointerError;
   const int steps[3] = {size.width, size.width >> 1, size.width >> 1};
   packed420(src, 3 * size.width, dstPlanes, steps, size);
-  return oddWarning420(size);
+  return oddWarning(size, true);
 }
 
 // ---- 4:2:2 ----
@@ -206,22 +206,14 @@ ZEL_PUBLIC Status zeliRGBToYUV422_8u_C3P3(const uint8_t* src, uint8_t* const dst
 
 ZEL_PUBLIC Status zeliRGBToYUV422_8u_P3R(const uint8_t* const srcPlanes[3], int srcStep, uint8_t* const dstPlanes[3],
                                          const int dstSteps[3], ImageSize size) {
-  if (!srcPlanes || !dstPlanes || !dstSteps) return StatusNullPointerError;
-  if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyPlaneNull(srcPlanes) ||
-      anyPlaneNull(dstPlanes))
-    return StatusNullPointerError;
+  if (const Status bad = planarChecks(srcPlanes, dstPlanes, dstSteps, true, size)) return bad;
   walk422(PlaneRows{srcPlanes, srcStep}, dstPlanes, dstSteps, size, false);
   return StatusOk;
 }
 
 ZEL_PUBLIC Status zeliRGBToYUV422_8u_P3(const uint8_t* const srcPlanes[3], uint8_t* const dstPlanes[3],
                                         ImageSize size) {
-  if (!srcPlanes || !dstPlanes) return StatusNullPointerError;
-  if (size.width < 1 || size.height < 1) return StatusSizeError;
-  if (anyPlaneNull(srcPlanes) ||
-      anyPlaneNull(dstPlanes))
-    return StatusNullPointerError;
+  if (const Status bad = planarChecks(srcPlanes, dstPlanes, nullptr, false, size)) return bad;
   const int w = size.width;
   const int steps[3] = {w, w / 2 + (w & 1), w / 2 + (w & 1)};
   packedOrRows(

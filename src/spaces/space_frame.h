@@ -49,19 +49,6 @@ inline int effectiveStep(int step, StepUnit unit) {
   return (step >> shift) * int(sizeof(T));
 }
 
-// Samples are read and written through bytes: rows of 16-bit and float
-// samples may start at any address.
-template <typename T>
-inline T loadSample(const T* p) {
-  T v;
-  std::memcpy(&v, p, sizeof v);
-  return v;
-}
-template <typename T>
-inline void storeSample(T* p, T v) {
-  std::memcpy(p, &v, sizeof v);
-}
-
 // Integer samples as levels: 8u and 16u as they are, 16s biased by 32768 so
 // that -32768 is level 0.
 inline int32_t level(const uint8_t* p) { return *p; }
