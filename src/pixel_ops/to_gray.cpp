@@ -1,5 +1,7 @@
 #include "pixel_ops/to_gray.h"
 
+#include <type_traits>
+
 #include "frame/export.h"
 #include "frame/image_layout.h"
 #include "frame/row_driver.h"
@@ -34,24 +36,27 @@ constexpr Spread8 kSpreadC3Wide(3, 8);
 constexpr Spread8 kSpreadAC4(4, 16);
 
 // For 16-bit samples: channel `ch` of pixel k, zero-extended into 32-bit
-// lane k; the first register holds samples 0..7, the second 8..15.
+// lane k; the first register holds samples 0..7, the second samples
+// hiStart..hiStart + 7.
 struct Spread16 {
   alignas(16) int8_t lo[3][16];
   alignas(16) int8_t hi[3][16];
-  constexpr Spread16(int channels) : lo{}, hi{} {
+  constexpr Spread16(int channels, int hiStart) : lo{}, hi{} {
     for (int ch = 0; ch < 3; ++ch)
       for (int k = 0; k < 4; ++k) {
         const int at = channels * k + ch;
         for (int b = 0; b < 4; ++b) {
-          const int8_t from = b < 2 ? int8_t(2 * (at & 7) + b) : int8_t(0x80);
-          lo[ch][4 * k + b] = at < 8 ? from : int8_t(0x80);
-          hi[ch][4 * k + b] = at < 8 ? int8_t(0x80) : from;
+          const bool data = b < 2;
+          lo[ch][4 * k + b] = data && at < 8 ? int8_t(2 * at + b) : int8_t(0x80);
+          hi[ch][4 * k + b] = data && at >= 8 ? int8_t(2 * (at - hiStart) + b) : int8_t(0x80);
         }
       }
   }
 };
-constexpr Spread16 kSpread16C3(3);
-constexpr Spread16 kSpread16AC4(4);
+constexpr Spread16 kSpread16C3(3, 8);
+constexpr Spread16 kSpread16AC4(4, 8);
+// C3 in AVX2 lanes: the second register holds samples 4..11.
+constexpr Spread16 kSpread16C3Wide(3, 4);
 
 // Low 16 bits of four 32-bit lanes into the first 8 bytes.
 alignas(16) constexpr int8_t kLowWords[16] = {0, 1, 4, 5, 8, 9, 12, 13, -128, -128, -128, -128, -128, -128, -128, -128};
@@ -175,6 +180,109 @@ inline __m128 sum4(const Channels3f& c, const LanesF& w) {
   return _mm_add_ps(_mm_add_ps(_mm_mul_ps(c.a, w.w0), _mm_mul_ps(c.b, w.w1)), _mm_mul_ps(c.d, w.w2));
 }
 
+// ---- 16-bit and 32f, eight pixels a block ----
+
+// Eight pixels of T, 128-bit lane 0 holding the channels of pixels 0..3
+// and lane 1 those of pixels 4..7, except AC4: there lane 0 holds pixels
+// 0, 1, 4, 5 for 16-bit samples and 0, 2, 4, 6 for floats (the loads stay
+// whole), which kOrder puts right after the sums.
+struct Lanes8f {
+  __m256 a, b, d;
+};
+
+template <typename T, int Channels>
+ZEL_AVX2 ZEL_INLINE Lanes8f load8(const T* p) {
+  if constexpr (std::is_same_v<T, float>) {
+    if constexpr (Channels == 3) {
+      const __m256 m0 = _mm256_loadu2_m128(p + 12, p), m1 = _mm256_loadu2_m128(p + 16, p + 4),
+                   m2 = _mm256_loadu2_m128(p + 20, p + 8);
+      const __m256 r = _mm256_blend_ps(_mm256_blend_ps(m0, m1, 0x44), m2, 0x22);
+      const __m256 g = _mm256_blend_ps(_mm256_blend_ps(m0, m1, 0x99), m2, 0x44);
+      const __m256 b = _mm256_blend_ps(_mm256_blend_ps(m0, m1, 0x22), m2, 0x99);
+      return {_mm256_permute_ps(r, _MM_SHUFFLE(1, 2, 3, 0)), _mm256_permute_ps(g, _MM_SHUFFLE(2, 3, 0, 1)),
+              _mm256_permute_ps(b, _MM_SHUFFLE(3, 0, 1, 2))};
+    } else {
+      const __m256 p0 = _mm256_loadu_ps(p), p1 = _mm256_loadu_ps(p + 8), p2 = _mm256_loadu_ps(p + 16),
+                   p3 = _mm256_loadu_ps(p + 24);
+      const __m256 t0 = _mm256_unpacklo_ps(p0, p1), t1 = _mm256_unpackhi_ps(p0, p1), t2 = _mm256_unpacklo_ps(p2, p3),
+                   t3 = _mm256_unpackhi_ps(p2, p3);
+      return {_mm256_castpd_ps(_mm256_unpacklo_pd(_mm256_castps_pd(t0), _mm256_castps_pd(t2))),
+              _mm256_castpd_ps(_mm256_unpackhi_pd(_mm256_castps_pd(t0), _mm256_castps_pd(t2))),
+              _mm256_castpd_ps(_mm256_unpacklo_pd(_mm256_castps_pd(t1), _mm256_castps_pd(t3)))};
+    }
+  } else {
+    const Spread16& m = Channels == 3 ? kSpread16C3Wide : kSpread16AC4;
+    __m256i lo, hi;
+    if constexpr (Channels == 3) {
+      lo = _mm256_loadu2_m128i(reinterpret_cast<const __m128i*>(p + 12), reinterpret_cast<const __m128i*>(p));
+      hi = _mm256_loadu2_m128i(reinterpret_cast<const __m128i*>(p + 16), reinterpret_cast<const __m128i*>(p + 4));
+    } else {
+      lo = load256(p);
+      hi = load256(p + 16);
+    }
+    if constexpr (std::is_signed_v<T>) {  // s + 32768 in 16 bits
+      lo = _mm256_xor_si256(lo, _mm256_set1_epi16(int16_t(0x8000)));
+      hi = _mm256_xor_si256(hi, _mm256_set1_epi16(int16_t(0x8000)));
+    }
+    return {_mm256_cvtepi32_ps(pick256(lo, hi, m.lo[0], m.hi[0])), _mm256_cvtepi32_ps(pick256(lo, hi, m.lo[1], m.hi[1])),
+            _mm256_cvtepi32_ps(pick256(lo, hi, m.lo[2], m.hi[2]))};
+  }
+}
+
+// Where result k of the block sits: the 32-bit lanes of the sums for
+// floats, the pairs of narrowed words for 16-bit samples.
+template <typename T, int Channels>
+constexpr int32_t kOrder[8] = {0, 1, 4, 5, 0, 0, 0, 0};
+template <>
+constexpr int32_t kOrder<uint16_t, 4>[8] = {0, 4, 1, 5, 0, 0, 0, 0};
+template <>
+constexpr int32_t kOrder<int16_t, 4>[8] = {0, 4, 1, 5, 0, 0, 0, 0};
+template <>
+constexpr int32_t kOrder<float, 3>[8] = {0, 1, 2, 3, 4, 5, 6, 7};
+template <>
+constexpr int32_t kOrder<float, 4>[8] = {0, 4, 1, 5, 2, 6, 3, 7};
+
+// The four-pixel block form, eight pixels at a time, from pixel x while
+// whole blocks remain before `end`; returns the pixels done.
+template <typename T, int Channels>
+ZEL_AVX2 int blocks256(const T* src, T* dst, int x, int end, WeightsF w) {
+  const __m256 w0 = _mm256_set1_ps(w.w0), w1 = _mm256_set1_ps(w.w1), w2 = _mm256_set1_ps(w.w2);
+  const __m256i order = _mm256_setr_epi32(kOrder<T, Channels>[0], kOrder<T, Channels>[1], kOrder<T, Channels>[2],
+                                          kOrder<T, Channels>[3], kOrder<T, Channels>[4], kOrder<T, Channels>[5],
+                                          kOrder<T, Channels>[6], kOrder<T, Channels>[7]);
+  for (; x + 8 <= end; x += 8) {
+    if constexpr (std::is_same_v<T, float>)
+      _mm_prefetch(reinterpret_cast<const char*>(src + x * Channels) + kPrefetchBytes, _MM_HINT_T0);
+    const Lanes8f c = load8<T, Channels>(src + x * Channels);
+    const __m256 s = _mm256_add_ps(_mm256_add_ps(_mm256_mul_ps(c.a, w0), _mm256_mul_ps(c.b, w1)), _mm256_mul_ps(c.d, w2));
+    if constexpr (std::is_same_v<T, float>) {
+      _mm256_storeu_ps(dst + x, Channels == 3 ? s : _mm256_permutevar8x32_ps(s, order));
+    } else {
+      const __m256i r = _mm256_cvtps_epi32(s);
+      __m256i n;
+      if constexpr (std::is_signed_v<T>) {
+        const __m256i u = _mm256_sub_epi32(r, _mm256_set1_epi32(32768));
+        n = _mm256_packs_epi32(u, u);
+      } else {
+        n = _mm256_shuffle_epi8(r, mask256(kLowWords));
+      }
+      store128(dst + x, _mm256_castsi256_si128(_mm256_permutevar8x32_epi32(n, order)));
+    }
+  }
+  return x;
+}
+
+// The blocks wider than four pixels that `tier` allows; returns the pixels
+// done.
+template <typename T, int Channels>
+inline int wideBlocks(const T* src, T* dst, int end, WeightsF w, VectorTier tier) {
+  int x = 0;
+  if constexpr (!std::is_same_v<T, float> || Channels == 4)
+    if (tier >= VectorTier::Avx512) x = blocks512<T, Channels>(src, dst, end, w);
+  if (tier >= VectorTier::Avx2) x = blocks256<T, Channels>(src, dst, x, end, w);
+  return x;
+}
+
 }  // namespace
 
 template <int Channels>
@@ -195,10 +303,11 @@ void row8u(const uint8_t* src, uint8_t* dst, int width, Weights8 w, bool wide) {
 }
 
 template <int Channels>
-void row16u(const uint16_t* src, uint16_t* dst, int width, WeightsF w) {
+void row16u(const uint16_t* src, uint16_t* dst, int width, WeightsF w, VectorTier tier) {
   const LanesF c(w);
-  int x = 0;
-  for (; x + 4 <= width; x += 4) {
+  const int end = width & ~3;
+  int x = wideBlocks<uint16_t, Channels>(src, dst, end, w, tier);
+  for (; x < end; x += 4) {
     const __m128i r = _mm_cvtps_epi32(sum4(load4x16<Channels, false>(src + x * Channels), c));
     store64(dst + x, _mm_shuffle_epi8(r, mask(kLowWords)));
   }
@@ -209,10 +318,10 @@ void row16u(const uint16_t* src, uint16_t* dst, int width, WeightsF w) {
 }
 
 template <int Channels>
-void row16s(const int16_t* src, int16_t* dst, int width, WeightsF w) {
+void row16s(const int16_t* src, int16_t* dst, int width, WeightsF w, VectorTier tier) {
   const LanesF c(w);
   const int end = blockEnd16s(width);
-  int x = 0;
+  int x = wideBlocks<int16_t, Channels>(src, dst, end, w, tier);
   for (; x < end; x += 4) {
     const __m128i r = _mm_cvtps_epi32(sum4(load4x16<Channels, true>(src + x * Channels), c));
     const __m128i u = _mm_sub_epi32(r, _mm_set1_epi32(32768));
@@ -225,10 +334,11 @@ void row16s(const int16_t* src, int16_t* dst, int width, WeightsF w) {
 }
 
 template <int Channels>
-void row32f(const float* src, float* dst, int width, WeightsF w) {
+void row32f(const float* src, float* dst, int width, WeightsF w, VectorTier tier) {
   const LanesF c(w);
-  int x = 0;
-  for (; x + 4 <= width; x += 4) _mm_storeu_ps(dst + x, sum4(load4x32f<Channels>(src + x * Channels), c));
+  const int end = width & ~3;
+  int x = wideBlocks<float, Channels>(src, dst, end, w, tier);
+  for (; x < end; x += 4) _mm_storeu_ps(dst + x, sum4(load4x32f<Channels>(src + x * Channels), c));
   for (; x < width; ++x) {
     const float* p = src + x * Channels;
     dst[x] = gray32f(p[0], p[1], p[2], w);
@@ -264,12 +374,12 @@ void row64f(const double* src, double* dst, int width, WeightsD w) {
 
 template void row8u<3>(const uint8_t*, uint8_t*, int, Weights8, bool);
 template void row8u<4>(const uint8_t*, uint8_t*, int, Weights8, bool);
-template void row16u<3>(const uint16_t*, uint16_t*, int, WeightsF);
-template void row16u<4>(const uint16_t*, uint16_t*, int, WeightsF);
-template void row16s<3>(const int16_t*, int16_t*, int, WeightsF);
-template void row16s<4>(const int16_t*, int16_t*, int, WeightsF);
-template void row32f<3>(const float*, float*, int, WeightsF);
-template void row32f<4>(const float*, float*, int, WeightsF);
+template void row16u<3>(const uint16_t*, uint16_t*, int, WeightsF, VectorTier);
+template void row16u<4>(const uint16_t*, uint16_t*, int, WeightsF, VectorTier);
+template void row16s<3>(const int16_t*, int16_t*, int, WeightsF, VectorTier);
+template void row16s<4>(const int16_t*, int16_t*, int, WeightsF, VectorTier);
+template void row32f<3>(const float*, float*, int, WeightsF, VectorTier);
+template void row32f<4>(const float*, float*, int, WeightsF, VectorTier);
 template void row64f<3>(const double*, double*, int, WeightsD);
 template void row64f<4>(const double*, double*, int, WeightsD);
 
@@ -298,13 +408,16 @@ Status toGray(const T* src, int srcStep, T* dst, int dstStep, ImageSize size, co
     plainWalk(size.height, [&](int y) { row8u<Channels>(in.row(y), out.row(y), size.width, w, wide); });
   } else if constexpr (std::is_same_v<T, uint16_t>) {
     const WeightsF w = weightsF(coeffs);
-    plainWalk(size.height, [&](int y) { row16u<Channels>(in.row(y), out.row(y), size.width, w); });
+    const VectorTier tier = blockTier();
+    plainWalk(size.height, [&](int y) { row16u<Channels>(in.row(y), out.row(y), size.width, w, tier); });
   } else if constexpr (std::is_same_v<T, int16_t>) {
     const WeightsF w = weightsF(coeffs);
-    plainWalk(size.height, [&](int y) { row16s<Channels>(in.row(y), out.row(y), size.width, w); });
+    const VectorTier tier = blockTier();
+    plainWalk(size.height, [&](int y) { row16s<Channels>(in.row(y), out.row(y), size.width, w, tier); });
   } else if constexpr (std::is_same_v<T, float>) {
     const WeightsF w = weightsF(coeffs);
-    plainWalk(size.height, [&](int y) { row32f<Channels>(in.row(y), out.row(y), size.width, w); });
+    const VectorTier tier = blockTier();
+    plainWalk(size.height, [&](int y) { row32f<Channels>(in.row(y), out.row(y), size.width, w, tier); });
   } else {
     const WeightsD w = weightsD(coeffs);
     plainWalk(size.height, [&](int y) { row64f<Channels>(in.row(y), out.row(y), size.width, w); });

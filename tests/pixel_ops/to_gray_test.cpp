@@ -25,21 +25,31 @@ int16_t expect16s(const int16_t* p, int x, int width, WeightsF w) {
   return x < blockEnd16s(width) ? block16s(p[0], p[1], p[2], w) : tail16s(p[0], p[1], p[2], w);
 }
 
+std::vector<int> widthsUpTo(int last, std::vector<int> more = {}) {
+  std::vector<int> widths;
+  for (int w = 1; w <= last; ++w) widths.push_back(w);
+  widths.insert(widths.end(), more.begin(), more.end());
+  return widths;
+}
+
 template <typename T, int Ch, typename W, typename Row, typename Want>
-void compareRows(Row row, Want want, const std::vector<W>& weights, double lo = 0, double hi = 1) {
+void compareRows(Row row, Want want, const std::vector<W>& weights, double lo = 0, double hi = 1,
+                 const std::vector<int>& widths = widthsUpTo(70)) {
   int seed = 1;
-  for (const W& w : weights)
-    for (int width = 1; width <= 70; ++width)
-      for (int offset : {0, 1, 3, 6}) {
-        if (sizeof(T) > 1 && offset % 2) continue;
+  for (size_t set = 0; set < weights.size(); ++set)
+    for (int width : widths)
+      for (int offset : {0, 1, 2, 3, 4, 6, 12, 20}) {
+        if (offset % sizeof(T)) continue;
         TestImage<T> src(width * Ch, 1, offset);
-        TestImage<T> dst(width, 1, offset + int(sizeof(T)));
+        TestImage<T> dst(width, 1, (offset * 5 + int(sizeof(T))) % 64);
         src.fillRandom(uint32_t(++seed), lo, hi);
+        const W& w = weights[set];
         row(src.data(), dst.data(), width, w);
         for (int x = 0; x < width; ++x) {
           const T expected = want(src.data() + x * Ch, x, width, w);
           const T got = dst.get(x, 0);
-          ASSERT_EQ(std::memcmp(&got, &expected, sizeof(T)), 0) << "width " << width << " pixel " << x;
+          ASSERT_EQ(std::memcmp(&got, &expected, sizeof(T)), 0)
+              << "width " << width << " pixel " << x << " offset " << offset << " weights " << set;
         }
         ASSERT_TRUE(dst.guardsIntact()) << width;
       }
@@ -52,7 +62,19 @@ std::vector<Weights8> someWeights8() {
           weights8(std::vector<float>{1.0f, 0.5f, 0.0f}.data()), weights8(std::vector<float>{1.9f, 1.9f, 1.9f}.data()),
           weights8(std::vector<float>{-0.25f, 0.6f, 0.7f}.data())};
 }
-std::vector<WeightsF> someWeightsF() { return {fixedFloat(), {0.5f, 0.25f, 0.3f}, {1.0f, 1.0f, 0.0f}, {-0.3f, 0.9f, 0.4f}}; }
+// The fixed weights, plain user weights, weights whose sums pass 65535
+// (16u wraps, the 16s blocks saturate), and negative sums.
+std::vector<WeightsF> someWeightsF() {
+  return {fixedFloat(), {0.5f, 0.25f, 0.3f}, {1.0f, 1.0f, 0.0f}, {-0.3f, 0.9f, 0.4f}, {0.8f, 1.7f, -2.2f}};
+}
+
+using zel::VectorTier;
+std::vector<VectorTier> tiersHere() {
+  std::vector<VectorTier> tiers;
+  for (VectorTier t : {VectorTier::Sse41, VectorTier::Avx2, VectorTier::Avx512})
+    if (t <= blockTier()) tiers.push_back(t);
+  return tiers;
+}
 
 TEST(ToGrayKernels, EightBitBlocksMatchTheirFormulaInEveryZone) {
   for (bool wide : {false, true}) {
@@ -66,19 +88,64 @@ TEST(ToGrayKernels, EightBitBlocksMatchTheirFormulaInEveryZone) {
   }
 }
 
-TEST(ToGrayKernels, WideSamplesMatchTheirFormula) {
+// Every tier of blocks the processor has, past a few whole 512-bit blocks.
+TEST(ToGrayKernels, WideSamplesMatchTheirFormulaInEveryTier) {
+  const std::vector<int> widths = widthsUpTo(70, {127, 128, 129, 141, 150});
   auto u16 = [](const uint16_t* p, int, int, WeightsF w) { return gray16u(p[0], p[1], p[2], w); };
-  compareRows<uint16_t, 3, WeightsF>(row16u<3>, u16, someWeightsF());
-  compareRows<uint16_t, 4, WeightsF>(row16u<4>, u16, someWeightsF());
-  compareRows<int16_t, 3, WeightsF>(row16s<3>, expect16s, someWeightsF());
-  compareRows<int16_t, 4, WeightsF>(row16s<4>, expect16s, someWeightsF());
   auto f32 = [](const float* p, int, int, WeightsF w) { return gray32f(p[0], p[1], p[2], w); };
-  compareRows<float, 3, WeightsF>(row32f<3>, f32, someWeightsF(), -2, 3);
-  compareRows<float, 4, WeightsF>(row32f<4>, f32, someWeightsF(), -2, 3);
+  for (VectorTier t : tiersHere()) {
+    SCOPED_TRACE(int(t));
+    auto at = [t](auto row) { return [t, row](auto s, auto d, int n, WeightsF w) { row(s, d, n, w, t); }; };
+    compareRows<uint16_t, 3, WeightsF>(at(row16u<3>), u16, someWeightsF(), 0, 1, widths);
+    compareRows<uint16_t, 4, WeightsF>(at(row16u<4>), u16, someWeightsF(), 0, 1, widths);
+    compareRows<int16_t, 3, WeightsF>(at(row16s<3>), expect16s, someWeightsF(), 0, 1, widths);
+    compareRows<int16_t, 4, WeightsF>(at(row16s<4>), expect16s, someWeightsF(), 0, 1, widths);
+    compareRows<float, 3, WeightsF>(at(row32f<3>), f32, someWeightsF(), -2, 3, widths);
+    compareRows<float, 4, WeightsF>(at(row32f<4>), f32, someWeightsF(), -2, 3, widths);
+  }
   auto f64 = [](const double* p, int, int, WeightsD w) { return gray64f(p[0], p[1], p[2], w); };
   const std::vector<WeightsD> wd = {fixedDouble(), {0.1, 0.7, 0.25}};
   compareRows<double, 3, WeightsD>(row64f<3>, f64, wd, -2, 3);
   compareRows<double, 4, WeightsD>(row64f<4>, f64, wd, -2, 3);
+}
+
+// Through the public functions with the tier capped: whole images with
+// padded rows give every tier's bits.
+TEST(ToGrayKernels, EveryTierGivesTheSameImages) {
+  const VectorTier cap = zel::vectorTierCap();
+  const ImageSize size{53, 3};
+  const float coeffs[3] = {1.0f, 1.0f, 0.25f};
+  TestImage<uint16_t> u(size.width * 3, size.height, 2, 6);
+  TestImage<int16_t> s(size.width * 4, size.height, 0, 2);
+  TestImage<float> f(size.width * 3, size.height, 4, 12);
+  u.fillRandom(5);
+  s.fillRandom(6);
+  f.fillRandom(7, -1, 2);
+  std::vector<std::vector<uint16_t>> outU;
+  std::vector<std::vector<int16_t>> outS;
+  std::vector<std::vector<float>> outF;
+  for (VectorTier t : tiersHere()) {
+    zel::setVectorTierCap(t);
+    outU.emplace_back(size.width * size.height);
+    outS.emplace_back(size.width * size.height);
+    outF.emplace_back(size.width * size.height);
+    const int step = size.width * 2;
+    EXPECT_EQ(zeliColorToGray_16u_C3C1R(u.data(), u.step(), outU.back().data(), step, size, coeffs), StatusOk);
+    EXPECT_EQ(zeliColorToGray_16s_AC4C1R(s.data(), s.step(), outS.back().data(), step, size, coeffs), StatusOk);
+    EXPECT_EQ(zeliRGBToGray_32f_C3C1R(f.data(), f.step(), outF.back().data(), step * 2, size), StatusOk);
+  }
+  zel::setVectorTierCap(cap);
+  const WeightsF w{coeffs[0], coeffs[1], coeffs[2]};
+  for (size_t t = 0; t < outU.size(); ++t)
+    for (int y = 0; y < size.height; ++y)
+      for (int x = 0; x < size.width; ++x) {
+        const int i = y * size.width + x;
+        const uint16_t* pu = u.row(y) + 3 * x;
+        ASSERT_EQ(outU[t][i], gray16u(pu[0], pu[1], pu[2], w)) << "tier " << t << " pixel " << x << "," << y;
+        ASSERT_EQ(outS[t][i], expect16s(s.row(y) + 4 * x, x, size.width, w)) << "tier " << t << " pixel " << x;
+        const float* pf = f.row(y) + 3 * x;
+        ASSERT_EQ(outF[t][i], gray32f(pf[0], pf[1], pf[2], fixedFloat())) << "tier " << t << " pixel " << x;
+      }
 }
 
 TEST(ToGrayFormulas, WeightConversionWraps) {
