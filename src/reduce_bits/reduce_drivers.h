@@ -238,6 +238,31 @@ void threeRowBands(const Image<typename M::Source, typename M::Dest>& im, float*
   else sse::threeRowBands<M, L, Noisy>(im, srcStep, dstStep, U2, U1, qv, k, tables);
 }
 
+// The banded kernels are built once, a layout per file
+// (reduce_bands_<layout>.cpp), for every member and with and without noise;
+// the drivers and the tests call those.
+#define ZEL_REDUCE_BANDS_NOISE(EXTERN, Src, Dst, L, Noisy)                                                    \
+  EXTERN template void floydSteinbergBands<Member<Src, Dst>, LayoutCode::L, Noisy>(                           \
+      const Image<Src, Dst>&, float*, const QuantValues&, const NoiseTables&, bool);                          \
+  EXTERN template void threeRowBands<Member<Src, Dst>, LayoutCode::L, Noisy>(                                 \
+      const Image<Src, Dst>&, float*, const QuantValues&, const ThreeRowWeights&, const NoiseTables&, bool);
+#define ZEL_REDUCE_BANDS_MEMBER(EXTERN, Src, Dst, L) \
+  ZEL_REDUCE_BANDS_NOISE(EXTERN, Src, Dst, L, false) \
+  ZEL_REDUCE_BANDS_NOISE(EXTERN, Src, Dst, L, true)
+#define ZEL_REDUCE_BANDS_LAYOUT(EXTERN, L)                 \
+  ZEL_REDUCE_BANDS_MEMBER(EXTERN, uint8_t, uint8_t, L)     \
+  ZEL_REDUCE_BANDS_MEMBER(EXTERN, uint16_t, uint16_t, L)   \
+  ZEL_REDUCE_BANDS_MEMBER(EXTERN, int16_t, int16_t, L)     \
+  ZEL_REDUCE_BANDS_MEMBER(EXTERN, uint16_t, uint8_t, L)    \
+  ZEL_REDUCE_BANDS_MEMBER(EXTERN, int16_t, uint8_t, L)     \
+  ZEL_REDUCE_BANDS_MEMBER(EXTERN, float, uint8_t, L)       \
+  ZEL_REDUCE_BANDS_MEMBER(EXTERN, float, uint16_t, L)      \
+  ZEL_REDUCE_BANDS_MEMBER(EXTERN, float, int16_t, L)
+ZEL_REDUCE_BANDS_LAYOUT(extern, C1)
+ZEL_REDUCE_BANDS_LAYOUT(extern, C3)
+ZEL_REDUCE_BANDS_LAYOUT(extern, C4)
+ZEL_REDUCE_BANDS_LAYOUT(extern, AC4)
+
 template <typename M, LayoutCode L, bool Noisy>
 Status threeRowDriver(const Image<typename M::Source, typename M::Dest>& im, int levels, int noise, uint32_t kind) {
   const QuantValues qv = quantValues<typename M::Source>(levels);
