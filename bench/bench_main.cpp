@@ -128,7 +128,10 @@ int main(int argc, char** argv) {
     auto ws = std::make_shared<Workspace>(*d, ImageSize{kWidth, kHeight});
     ws->fillRandom(1);
     auto args = std::make_shared<std::vector<Arg>>(ws->arguments());
+    // A first call outside the timing: buffers a conversion touches for the
+    // first time cost page faults that a caller's hot loop never pays.
     benchmark::RegisterBenchmark(name.c_str(), [ws, args](benchmark::State& state) {
+      ws->call(*args);
       for (auto _ : state) {
         const Status s = ws->call(*args);
         if (s < 0) state.SkipWithError("the export returned an error");
@@ -154,6 +157,7 @@ int main(int argc, char** argv) {
       row.peerLabels.push_back(peer.label);
       auto run = std::make_shared<std::function<void()>>(peer.run);
       benchmark::RegisterBenchmark(id.c_str(), [run](benchmark::State& state) {
+        (*run)();
         for (auto _ : state) (*run)();
       })->Unit(benchmark::kMillisecond);
     }
@@ -167,6 +171,7 @@ int main(int argc, char** argv) {
       auto vargs = std::make_shared<std::vector<Arg>>(ws->arguments(&values));
       const std::string id = name + " [" + v.label + "]";
       benchmark::RegisterBenchmark(id.c_str(), [ws, vargs](benchmark::State& state) {
+        ws->call(*vargs);
         for (auto _ : state) {
           const Status s = ws->call(*vargs);
           if (s < 0) state.SkipWithError("the export returned an error");

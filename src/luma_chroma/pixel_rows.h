@@ -489,19 +489,16 @@ inline void convertRow(const In& in, const Out& out, int width, int bodyEnd, con
 }
 
 // Four-byte pixels in and out with the destination's fourth byte kept: a
-// wide form four pixels at a time in 32-bit lanes, every pixel stored as
-// its three bytes.
+// wide form four pixels at a time in 32-bit lanes, stored with the fourth
+// bytes the destination holds (read and written back as they were).
 template <class Form>
 inline void keepAlphaRow(const uint8_t* src, uint8_t* dst, int width, const Form& form) {
+  const __m128i fourth = _mm_set1_epi32(int32_t(0xFF000000u));
   int x = 0;
   for (; x + 4 <= width; x += 4) {
-    alignas(16) uint32_t px[4];
-    _mm_store_si128(reinterpret_cast<__m128i*>(px), form.pixels4(load128(src + 4 * x)));
-    for (int i = 0; i < 4; ++i) {
-      uint8_t* q = dst + 4 * (x + i);
-      std::memcpy(q, &px[i], 2);
-      q[2] = static_cast<uint8_t>(px[i] >> 16);
-    }
+    uint8_t* q = dst + 4 * x;
+    const __m128i px = form.pixels4(load128(src + 4 * x));  // the whole source block before any store
+    store128(q, _mm_blendv_epi8(px, load128(q), fourth));
   }
   formPixels(PackedIn<4>{src}, PackedOutKeep{dst}, x, width, form);
 }
