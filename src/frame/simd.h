@@ -61,6 +61,15 @@ inline bool hasAvx512() {
 }
 inline bool hasAvx512Vbmi() { return hasAvx512() && __builtin_cpu_supports("avx512vbmi"); }
 
+// The widest tier a kernel may take on this processor, under the cap; the
+// second for kernels whose 512-bit bodies need the byte permutes too.
+inline VectorTier widestTier() {
+  return hasAvx512() ? VectorTier::Avx512 : hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41;
+}
+inline VectorTier widestTierWithBytePermutes() {
+  return hasAvx512Vbmi() ? VectorTier::Avx512 : hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41;
+}
+
 inline __m128i load128(const void* p) { return _mm_loadu_si128(static_cast<const __m128i*>(p)); }
 inline __m128i load64(const void* p) { return _mm_loadl_epi64(static_cast<const __m128i*>(p)); }
 inline __m128i load32(const void* p) {

@@ -564,11 +564,6 @@ void yccToRgb32fRow(const float* src, float* dst, int width, VectorTier tier) {
   yccRow32f<Channels, Stores>(src, dst, width, YccToRgb32fForm{}, tier);
 }
 
-VectorTier floatTier() {
-  if (hasAvx512()) return VectorTier::Avx512;
-  return hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41;
-}
-
 template void rgbToYcc16Row<3, false>(const uint16_t*, uint16_t*, int, VectorTier);
 template void rgbToYcc16Row<4, false>(const uint16_t*, uint16_t*, int, VectorTier);
 template void rgbToYcc16Row<3, true>(const uint16_t*, uint16_t*, int, VectorTier);
@@ -603,7 +598,7 @@ float* words(float* p) { return p; }
 // A plain walk of one row kernel, on the vector width of the processor.
 template <auto Row, typename T>
 Status walk(const T* src, int srcStep, T* dst, int dstStep, ImageSize size) {
-  const zel::VectorTier tier = floatTier();
+  const zel::VectorTier tier = zel::widestTier();
   return walkElements(src, srcStep, dst, dstStep, size,
                       [tier](const T* s, T* d, int w) { Row(words(s), words(d), w, tier); });
 }

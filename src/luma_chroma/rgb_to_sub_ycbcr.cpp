@@ -18,7 +18,7 @@ namespace {
 template <class Body, class Tail, class Rows>
 void walk420(const Rows& rows, uint8_t* y, int yStep, uint8_t* c1, int c1Step, uint8_t* c2, int c2Step, ImageSize size,
              int n) {
-  const VectorTier tier = unitTier();
+  const VectorTier tier = zel::widestTierWithBytePermutes();
   rowPairWalk(size.height, [&](int r, int c) {
     const Planes420Out out{rowAt(y, yStep, r), rowAt(y, yStep, r + 1), rowAt(c1, c1Step, c), rowAt(c2, c2Step, c)};
     convertPair(rows(r), rows(r + 1), out, size.width, n, Body{}, Tail{}, tier);
@@ -27,7 +27,7 @@ void walk420(const Rows& rows, uint8_t* y, int yStep, uint8_t* c1, int c1Step, u
 
 template <class Body, class Tail, class Rows>
 void walk420TwoPlane(const Rows& rows, uint8_t* y, int yStep, uint8_t* cbcr, int cbcrStep, ImageSize size, int n) {
-  const VectorTier tier = unitTier();
+  const VectorTier tier = zel::widestTierWithBytePermutes();
   rowPairWalk(size.height, [&](int r, int c) {
     const TwoPlane420Out out{rowAt(y, yStep, r), rowAt(y, yStep, r + 1), rowAt(cbcr, cbcrStep, c)};
     convertPair(rows(r), rows(r + 1), out, size.width, n, Body{}, Tail{}, tier);
@@ -72,7 +72,7 @@ Status rounded420TwoPlane(const uint8_t* src, int srcStep, uint8_t* dstY, int ds
 
 template <int Ratio, class Body, class Tail, class Rows, class OutRow>
 void walkRows(const Rows& rows, const OutRow& outRow, ImageSize size, int n) {
-  const VectorTier tier = unitTier();
+  const VectorTier tier = zel::widestTierWithBytePermutes();
   plainWalk(size.height, [&](int y) { convertRow<Ratio>(rows(y), outRow(y), size.width, n, Body{}, Tail{}, tier); });
 }
 

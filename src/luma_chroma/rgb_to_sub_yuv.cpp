@@ -31,7 +31,7 @@ Status planarChecks(const uint8_t* const src[3], uint8_t* const dst[3], const in
 
 template <class Body, class Tail, class Rows>
 void walk420(const Rows& rows, uint8_t* const dst[3], const int steps[3], ImageSize size, int n) {
-  const VectorTier tier = unitTier();
+  const VectorTier tier = zel::widestTierWithBytePermutes();
   rowPairWalk(size.height, [&](int r, int c) {
     const Planes420Out out{rowAt(dst[0], steps[0], r), rowAt(dst[0], steps[0], r + 1), rowAt(dst[1], steps[1], c),
                            rowAt(dst[2], steps[2], c)};
@@ -75,7 +75,7 @@ void row422(const Src& in, const PlanesOutSub<2, true>& out, int width, bool ali
 
 template <class Rows>
 void walk422(const Rows& rows, uint8_t* const dst[3], const int steps[3], ImageSize size, bool aligned) {
-  const VectorTier tier = unitTier();
+  const VectorTier tier = zel::widestTierWithBytePermutes();
   plainWalk(size.height, [&](int y) {
     row422(rows(y),
            PlanesOutSub<2, true>{rowAt(dst[0], steps[0], y), rowAt(dst[1], steps[1], y), rowAt(dst[2], steps[2], y)},
@@ -166,7 +166,7 @@ ZEL_PUBLIC Status zeliRGBToYUV420_8u_C3P3(const uint8_t* src, uint8_t* const dst
 ZEL_PUBLIC Status zeliRGBToYUV422_8u_C3C2R(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size) {
   if (!src || !dst) return StatusNullPointerError;
   if (size.width < 1 || size.height < 1) return StatusSizeError;
-  const zel::VectorTier tier = zel::lc::unitTier();
+  const zel::VectorTier tier = zel::widestTierWithBytePermutes();
   using Tail = WideDifference422Tail<32768, 32768, OddDifferenceRounded>;
   zel::plainWalk(size.height, [&](int y) {
     convertRow<2>(PackedSource<3, false>{PackedIn<3>{zel::rowAt(src, srcStep, y)}},
@@ -196,7 +196,8 @@ ZEL_PUBLIC Status zeliRGBToYUV422_8u_C3P3(const uint8_t* src, uint8_t* const dst
       size,
       [&](int first, int pixels) {
         const PlanesOutSub<2, true> out{dstPlanes[0] + first, dstPlanes[1] + first / 2, dstPlanes[2] + first / 2};
-        row422(PackedSource<3, false>{PackedIn<3>{src + 3 * first}}, out, pixels, false, zel::lc::unitTier());
+        row422(PackedSource<3, false>{PackedIn<3>{src + 3 * first}}, out, pixels, false,
+               zel::widestTierWithBytePermutes());
       },
       [&] {
         walk422(PackedRows<3, false>{src, 3 * w}, dstPlanes, steps, size, allAligned16(src, 3 * w, dstPlanes, steps));
@@ -221,7 +222,7 @@ ZEL_PUBLIC Status zeliRGBToYUV422_8u_P3(const uint8_t* const srcPlanes[3], uint8
       [&](int first, int pixels) {
         const PlanesSource in{PlanesIn{srcPlanes[0] + first, srcPlanes[1] + first, srcPlanes[2] + first}};
         const PlanesOutSub<2, true> out{dstPlanes[0] + first, dstPlanes[1] + first / 2, dstPlanes[2] + first / 2};
-        row422(in, out, pixels, false, zel::lc::unitTier());
+        row422(in, out, pixels, false, zel::widestTierWithBytePermutes());
       },
       [&] {
         walk422(PlaneRows{srcPlanes, w}, dstPlanes, steps, size, false);

@@ -16,7 +16,7 @@ namespace {
 // and the wide form after it.
 template <class Body, class InRow, class OutRow>
 void walkRows(ImageSize size, int blockMask, const Body& body, InRow inRow, OutRow outRow) {
-  const VectorTier tier = unitTier();
+  const VectorTier tier = zel::widestTierWithBytePermutes();
   const int bodyEnd = size.width & ~blockMask;
   plainWalk(size.height,
             [&](int y) { convertRow(inRow(y), outRow(y), size.width, bodyEnd, body, WideFwd{}, tier); });

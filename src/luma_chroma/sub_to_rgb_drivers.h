@@ -65,7 +65,7 @@ template <class MakeLuma, class MakeChroma, class MakeOut, class Body, class Tai
 inline Status expandPairs(ImageSize size, int bodyEnd, MakeLuma luma, MakeChroma chroma, MakeOut out, const Body& body,
                           const Tail& tail) {
   const int end = size.width & ~1;
-  const VectorTier tier = unitTier();
+  const VectorTier tier = zel::widestTierWithBytePermutes();
   using Set = RowSet<2, LumaRow, decltype(chroma(0)), decltype(out(0))>;
   for (int j = 0; j < size.height >> 1; ++j) {
     const Set rows{{LumaRow{luma(2 * j)}, LumaRow{luma(2 * j + 1)}}, chroma(j), {out(2 * j), out(2 * j + 1)}};
@@ -77,7 +77,7 @@ inline Status expandPairs(ImageSize size, int bodyEnd, MakeLuma luma, MakeChroma
 // A plain walk of single rows; `row(y)` gives the views of row y.
 template <class MakeRow, class Body, class Tail>
 inline void expandRows(int height, int bodyEnd, int end, MakeRow row, const Body& body, const Tail& tail) {
-  const VectorTier tier = unitTier();
+  const VectorTier tier = zel::widestTierWithBytePermutes();
   for (int y = 0; y < height; ++y) expandRow(row(y), bodyEnd, end, body, tail, tier);
 }
 

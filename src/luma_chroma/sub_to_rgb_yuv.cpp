@@ -47,7 +47,7 @@ void planes422Packed(const uint8_t* const srcPlanes[3], ImageSize size, Out (*ou
     const int n = size.width * size.height;
     const RowSet<1, LumaRow, ChromaPlanes<2>, Out> row{
         {LumaRow{srcPlanes[0]}}, ChromaPlanes<2>{srcPlanes[1], srcPlanes[2]}, {outRow(dst, 0, 0)}};
-    expandRow(row, n & ~15, n, kHalves2, kWideTruncated, unitTier());
+    expandRow(row, n & ~15, n, kHalves2, kWideTruncated, zel::widestTierWithBytePermutes());
     return;
   }
   const int chroma = (size.width >> 1) + (size.width & 1);

@@ -122,13 +122,6 @@ struct Avx512 {
 
 ZEL_TIER512_END
 
-// The widest unit the kernels may take on this processor (under the cap of
-// the vector tier): the 512-bit unit needs the byte permutes too.
-inline VectorTier unitTier() {
-  if (hasAvx512Vbmi()) return VectorTier::Avx512;
-  return hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41;
-}
-
 // Three channels of a block: bytes (16 pixels a unit) or 16-bit lanes.
 template <class U>
 struct Trio {

@@ -22,7 +22,7 @@ PlanesIn planesIn(const uint8_t* const planes[3], int step, int y) {
 // Plain walk over rows; pixels [0, bodyEnd) take the body form.
 template <class Body, class Tail, class InRow, class OutRow>
 void walkRows(ImageSize size, int bodyEnd, const Body& body, const Tail& tail, InRow inRow, OutRow outRow) {
-  const VectorTier tier = unitTier();
+  const VectorTier tier = zel::widestTierWithBytePermutes();
   plainWalk(size.height, [&](int y) { convertRow(inRow(y), outRow(y), size.width, bodyEnd, body, tail, tier); });
 }
 

@@ -29,7 +29,7 @@ template <typename Row>
 inline Status walkInterleaved(const uint8_t* src, int srcStep, uint8_t* dst, int dstStep, ImageSize size, Row row) {
   if (!src || !dst) return StatusNullPointerError;
   if (sizeBelowOne(size)) return StatusSizeError;
-  const VectorTier tier = unitTier();
+  const VectorTier tier = zel::widestTierWithBytePermutes();
   plainWalk(size.height, [&](int y) { row(rowAt(src, srcStep, y), rowAt(dst, dstStep, y), size.width, tier); });
   return StatusOk;
 }

@@ -134,7 +134,7 @@ ZEL_PUBLIC Status zeliRGBToYUV_8u_C3P3R(const uint8_t* src, int srcStep, uint8_t
   if (!src || !dstPlanes) return StatusNullPointerError;
   if (sizeBelowOne(size)) return StatusSizeError;
   if (anyPlaneNull(dstPlanes, 3)) return StatusNullPointerError;
-  const zel::VectorTier tier = unitTier();
+  const zel::VectorTier tier = zel::widestTierWithBytePermutes();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<uint8_t, 3> d(dstPlanes, dstStep, y);
     rgbToYuvC3P3Row(zel::rowAt(src, srcStep, y), d.p, size.width, tier);
@@ -148,7 +148,7 @@ ZEL_PUBLIC Status zeliRGBToYUV_8u_AC4P4R(const uint8_t* src, int srcStep, uint8_
   if (!src || !dstPlanes) return StatusNullPointerError;
   if (sizeBelowOne(size)) return StatusSizeError;
   if (anyPlaneNull(dstPlanes, 3)) return StatusNullPointerError;
-  const zel::VectorTier tier = unitTier();
+  const zel::VectorTier tier = zel::widestTierWithBytePermutes();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<uint8_t, 4> d(dstPlanes, dstStep, y);
     rgbToYuvAC4P4Row(zel::rowAt(src, srcStep, y), d.p, size.width, tier);
@@ -162,7 +162,7 @@ ZEL_PUBLIC Status zeliRGBToYUV_8u_P3R(const uint8_t* const srcPlanes[3], int src
   if (sizeBelowOne(size)) return StatusSizeError;
   if (anyPlaneNull(srcPlanes, 3)) return StatusNullPointerError;
   if (anyPlaneNull(dstPlanes, 3)) return StatusNullPointerError;
-  const zel::VectorTier tier = unitTier();
+  const zel::VectorTier tier = zel::widestTierWithBytePermutes();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<const uint8_t, 3> s(srcPlanes, srcStep, y);
     const PlaneRows<uint8_t, 3> d(dstPlanes, dstStep, y);

@@ -1,7 +1,7 @@
 // Row kernels of the full-resolution YUV conversions. Each converts one row
 // of `width` pixels with its member's body and tail; the vector body takes
-// the widest blocks that `tier` (at most unitTier()) allows first; the bits
-// are the same at every tier.
+// the widest blocks that `tier` (at most widestTierWithBytePermutes())
+// allows first; the bits are the same at every tier.
 #pragma once
 
 #include <cstdint>

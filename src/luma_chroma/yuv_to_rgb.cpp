@@ -121,7 +121,7 @@ ZEL_PUBLIC Status zeliYUVToRGB_8u_P3C3R(const uint8_t* const srcPlanes[3], int s
   if (!srcPlanes || !dst) return StatusNullPointerError;
   if (sizeBelowOne(size)) return StatusSizeError;
   if (anyPlaneNull(srcPlanes, 3)) return StatusNullPointerError;
-  const zel::VectorTier tier = unitTier();
+  const zel::VectorTier tier = zel::widestTierWithBytePermutes();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<const uint8_t, 3> s(srcPlanes, srcStep, y);
     yuvToRgbP3C3Row(s.p, zel::rowAt(dst, dstStep, y), size.width, tier);
@@ -136,7 +136,7 @@ ZEL_PUBLIC Status zeliYUVToRGB_8u_P3R(const uint8_t* const srcPlanes[3], int src
   if (sizeBelowOne(size)) return StatusSizeError;
   if (anyPlaneNull(dstPlanes, 3)) return StatusNullPointerError;
   if (anyPlaneNull(srcPlanes, 3)) return StatusNullPointerError;
-  const zel::VectorTier tier = unitTier();
+  const zel::VectorTier tier = zel::widestTierWithBytePermutes();
   zel::plainWalk(size.height, [&](int y) {
     const PlaneRows<const uint8_t, 3> s(srcPlanes, srcStep, y);
     const PlaneRows<uint8_t, 3> d(dstPlanes, dstStep, y);

@@ -408,15 +408,15 @@ Status toGray(const T* src, int srcStep, T* dst, int dstStep, ImageSize size, co
     plainWalk(size.height, [&](int y) { row8u<Channels>(in.row(y), out.row(y), size.width, w, wide); });
   } else if constexpr (std::is_same_v<T, uint16_t>) {
     const WeightsF w = weightsF(coeffs);
-    const VectorTier tier = blockTier();
+    const VectorTier tier = zel::widestTier();
     plainWalk(size.height, [&](int y) { row16u<Channels>(in.row(y), out.row(y), size.width, w, tier); });
   } else if constexpr (std::is_same_v<T, int16_t>) {
     const WeightsF w = weightsF(coeffs);
-    const VectorTier tier = blockTier();
+    const VectorTier tier = zel::widestTier();
     plainWalk(size.height, [&](int y) { row16s<Channels>(in.row(y), out.row(y), size.width, w, tier); });
   } else if constexpr (std::is_same_v<T, float>) {
     const WeightsF w = weightsF(coeffs);
-    const VectorTier tier = blockTier();
+    const VectorTier tier = zel::widestTier();
     plainWalk(size.height, [&](int y) { row32f<Channels>(in.row(y), out.row(y), size.width, w, tier); });
   } else {
     const WeightsD w = weightsD(coeffs);

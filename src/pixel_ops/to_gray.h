@@ -34,11 +34,6 @@ void row16s(const int16_t* src, int16_t* dst, int width, WeightsF w, VectorTier 
 template <int Channels>
 void row32f(const float* src, float* dst, int width, WeightsF w, VectorTier tier);
 
-// The widest tier the 16u, 16s and 32f blocks take on this processor.
-inline VectorTier blockTier() {
-  return hasAvx512() ? VectorTier::Avx512 : hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41;
-}
-
 // Float rows leave the caches more often than they fit: the wide blocks
 // ask for their source this many bytes ahead of the block being read (an
 // address past the row is only a hint, never touched).

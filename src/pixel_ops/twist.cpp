@@ -585,7 +585,7 @@ template <typename T, int K>
 __attribute__((noinline)) void walk(const T* const* srcPlanes, int srcStep, T* const* dstPlanes, int dstStep,
                                     ImageSize size, const Matrix& m) {
   const int planes = K == Planar ? 3 : 1;
-  const VectorTier tier = std::is_same_v<T, float> ? floatTier() : integerTier();
+  const VectorTier tier = std::is_same_v<T, float> ? zel::widestTier() : zel::widestTierWithBytePermutes();
   plainWalk(size.height, [&](int y) {
     const T* s[3];
     T* d[3];
@@ -679,7 +679,7 @@ ZEL_PUBLIC Status zeliColorTwist_32f_C3R(const float* src, int srcStep, float* d
   if (srcStep < 1 || dstStep < 1) return StatusStepError;
   const Matrix m = matrix3(twist);
   const bool stream = streamsC3(size.width, size.height);
-  const zel::VectorTier tier = floatTier();
+  const zel::VectorTier tier = zel::widestTier();
   if (mergesC3(srcStep, dstStep, size.width)) {
     row32fC3(src, dst, int64_t(size.width) * size.height, m, stream, tier);
     return StatusOk;

@@ -43,16 +43,6 @@ bool narrowingClamps(const Matrix& m) {
   return true;
 }
 
-// The widest tier the integer blocks take on this processor.
-inline VectorTier integerTier() {
-  return hasAvx512Vbmi() ? VectorTier::Avx512 : hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41;
-}
-
-// The widest tier the float blocks take on this processor.
-inline VectorTier floatTier() {
-  return hasAvx512() ? VectorTier::Avx512 : hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41;
-}
-
 // Three-channel floats over `pixels` pixels; `stream` writes the blocks
 // with non-temporal stores (where the destination holds whole floats) and
 // ends with a store fence. Blocks of four pixels, eight from the AVX2 tier

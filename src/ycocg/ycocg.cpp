@@ -11,9 +11,6 @@ namespace {
 
 bool anyNull(const void* image, const void* planes) { return !image || !planes; }
 
-VectorTier widestTier() {
-  return hasAvx512() ? VectorTier::Avx512 : (hasAvx2() ? VectorTier::Avx2 : VectorTier::Sse41);
-}
 bool badSize(ImageSize size) { return size.width < 1 || size.height < 1; }
 
 // Rows of 32-bit planes go through the vector body with non-temporal

@@ -108,7 +108,7 @@ void expectVectorMatchesScalar(const char* name, const Form& form, zel::VectorTi
 
 std::vector<zel::VectorTier> vectorTiers() {
   std::vector<zel::VectorTier> t;
-  for (int k = 0; k <= int(unitTier()); ++k) t.push_back(zel::VectorTier(k));
+  for (int k = 0; k <= int(zel::widestTierWithBytePermutes()); ++k) t.push_back(zel::VectorTier(k));
   return t;
 }
 

@@ -72,7 +72,7 @@ using zel::VectorTier;
 std::vector<VectorTier> tiersHere() {
   std::vector<VectorTier> tiers;
   for (VectorTier t : {VectorTier::Sse41, VectorTier::Avx2, VectorTier::Avx512})
-    if (t <= blockTier()) tiers.push_back(t);
+    if (t <= zel::widestTier()) tiers.push_back(t);
   return tiers;
 }
 

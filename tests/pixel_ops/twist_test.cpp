@@ -53,7 +53,7 @@ using zel::VectorTier;
 
 bool hasTier(VectorTier tier) {
   return tier == VectorTier::Sse41 || (tier == VectorTier::Avx2 && zel::hasAvx2()) ||
-         (tier == VectorTier::Avx512 && integerTier() == VectorTier::Avx512);
+         (tier == VectorTier::Avx512 && zel::widestTierWithBytePermutes() == VectorTier::Avx512);
 }
 
 const std::vector<int> kWidths70 = [] {
@@ -251,7 +251,7 @@ TEST(TwistKernels, FloatRunsMatchTheFormula) {
       // first pixels go one by one to a boundary).
       for (int dstOffset : {0, 4, 8, 12, 16, 20, 28, 36, 44, 52, 60})
         for (VectorTier tier : {VectorTier::Sse41, VectorTier::Avx2, VectorTier::Avx512}) {
-          if (tier > floatTier()) continue;
+          if (tier > zel::widestTier()) continue;
           for (bool stream : {false, true}) {
             TestImage<float> dst(pixels * 3, 1, dstOffset);
             row32fC3(src.data(), dst.data(), pixels, m, stream, tier);
